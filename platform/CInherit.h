@@ -32,6 +32,13 @@ class CInherit : public Base, public Interfaces... {
     return XCode::success();
   }
 
+  // The typed query of IUnknown, reachable without naming one of the many
+  // IUnknown subobjects.
+  template <class T>
+  XCode queryIf(RefPtr<T>& out) {
+    return static_cast<CObject*>(this)->queryIf(out);
+  }
+
  private:
   template <class Interface>
   void* asInterface() {

@@ -23,7 +23,7 @@ void DebugMonitor::enable(unsigned int id, unsigned int maxLevel, Sink sink) {
   DebugMonitor& monitor = channel(id);
   {
     std::lock_guard<std::mutex> guard(monitor.m_mutex);
-    monitor.m_level = maxLevel;
+    monitor.m_level.store(maxLevel, std::memory_order_relaxed);
     monitor.m_sink = std::move(sink);
   }
   s_enabled[id].store(&monitor, std::memory_order_release);

@@ -24,7 +24,7 @@ class DebugMonitor {
     if (id >= kChannels)
       return nullptr;
     DebugMonitor* const monitor = s_enabled[id].load(std::memory_order_acquire);
-    return monitor && level <= monitor->m_level ? monitor : nullptr;
+    return monitor && level <= monitor->m_level.load(std::memory_order_relaxed) ? monitor : nullptr;
   }
 
   // Switches channel id on for lines of level 0 up to maxLevel.
@@ -37,6 +37,6 @@ class DebugMonitor {
   static std::atomic<DebugMonitor*> s_enabled[kChannels];
 
   std::mutex m_mutex;
-  unsigned int m_level = 0;
+  std::atomic<unsigned int> m_level{0};
   Sink m_sink;
 };

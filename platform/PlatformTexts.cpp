@@ -1,0 +1,5 @@
+#include "PlatformTexts.h"
+
+namespace ERROR {
+char const INVALID[] = "<invalid>";
+}  // namespace ERROR

@@ -1,0 +1,3 @@
+#include "SipStatistics.h"
+
+SipStatistics s_sipStatistics;
