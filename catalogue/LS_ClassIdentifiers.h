@@ -1,0 +1,27 @@
+// The class identifiers of the objects that the element factories make, and
+// the driver identifiers under which the two masters register.
+//
+// Each accessor returns a function-local constant, made on first use
+// (thread-safe) and never destroyed, whose attached name is the accessor's
+// own; every call returns the same object. Which class an identifier makes is
+// the business of the container helpers, not of this file.
+#pragma once
+
+#include "UUID.h"
+
+UUID const& CID_LS_Data();
+UUID const& CID_LS_AppendList();
+UUID const& CID_LS_Authentication();
+UUID const& CID_LS_RegistrationOutbound();
+UUID const& CID_LS_RegistrationInbound();
+UUID const& CID_LS_MessageSubscription();
+UUID const& CID_LS_CallOutbound();
+UUID const& CID_LS_CallInbound();
+UUID const& CID_LS_Identity();
+UUID const& CID_LS_LocationService();
+UUID const& CID_LS_MasterLocationService();
+UUID const& CID_LS_AuthenticationService();
+UUID const& CID_LS_MasterAuthenticationService();
+
+UUID const& DID_MasterLocationService();
+UUID const& DID_MasterAuthenticationService();
