@@ -1,0 +1,87 @@
+// LS_CContainer: the container of the tree, holding local children and the
+// shadows that mirror its base container's children.
+//
+// Invariants: a name is never both local and shadow; the container holds one
+// reference on every child and is registered (priority 0) as element
+// observer of every child in both tables, and as container observer of its
+// base container. Shadows exist only while the base is a container; they
+// appear, are re-based and disappear as the base gains and loses children.
+// A local child that is removed while it still has a base turns back into a
+// reset shadow, without a removal event.
+//
+// Decision: when the base container turns one of its shadows into a local
+// child, the shadow here is re-based onto that new child (announced as a
+// change of the shadow). Keeping the old base instead would leave this
+// container reading the grandparent's value through a child its base has
+// dropped, so an override in the middle of a chain would never reach the
+// bottom.
+//
+// Ownership: the container dies with its last reference and releases its
+// children then, telling nobody. Subclasses (identity, faces) react to child
+// events through the three hooks, which run before the container's own
+// observers are told. Threading: no lock of its own; callers hold it, and
+// each call on a child, shadow or base holds that object's lock alone.
+// create() stays abstract.
+#pragma once
+
+#include "LS_CElement.h"
+#include "LS_IContainer.h"
+#include "LS_IContainerObserver.h"
+#include "StringHashTable.h"
+
+class LS_CContainer : public CInherit<LS_CContainer, LS_CElement, LS_IContainer, LS_IContainerObserver> {
+ public:
+  LS_CContainer() = default;
+  ~LS_CContainer() override;
+
+  // LS_IContainer
+  void addContainerObserver(LS_IContainerObserver* observer, unsigned int priority) override;
+  void removeContainerObserver(LS_IContainerObserver* observer) override;
+  bool containsElement(String const& name, LS_Strategy::Type strategy) const override;
+  XCode getElement(String const& name,
+                   LS_Strategy::Type strategy,
+                   RefPtr<LS_IElement>& element) const override;
+  void getElements(LS_Strategy::Type strategy, Vector<String>& names) const override;
+  void addElement(String const& name, LS_IElement* element) override;
+  void removeElement(String const& name) override;
+  void changeElement(String const& name) override;
+
+  // LS_IElement: reset removes every local child; shadows stay.
+  void reset() override;
+  void setBase(LS_IElement* base) override;
+
+  // LS_IElementObserver: a child changed. The base's own changes are not
+  // passed on: its children are watched one by one through the shadows.
+  void onChange(ObserverEvent<LS_IElement>& event) override;
+
+  // LS_IContainerObserver: the base container gained or lost a child.
+  void onElementAdd(ObserverEvent<LS_IContainer>& event) override;
+  void onElementRemove(ObserverEvent<LS_IContainer>& event) override;
+  void onElementChange(ObserverEvent<LS_IContainer>& event) override;
+
+  // Each runs its hook, tells the container observers, then announces the
+  // container's own change; removal then makes the departing child announce
+  // its destruction, so that everything based on it lets go.
+  virtual void notifyElementAdd(String const& name);
+  virtual void notifyElementRemove(String const& name, LS_IElement* element);
+  virtual void notifyElementChange(String const& name);
+
+  // Hooks for subclasses; nothing here.
+  virtual void onElementAdd(String const& name);
+  virtual void onElementRemove(String const& name);
+  virtual void onElementChange(String const& name);
+
+ private:
+  using ElementTable = StringHashTable<RefPtr<LS_IElement>>;
+
+  // Fails, changing nothing, when name already has a shadow.
+  XCode createShadowElement(String const& name, LS_IElement* baseElement);
+  void destroyShadowElement(String const& name);
+  void follow(RefPtr<LS_IContainer> const& base);
+  void forgetBase();
+  LS_IContainerObserver* asContainerObserver() { return this; }
+
+  ObserverContainer<LS_IContainer, LS_IContainerObserver> m_containerObservers;
+  ElementTable m_localElements;
+  ElementTable m_shadowElements;
+};
