@@ -24,6 +24,7 @@
 // create() stays abstract.
 #pragma once
 
+#include "LS_CData.h"
 #include "LS_CElement.h"
 #include "LS_IContainer.h"
 #include "LS_IContainerObserver.h"
@@ -70,6 +71,27 @@ class LS_CContainer : public CInherit<LS_CContainer, LS_CElement, LS_IContainer,
   virtual void onElementAdd(String const& name);
   virtual void onElementRemove(String const& name);
   virtual void onElementChange(String const& name);
+
+ protected:
+  // The value families of a container whose children are data values (the
+  // faces): one data value per key, and each key stored with one T only.
+  template <class T>
+  void setValue(String const& key, T const& value) {
+    LS_setDataElement<T>(this, key, value);
+  }
+  // Drops the container's own value, so that the inherited one shows again.
+  void removeValue(String const& key) { removeElement(key); }
+  template <class T>
+  XCode readValue(String const& key, LS_Strategy::Type strategy, T& value) const {
+    return LS_getDataElement<T>(this, key, strategy, value);
+  }
+  // The effective value, or defaultValue when neither the container nor its
+  // base chain has one.
+  template <class T>
+  T readValueOr(String const& key, T const& defaultValue) const {
+    T value = defaultValue;
+    return LS_getDataElement<T>(this, key, LS_Strategy::LOCAL_OR_BASE, value, defaultValue);
+  }
 
  private:
   using ElementTable = StringHashTable<RefPtr<LS_IElement>>;
