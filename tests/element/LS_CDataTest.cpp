@@ -2,18 +2,7 @@
 
 #include <gtest/gtest.h>
 
-#include "CHostPort.h"
 #include "LS_Alias.h"
-#include "LS_ForcedDestination.h"
-#include "LS_KeepAliveMethod.h"
-#include "LS_LifetimeRange.h"
-#include "LS_MwiSubscriptionMode.h"
-#include "LS_NatTraversalMethod.h"
-#include "LS_ProtocolConfig.h"
-#include "LS_Proxy.h"
-#include "LS_RegistrationMode.h"
-#include "LS_UriScheme.h"
-#include "LS_User.h"
 #include "support/ElementRecorders.h"
 #include "support/LogCapture.h"
 
@@ -138,105 +127,6 @@ TEST_F(DataValueTest, PointerReadOfAMissingValueStoresNull) {
 TEST_F(DataValueTest, ShadowWithoutAnyValueUpTheChainReadsAsMissing) {
   RefPtr<LS_IElement> orphan = adoptRef(static_cast<LS_IElement*>(new LS_CData<String>));
   EXPECT_EQ(static_cast<LS_CData<String>*>(orphan.get())->get(), nullptr);
-}
-
-// Every type the model stores as a single value: written on a base, read
-// through the derived container, overridden there without touching the base.
-template <class T>
-class StoredTypeTest : public ::testing::Test {};
-
-template <class T>
-struct Sample;
-template <>
-struct Sample<String> {
-  static String first() { return "a"; }
-  static String second() { return "b"; }
-};
-template <>
-struct Sample<bool> {
-  static bool first() { return true; }
-  static bool second() { return false; }
-};
-template <>
-struct Sample<unsigned int> {
-  static unsigned int first() { return 4294967295u; }
-  static unsigned int second() { return 0; }
-};
-template <>
-struct Sample<CHostPort> {
-  static CHostPort first() { return CHostPort("a.example", 5060); }
-  static CHostPort second() { return CHostPort("a.example", 5061); }
-};
-template <>
-struct Sample<LS_Proxy> {
-  static LS_Proxy first() { return LS_Proxy(Sample<CHostPort>::first(), CHostPort(), false); }
-  static LS_Proxy second() { return LS_Proxy(Sample<CHostPort>::first(), CHostPort(), true); }
-};
-template <>
-struct Sample<LS_ForcedDestination> {
-  static LS_ForcedDestination first() { return LS_ForcedDestination(); }
-  static LS_ForcedDestination second() {
-    LS_ForcedDestination destination;
-    destination.type = LS_ForcedDestination::REGISTRAR_ADDRESS;
-    return destination;
-  }
-};
-template <>
-struct Sample<LS_LifetimeRange> {
-  static LS_LifetimeRange first() { return LS_LifetimeRange{1, 2, 3}; }
-  static LS_LifetimeRange second() { return LS_LifetimeRange{1, 2, 4}; }
-};
-template <class Enumeration>
-struct EnumerationSample {
-  static Enumeration first() { return static_cast<Enumeration>(1); }
-  static Enumeration second() { return static_cast<Enumeration>(2); }
-};
-template <>
-struct Sample<LS_User::Type> : EnumerationSample<LS_User::Type> {};
-template <>
-struct Sample<LS_MwiSubscriptionMode::Type> : EnumerationSample<LS_MwiSubscriptionMode::Type> {};
-template <>
-struct Sample<LS_ProtocolConfig::Type> : EnumerationSample<LS_ProtocolConfig::Type> {};
-template <>
-struct Sample<LS_RegistrationMode::Type> : EnumerationSample<LS_RegistrationMode::Type> {};
-template <>
-struct Sample<LS_UriScheme::Type> : EnumerationSample<LS_UriScheme::Type> {};
-template <>
-struct Sample<LS_NatTraversalMethod::Type> : EnumerationSample<LS_NatTraversalMethod::Type> {};
-template <>
-struct Sample<LS_KeepAliveMethod::Type> : EnumerationSample<LS_KeepAliveMethod::Type> {};
-
-using StoredTypes = ::testing::Types<String,
-                                     bool,
-                                     unsigned int,
-                                     CHostPort,
-                                     LS_Proxy,
-                                     LS_ForcedDestination,
-                                     LS_LifetimeRange,
-                                     LS_User::Type,
-                                     LS_MwiSubscriptionMode::Type,
-                                     LS_ProtocolConfig::Type,
-                                     LS_RegistrationMode::Type,
-                                     LS_UriScheme::Type,
-                                     LS_NatTraversalMethod::Type,
-                                     LS_KeepAliveMethod::Type>;
-TYPED_TEST_SUITE(StoredTypeTest, StoredTypes);
-
-TYPED_TEST(StoredTypeTest, InheritsAndOverridesWithoutTouchingTheBase) {
-  RefPtr<TestContainer> base = makeContainer();
-  RefPtr<TestContainer> derived = makeContainer();
-  derived->setBase(base.get());
-  LS_setDataElement(base.get(), "value", Sample<TypeParam>::first());
-
-  TypeParam value = Sample<TypeParam>::second();
-  ASSERT_TRUE(LS_getDataElement(derived.get(), "value", LS_Strategy::LOCAL_OR_BASE, value).isSuccess());
-  EXPECT_TRUE(value == Sample<TypeParam>::first());
-
-  LS_setDataElement(derived.get(), "value", Sample<TypeParam>::second());
-  LS_getDataElement(derived.get(), "value", LS_Strategy::LOCAL_OR_BASE, value);
-  EXPECT_TRUE(value == Sample<TypeParam>::second());
-  LS_getDataElement(base.get(), "value", LS_Strategy::LOCAL_OR_BASE, value);
-  EXPECT_TRUE(value == Sample<TypeParam>::first());
 }
 
 TEST(StoredRecordTest, AliasRecordStartsEmptyAndIsEditedInPlace) {

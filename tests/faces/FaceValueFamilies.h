@@ -1,8 +1,8 @@
-// A shared suite for the value families of the outbound faces: a setter, a
-// config getter, an effective getter and a remover over one key. Each face
-// instantiates FaceValueFamilyTest with its own table (the tests themselves
-// live in LS_COutboundTest.cpp). Values are compared as text, NONE standing
-// for a getter that failed.
+// Shared pieces of the outbound face tests: the value-family suite (a setter,
+// a config getter, an effective getter and a remover over one key; each face
+// instantiates FaceValueFamilyTest with its own table, the tests live in
+// LS_COutboundTest.cpp) and the readers that turn values, dumps and log
+// lines into text. NONE stands for a getter that failed.
 #pragma once
 
 #include <gtest/gtest.h>
@@ -12,10 +12,12 @@
 #include <string>
 #include <vector>
 
+#include "DumpRows.h"
 #include "LS_AddressText.h"
 #include "LS_COutbound.h"
 
 inline std::string const NONE = "<none>";
+unsigned short const NO_PORT = CHostPort::ms_uUSE_SIP_DEFAULT_DONT_OUTPUT_PORT;
 
 template <class T>
 std::string valueText(T const& value) {
@@ -40,6 +42,39 @@ std::string readText(Face const& face, XCode (Face::*getter)(T&) const) {
   return (face.*getter)(value).isSuccess() ? valueText(value) : NONE;
 }
 
+// A server and its TLS counterpart as "server tls".
+template <class Face>
+std::string pairText(Face const& face, XCode (Face::*getter)(CHostPort&, CHostPort&) const) {
+  CHostPort server;
+  CHostPort tls;
+  return (face.*getter)(server, tls).isSuccess() ? valueText(server) + " " + valueText(tls) : NONE;
+}
+
+// Level 1 with room to spare: the rows of the settings go in at level 2.
+inline DumpRows dumpOf(LS_COutbound const& face,
+                       String const& prefix = String(),
+                       unsigned int maxLevel = 9,
+                       unsigned int maxDetail = 5) {
+  InfoContainer info;
+  face.getInfo(info, maxLevel, 1, maxDetail, 2, prefix);
+  return dumpRows(info);
+}
+
+// The face as its log lines print it.
+inline void const* logAddressOf(LS_COutbound* face) {
+  return static_cast<void const*>(static_cast<LS_IElement*>(face));
+}
+
+// Log lines without those of the element model underneath the face.
+inline std::vector<std::string> faceLines(std::vector<std::string> const& lines) {
+  std::vector<std::string> kept;
+  for (std::string const& line : lines) {
+    if (line.rfind("LS_CData(", 0) != 0 && line.rfind("LS_CElement(", 0) != 0)
+      kept.push_back(line);
+  }
+  return kept;
+}
+
 struct FaceValueFamily {
   std::string name;
   std::string key;          // the element key of the value
@@ -51,7 +86,6 @@ struct FaceValueFamily {
   std::function<std::string(LS_COutbound const&)> configured;
   std::function<std::string(LS_COutbound const&)> effective;
   std::function<void(LS_COutbound&)> remove;
-  std::vector<FaceValueFamily> const* siblings = nullptr;  // the face's whole table
 };
 
 // The table of one face class: Face declares the operations, Made is the
@@ -81,22 +115,25 @@ class FaceValueFamilies {
     return *this;
   }
 
-  std::vector<FaceValueFamily> const& rows() {
-    for (FaceValueFamily& row : m_rows)
-      row.siblings = &m_rows;
-    return m_rows;
-  }
+  std::vector<FaceValueFamily> rows() const { return m_rows; }
 
  private:
   std::vector<FaceValueFamily> m_rows;
 };
 
-// Failure messages name the family instead of dumping its bytes.
+// A row for a family named the usual way (setConfigX, getConfigX, getX,
+// removeConfigX) on the face class Face of the calling scope.
+#define FACE_VALUE_FAMILY(X, key, first, second, defaultText)                                       \
+  add(#X, key, first, second, &Face::setConfig##X, &Face::getConfig##X, &Face::get##X, defaultText, \
+      &Face::removeConfig##X)
+
+// Failure messages name the row instead of dumping its bytes.
 inline void PrintTo(FaceValueFamily const& family, std::ostream* out) {
   *out << family.name;
 }
 
-inline std::string familyName(::testing::TestParamInfo<FaceValueFamily> const& info) {
+template <class Row>
+std::string rowName(::testing::TestParamInfo<Row> const& info) {
   return info.param.name;
 }
 
@@ -106,6 +143,8 @@ class FaceValueFamilyTest : public ::testing::TestWithParam<FaceValueFamily> {
  protected:
   FaceValueFamilyTest() { face->setBase(base.get()); }
   FaceValueFamily const& family() const { return GetParam(); }
+  // The configured and the effective value.
+  std::vector<std::string> seen() const { return {family().configured(*face), family().effective(*face)}; }
 
   RefPtr<LS_COutbound> base = GetParam().make();
   RefPtr<LS_COutbound> face = GetParam().make();

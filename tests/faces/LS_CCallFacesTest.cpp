@@ -40,39 +40,34 @@ struct CallFaceTraits<LS_CCallOutbound> {
   static DumpRows baseFaceRows() { return {"1|Invite transaction timeout|32"}; }
 };
 
-// One profile family: its method stem and its operations.
+// One profile family: its method stem, its element key and its operations.
 struct ProfileFamily {
   char const* stem;
+  char const* key;
   void (LS_ICallConfig::*set)(String const&);
   XCode (LS_ICallConfig::*getConfig)(String&) const;
   void (LS_ICallConfig::*remove)();
   String (LS_ICall::*get)() const;
 };
 
+using Config = LS_ICallConfig;
 ProfileFamily const FAMILIES[] = {
-    {"VoipProfile", &LS_ICallConfig::setConfigVoipProfile, &LS_ICallConfig::getConfigVoipProfile,
-     &LS_ICallConfig::removeConfigVoipProfile, &LS_ICall::getVoipProfile},
-    {"ToneSetProfile", &LS_ICallConfig::setConfigToneSetProfile, &LS_ICallConfig::getConfigToneSetProfile,
-     &LS_ICallConfig::removeConfigToneSetProfile, &LS_ICall::getToneSetProfile},
-    {"SipProfile", &LS_ICallConfig::setConfigSipProfile, &LS_ICallConfig::getConfigSipProfile,
-     &LS_ICallConfig::removeConfigSipProfile, &LS_ICall::getSipProfile},
+    {"VoipProfile", "voip-profile", &Config::setConfigVoipProfile, &Config::getConfigVoipProfile,
+     &Config::removeConfigVoipProfile, &LS_ICall::getVoipProfile},
+    {"ToneSetProfile", "tone-set-profile", &Config::setConfigToneSetProfile, &Config::getConfigToneSetProfile,
+     &Config::removeConfigToneSetProfile, &LS_ICall::getToneSetProfile},
+    {"SipProfile", "sip-profile", &Config::setConfigSipProfile, &Config::getConfigSipProfile,
+     &Config::removeConfigSipProfile, &LS_ICall::getSipProfile},
 };
 
-// The family's operations on a face, through its two interfaces.
-struct Profile {
-  LS_ICallConfig& config;
-  LS_ICall& call;
-  ProfileFamily const& family;
-
-  void set(String const& text) { (config.*family.set)(text); }
-  void remove() { (config.*family.remove)(); }
-  // The config getter's text, or "<none>" when it fails.
-  std::string configured() const {
-    String text = "<none>";
-    return (config.*family.getConfig)(text).isSuccess() ? text.str() : "<none>";
-  }
-  std::string effective() const { return (call.*family.get)().str(); }
-};
+// The family on a face as "configured|effective", the configured text being
+// "<none>" when the config getter fails.
+template <class Face>
+std::string profileState(Face const& face, ProfileFamily const& family) {
+  String text;
+  std::string const configured = (face.*family.getConfig)(text).isSuccess() ? text.str() : "<none>";
+  return configured + "|" + (face.*family.get)().str();
+}
 
 // A face whose base is the same face of the base identity.
 template <class Face>
@@ -82,10 +77,9 @@ class CallFaceTest : public ::testing::Test {
 
   void SetUp() override { face->setBase(base.get()); }
 
-  static Profile profile(Face& target, ProfileFamily const& family) { return {target, target, family}; }
-  DumpRows dump(String const& prefix) const {
+  DumpRows dump() const {
     InfoContainer info;
-    face->getInfo(info, 10, 0, 1, 1, prefix);
+    face->getInfo(info, 10, 0, 1, 1, "* ");
     return dumpRows(info);
   }
 
@@ -96,77 +90,64 @@ class CallFaceTest : public ::testing::Test {
 using CallFaces = ::testing::Types<LS_CCallInbound, LS_CCallOutbound>;
 TYPED_TEST_SUITE(CallFaceTest, CallFaces);
 
-TYPED_TEST(CallFaceTest, EachProfileIsInheritedUntilSetOnTheFaceAndEmptyWhenSetNowhere) {
+TYPED_TEST(CallFaceTest, EachProfileIsInheritedUntilSetOnTheFaceEvenToAnEmptyText) {
+  TypeParam& own = *this->face;
+  TypeParam& inherited = *this->base;
   for (ProfileFamily const& family : FAMILIES) {
     SCOPED_TRACE(family.stem);
-    Profile own = this->profile(*this->face, family);
-    Profile inherited = this->profile(*this->base, family);
-    inherited.set("inherited");
-    EXPECT_EQ(own.configured(), "<none>");
-    EXPECT_EQ(own.effective(), "inherited");
-
-    own.set("own");
-    EXPECT_EQ(own.configured(), "own");
-    EXPECT_EQ(own.effective(), "own");
-
-    own.remove();
-    EXPECT_EQ(own.effective(), "inherited");
-    inherited.remove();
-    EXPECT_EQ(own.effective(), "");
+    (inherited.*family.set)("inherited");
+    EXPECT_EQ(profileState(own, family), "<none>|inherited");
+    (own.*family.set)("own");
+    EXPECT_EQ(profileState(own, family), "own|own");
+    (own.*family.set)("");
+    EXPECT_EQ(profileState(own, family), "|");
+    (own.*family.remove)();
+    EXPECT_EQ(profileState(own, family), "<none>|inherited");
+    (inherited.*family.remove)();
+    EXPECT_EQ(profileState(own, family), "<none>|");
   }
 }
 
-TYPED_TEST(CallFaceTest, AnEmptyProfileIsStoredAndHidesTheInheritedOneAndItsDumpRow) {
-  TestFixture::Traits::configureBaseFace(*this->base);
-  for (ProfileFamily const& family : FAMILIES) {
-    SCOPED_TRACE(family.stem);
-    this->profile(*this->base, family).set("inherited");
-    Profile own = this->profile(*this->face, family);
-    own.set("");
-
-    EXPECT_EQ(own.configured(), "");
-    EXPECT_EQ(own.effective(), "");
-  }
-  DumpRows const expected = DumpRows{std::string("0|") + TestFixture::Traits::HEADING + "|"};
-  EXPECT_EQ(this->dump(""), expected + TestFixture::Traits::baseFaceRows());
-}
-
-TYPED_TEST(CallFaceTest, DumpShowsPrefixedHeadingThenTheBaseFaceRowsThenTheProfilesInEffect) {
-  TestFixture::Traits::configureBaseFace(*this->base);
+TYPED_TEST(CallFaceTest, DumpShowsPrefixedHeadingThenTheBaseFaceRowsThenTheNonEmptyProfilesInEffect) {
+  using Traits = typename TestFixture::Traits;
+  Traits::configureBaseFace(*this->base);
   this->base->setConfigSipProfile("sip-inherited");
   this->face->setConfigVoipProfile("voip-own");
   this->face->setConfigToneSetProfile("tones-own");
+  DumpRows const head = DumpRows{std::string("0|* ") + Traits::HEADING + "|"} + Traits::baseFaceRows();
 
-  DumpRows expected{std::string("0|* ") + TestFixture::Traits::HEADING + "|"};
-  expected =
-      expected + TestFixture::Traits::baseFaceRows() +
-      DumpRows{"1|VoIP Profile|voip-own", "1|Tone-Set Profile|tones-own", "1|SIP Profile|sip-inherited"};
-  EXPECT_EQ(this->dump("* "), expected);
+  EXPECT_EQ(this->dump(), head + DumpRows({"1|VoIP Profile|voip-own", "1|Tone-Set Profile|tones-own",
+                                           "1|SIP Profile|sip-inherited"}));
+  this->face->setConfigSipProfile("");
+  this->face->removeConfigVoipProfile();
+  EXPECT_EQ(this->dump(), head + DumpRows{"1|Tone-Set Profile|tones-own"});
 }
 
-TYPED_TEST(CallFaceTest, AChangedProfileReachesObserversAsOneChangeOfItsKey) {
-  Journal journal;
-  this->face->setConfigToneSetProfile("first");
-  ContainerWatch watch(this->face.get(), journal, "face");
+TYPED_TEST(CallFaceTest, ChangingAProfileIsAnnouncedAsOneChangeOfItsKey) {
+  TypeParam& face = *this->face;
+  for (ProfileFamily const& family : FAMILIES) {
+    (face.*family.set)("first");
+    Journal journal;
+    ContainerWatch watch(&face, journal, "face");
 
-  this->face->setConfigToneSetProfile("second");
-  this->face->setConfigToneSetProfile("second");
+    (face.*family.set)("second");
+    (face.*family.set)("second");
 
-  EXPECT_EQ(journal, (Journal{"face:change:tone-set-profile", "face:change"}));
+    EXPECT_EQ(journal, (Journal{std::string("face:change:") + family.key, "face:change"}));
+  }
 }
 
 TYPED_TEST(CallFaceTest, SettersRemoversAndLifetimeWriteTheirLinesAndGettersNone) {
   char const* const name = TestFixture::Traits::NAME;
   LogCapture log;
   RefPtr<TypeParam> made = adoptRef(new TypeParam);
+  TypeParam& face = *made;
   void const* const self = static_cast<LS_IElement*>(made.get());
   std::vector<std::string> expected{formatted("%s(%p)::%s()\n", name, self, name)};
   for (ProfileFamily const& family : FAMILIES) {
-    Profile profile = this->profile(*made, family);
-    profile.set("p");
-    profile.configured();
-    profile.effective();
-    profile.remove();
+    (face.*family.set)("p");
+    profileState(face, family);
+    (face.*family.remove)();
     expected.push_back(formatted("%s(%p)::setConfig%s(p)\n", name, self, family.stem));
     expected.push_back(formatted("%s(%p)::removeConfig%s()\n", name, self, family.stem));
   }

@@ -2,10 +2,10 @@
 
 #include <gtest/gtest.h>
 
-#include "String.h"
-
 #include <string>
 #include <vector>
+
+#include "String.h"
 
 namespace {
 
@@ -22,10 +22,6 @@ class DebugMonitorTest : public testing::Test {
   std::vector<std::string> m_lines;
 };
 
-TEST_F(DebugMonitorTest, OffChannelGivesNoMonitor) {
-  EXPECT_EQ(DebugMonitor::get(kChannel, 0), nullptr);
-}
-
 TEST_F(DebugMonitorTest, SinkReceivesTheExactLine) {
   enable(0);
   DebugMonitor* const monitor = DebugMonitor::get(kChannel, 0);
@@ -36,7 +32,8 @@ TEST_F(DebugMonitorTest, SinkReceivesTheExactLine) {
   EXPECT_EQ(m_lines, (std::vector<std::string>{"C(" + nullAddress + ")::f(x, 3)\n", "no line end"}));
 }
 
-TEST_F(DebugMonitorTest, LevelAboveTheMaximumGivesNoMonitor) {
+TEST_F(DebugMonitorTest, OnlyAnEnabledChannelUpToItsMaximumLevelGivesAMonitor) {
+  EXPECT_EQ(DebugMonitor::get(kChannel, 0), nullptr);
   enable(1);
   EXPECT_NE(DebugMonitor::get(kChannel, 1), nullptr);
   EXPECT_EQ(DebugMonitor::get(kChannel, 2), nullptr);

@@ -19,20 +19,19 @@ UUID const& testDID() {
 // A driver that, like the masters, builds its name once constructed.
 class CTestDriver : public CInherit<CTestDriver, CDriver, IInfo> {
  public:
-  explicit CTestDriver(char const* base) : CInherit(testDID(), String(), nullptr) {
+  CTestDriver() : CInherit(testDID(), String(), nullptr) {
     String name;
-    IDriver::BUILD_DRIVER_NAME(name, base, 0, 0, 0xFFFFFFFF, "", "", "", "");
+    IDriver::BUILD_DRIVER_NAME(name, "test-driver", 0, 0, 0xFFFFFFFF, "", "", "", "");
     setDriverName(name);
   }
   ~CTestDriver() override { ++g_driversDestroyed; }
 
   InfoContainer& getInfo(InfoContainer& info,
                          unsigned int,
-                         unsigned int level,
                          unsigned int,
-                         unsigned int detail,
-                         String const& prefix) const override {
-    info.add(level, detail, String(prefix).append(getDriverName()), "");
+                         unsigned int,
+                         unsigned int,
+                         String const&) const override {
     return info;
   }
 };
@@ -47,43 +46,32 @@ class DriverRepositoryTest : public testing::Test {
   void SetUp() override {
     g_driversDestroyed = 0;
     g_repositoriesDestroyed = 0;
-    m_repository = adoptRef(new CCountedRepository);
-    m_driver = adoptRef(new CTestDriver("test-driver"));
+    ASSERT_TRUE(m_repository->registerDriver(m_driver.get()).isSuccess());
   }
   void TearDown() override { SYSTEM::SET_DRIVER_REPOSITORY(nullptr); }
 
   String const& name() const { return m_driver->getDriverName(); }
 
-  RefPtr<CCountedRepository> m_repository;
-  RefPtr<CTestDriver> m_driver;
+  RefPtr<CCountedRepository> m_repository = adoptRef(new CCountedRepository);
+  RefPtr<CTestDriver> m_driver = adoptRef(new CTestDriver);
 };
 
-TEST_F(DriverRepositoryTest, RegisteredDriverAnswersItsInterfacesByName) {
-  ASSERT_TRUE(m_repository->registerDriver(m_driver.get()).isSuccess());
+TEST_F(DriverRepositoryTest, RegisteredDriverAnswersItsInterfacesByNameAndPointsAtTheRepository) {
   void* raw = nullptr;
   ASSERT_TRUE(m_repository->getDriverIf(name(), IInfo::IID(), &raw).isSuccess());
   RefPtr<IInfo> const info = adoptRef(static_cast<IInfo*>(raw));
-  InfoContainer lines;
-  info->getInfo(lines, 0, 0, 0, 0, "> ");
-  ASSERT_EQ(lines.size(), 1u);
-  EXPECT_EQ(lines[0].key, String("> ").append(name()));
-}
-
-TEST_F(DriverRepositoryTest, RegisteringPointsTheDriverAtTheRepository) {
-  ASSERT_TRUE(m_repository->registerDriver(m_driver.get()).isSuccess());
+  EXPECT_EQ(info.get(), static_cast<IInfo*>(m_driver.get()));
   EXPECT_EQ(m_driver->getDriverRepository(), static_cast<IDriverRepository*>(m_repository.get()));
 }
 
 TEST_F(DriverRepositoryTest, UnknownNameFailsAndStoresNull) {
-  ASSERT_TRUE(m_repository->registerDriver(m_driver.get()).isSuccess());
   void* raw = this;
   EXPECT_TRUE(m_repository->getDriverIf("test-driver", IDriver::IID(), &raw).isFailure());
   EXPECT_EQ(raw, nullptr);
 }
 
 TEST_F(DriverRepositoryTest, SecondDriverUnderTheSameNameIsRefused) {
-  RefPtr<CTestDriver> const twin = adoptRef(new CTestDriver("test-driver"));
-  ASSERT_TRUE(m_repository->registerDriver(m_driver.get()).isSuccess());
+  RefPtr<CTestDriver> const twin = adoptRef(new CTestDriver);
   EXPECT_TRUE(m_repository->registerDriver(twin.get()).isFailure());
   EXPECT_EQ(twin->getDriverRepository(), nullptr);
   RefPtr<IDriver> found;
@@ -94,7 +82,6 @@ TEST_F(DriverRepositoryTest, SecondDriverUnderTheSameNameIsRefused) {
 }
 
 TEST_F(DriverRepositoryTest, UnregisteringReleasesAndDetachesTheDriver) {
-  ASSERT_TRUE(m_repository->registerDriver(m_driver.get()).isSuccess());
   CTestDriver* const driver = m_driver.get();
   driver->addRef();
   m_driver = nullptr;
@@ -105,29 +92,15 @@ TEST_F(DriverRepositoryTest, UnregisteringReleasesAndDetachesTheDriver) {
   EXPECT_EQ(g_driversDestroyed, 1);
 }
 
-TEST_F(DriverRepositoryTest, RepositoryOwnsItsDriversUntilItDies) {
-  ASSERT_TRUE(m_repository->registerDriver(m_driver.get()).isSuccess());
-  m_driver = nullptr;
-  EXPECT_EQ(g_driversDestroyed, 0);
+TEST_F(DriverRepositoryTest, DyingRepositoryReleasesAndDetachesItsDrivers) {
   m_repository = nullptr;
+  EXPECT_EQ(m_driver->getDriverRepository(), nullptr);
+  EXPECT_EQ(g_driversDestroyed, 0);
+  m_driver = nullptr;
   EXPECT_EQ(g_driversDestroyed, 1);
 }
 
-TEST_F(DriverRepositoryTest, DyingRepositoryDetachesDriversHeldElsewhere) {
-  ASSERT_TRUE(m_repository->registerDriver(m_driver.get()).isSuccess());
-  m_repository = nullptr;
-  EXPECT_EQ(m_driver->getDriverRepository(), nullptr);
-}
-
-TEST_F(DriverRepositoryTest, SystemRepositoryIsTheInstalledOneUntilRemoved) {
-  SYSTEM::SET_DRIVER_REPOSITORY(m_repository.get());
-  EXPECT_EQ(SYSTEM::DRIVER_REPOSITORY(), static_cast<IDriverRepository*>(m_repository.get()));
-  SYSTEM::SET_DRIVER_REPOSITORY(nullptr);
-  EXPECT_EQ(SYSTEM::DRIVER_REPOSITORY(), nullptr);
-}
-
-TEST_F(DriverRepositoryTest, SystemKeepsItsOwnReferenceWhileInstalled) {
-  ASSERT_TRUE(m_repository->registerDriver(m_driver.get()).isSuccess());
+TEST_F(DriverRepositoryTest, SystemHoldsTheInstalledRepositoryUntilItIsRemoved) {
   SYSTEM::SET_DRIVER_REPOSITORY(m_repository.get());
   m_repository = nullptr;
   EXPECT_EQ(g_repositoriesDestroyed, 0);
@@ -135,6 +108,7 @@ TEST_F(DriverRepositoryTest, SystemKeepsItsOwnReferenceWhileInstalled) {
   ASSERT_TRUE(SYSTEM::DRIVER_REPOSITORY()->getDriverIf(name(), IDriver::IID(), &raw).isSuccess());
   static_cast<IDriver*>(raw)->release();
   SYSTEM::SET_DRIVER_REPOSITORY(nullptr);
+  EXPECT_EQ(SYSTEM::DRIVER_REPOSITORY(), nullptr);
   EXPECT_EQ(g_repositoriesDestroyed, 1);
 }
 

@@ -58,16 +58,17 @@ INSTANTIATE_TEST_SUITE_P(
                       IpAddressCase{"10.0.0.1", std::string("255.0.0.0\0", 10), false, "", ""},
                       IpAddressCase{std::string(64 * 1024, '1'), "", false, "", ""}));
 
+IpAddress ipAddress(char const* address, char const* netMask) {
+  IpAddress ip;
+  EXPECT_TRUE(ip.set(address, netMask)) << address << " / " << netMask;
+  return ip;
+}
+
 TEST(IpAddress, EqualityComparesAddressAndMask) {
-  IpAddress a;
-  IpAddress b;
-  ASSERT_TRUE(a.set("10.0.0.0", "255.0.0.0"));
-  ASSERT_TRUE(b.set("10.0.0.0", "255.0.0.0"));
-  EXPECT_TRUE(a == b);
-  ASSERT_TRUE(b.set("10.0.0.0", "255.255.0.0"));
-  EXPECT_FALSE(a == b);
-  ASSERT_TRUE(b.set("10.0.0.1", "255.0.0.0"));
-  EXPECT_FALSE(a == b);
+  IpAddress const a = ipAddress("10.0.0.0", "255.0.0.0");
+  EXPECT_TRUE(a == ipAddress("10.0.0.0", "255.0.0.0"));
+  EXPECT_FALSE(a == ipAddress("10.0.0.0", "255.255.0.0"));
+  EXPECT_FALSE(a == ipAddress("10.0.0.1", "255.0.0.0"));
   EXPECT_FALSE(a == IpAddress());
   EXPECT_TRUE(IpAddress() == IpAddress());
 }

@@ -43,16 +43,11 @@ INSTANTIATE_TEST_SUITE_P(Cases,
                                          MatchCase{".", "\xff", 0, true},
                                          MatchCase{"a.b", std::string("a\0b", 3), 0, true}));
 
-class RegExCompile : public testing::TestWithParam<char const*> {};
-
-TEST_P(RegExCompile, TextThatDoesNotCompileGivesNull) {
-  EXPECT_FALSE(RegEx::COMPILE_EXPRESSION(GetParam()));
-}
-
 // Backreferences and lookaround would need backtracking: not accepted.
-INSTANTIATE_TEST_SUITE_P(Texts,
-                         RegExCompile,
-                         testing::Values("(", "[a-", "a{2,1}", "*a", "(a)\\1", "(?=a)a"));
+TEST(RegEx, TextThatDoesNotCompileGivesNull) {
+  for (char const* expression : {"(", "[a-", "a{2,1}", "*a", "(a)\\1", "(?=a)a"})
+    EXPECT_FALSE(RegEx::COMPILE_EXPRESSION(expression)) << expression;
+}
 
 TEST(RegEx, PathologicalPatternFailsQuicklyOnALongText) {
   RefPtr<RegEx::Pattern> const pattern = RegEx::COMPILE_EXPRESSION("(a*)*b");

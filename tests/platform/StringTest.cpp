@@ -4,41 +4,29 @@
 
 namespace {
 
-TEST(String, FormatReplacesTheText) {
+TEST(String, FormatReplacesAndConcatfAppends) {
   String text("old");
-  text.format("%s-%u", "new", 5u);
-  EXPECT_EQ(text, String("new-5"));
-}
-
-TEST(String, ConcatfAppendsToTheText) {
-  String text("a");
-  text.concatf("%d", 12).concatf("%s", "b");
-  EXPECT_EQ(text, String("a12b"));
+  EXPECT_EQ(text.format("%s-%u", "new", 5u), String("new-5"));
+  EXPECT_EQ(text.concatf("%d", 12).concatf("%s", "b"), String("new-512b"));
 }
 
 TEST(String, IndexOfFindsTheFirstOccurrenceOrIsNegative) {
-  String const text("a;b;c");
-  EXPECT_EQ(text.indexOf(';'), 1);
-  EXPECT_EQ(text.indexOf('a'), 0);
-  EXPECT_LT(text.indexOf('x'), 0);
+  EXPECT_EQ(String("a;b;c").indexOf(';'), 1);
+  EXPECT_EQ(String("a;b;c").indexOf('a'), 0);
+  EXPECT_LT(String("a;b;c").indexOf('x'), 0);
   EXPECT_LT(String().indexOf('x'), 0);
 }
 
 TEST(String, StringOfUnsignedShortIsDecimal) {
   EXPECT_EQ(String::stringOf<unsigned short>(0), String("0"));
-  EXPECT_EQ(String::stringOf<unsigned short>(5060), String("5060"));
   EXPECT_EQ(String::stringOf<unsigned short>(65535), String("65535"));
 }
 
-TEST(String, BytesOrderAsUnsigned) {
+TEST(String, BytesOrderAsUnsignedAndEqualityIsLengthAndBytes) {
   EXPECT_GT(String("\xff"), String("a"));
   EXPECT_LT(String("a"), String("\x80"));
-}
-
-TEST(String, EqualityIsLengthAndBytes) {
   EXPECT_NE(String("a\0b", 3), String("a"));
   EXPECT_NE(String("abc"), String("ABC"));
-  EXPECT_NE(String("abc "), String("abc"));
   EXPECT_EQ(String(nullptr), String(""));
 }
 
