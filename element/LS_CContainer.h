@@ -92,6 +92,29 @@ class LS_CContainer : public CInherit<LS_CContainer, LS_CElement, LS_IContainer,
     T value = defaultValue;
     return LS_getDataElement<T>(this, key, LS_Strategy::LOCAL_OR_BASE, value, defaultValue);
   }
+  // The value that strategy shows under key, read in place; null when none.
+  template <class T>
+  T const* valueIn(String const& key, LS_Strategy::Type strategy) const {
+    T const* value = nullptr;
+    LS_getDataElementPointer(this, key, strategy, value);
+    return value;
+  }
+  // The container's own value under key, for editing in place (announce the
+  // edit with changeElement); null when it has none.
+  template <class T>
+  T* ownValue(String const& key) {
+    T* value = nullptr;
+    LS_getDataElementPointer(this, key, value);
+    return value;
+  }
+  // As ownValue, first created from a default T when the container holds no
+  // value of its own under key.
+  template <class T>
+  T* ownValueCreated(String const& key) {
+    T* value = nullptr;
+    LS_createDataElementPointer(this, key, value);
+    return value;
+  }
 
  private:
   using ElementTable = StringHashTable<RefPtr<LS_IElement>>;

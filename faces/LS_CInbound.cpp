@@ -49,15 +49,11 @@ LS_CInbound::~LS_CInbound() {
 }
 
 Vector<LS_FilterRule> const* LS_CInbound::filterRules(LS_Strategy::Type strategy) const {
-  Vector<LS_FilterRule> const* list = nullptr;
-  LS_getDataElementPointer(this, filterKey(), strategy, list);
-  return list;
+  return valueIn<Vector<LS_FilterRule>>(filterKey(), strategy);
 }
 
 Vector<LS_FilterRule>* LS_CInbound::ownFilterRules() {
-  Vector<LS_FilterRule>* list = nullptr;
-  LS_getDataElementPointer(this, filterKey(), list);
-  return list;
+  return ownValue<Vector<LS_FilterRule>>(filterKey());
 }
 
 unsigned int LS_CInbound::getNumberOfConfigFilterRules() const {
@@ -84,13 +80,12 @@ XCode LS_CInbound::modifyConfigFilterRule(unsigned int index,
 XCode LS_CInbound::insertConfigFilterRule(unsigned int index,
                                           LS_FilterType::Type type,
                                           IpAddress const& address) {
-  Vector<LS_FilterRule>* list = nullptr;
-  XCode const result = LS_createDataElementPointer(this, filterKey(), list);
-  if (result.isFailure())
-    return result;
+  Vector<LS_FilterRule>* const list = ownValueCreated<Vector<LS_FilterRule>>(filterKey());
+  if (!list)
+    return XCode::failure();
   LS_insertClamped(*list, index, LS_FilterRule{type, address});
   changeElement(filterKey());
-  return result;
+  return XCode::success();
 }
 
 void LS_CInbound::removeConfigFilterRule(unsigned int index) {

@@ -70,21 +70,15 @@ LS_COutbound::~LS_COutbound() {
 }
 
 Vector<LS_Proxy> const* LS_COutbound::proxies(LS_Strategy::Type strategy) const {
-  Vector<LS_Proxy> const* list = nullptr;
-  LS_getDataElementPointer(this, keys().proxy, strategy, list);
-  return list;
+  return valueIn<Vector<LS_Proxy>>(keys().proxy, strategy);
 }
 
 Vector<LS_Proxy>* LS_COutbound::ownProxies() {
-  Vector<LS_Proxy>* list = nullptr;
-  LS_getDataElementPointer(this, keys().proxy, list);
-  return list;
+  return ownValue<Vector<LS_Proxy>>(keys().proxy);
 }
 
 Vector<LS_Proxy>* LS_COutbound::ownProxiesCreated() {
-  Vector<LS_Proxy>* list = nullptr;
-  LS_createDataElementPointer(this, keys().proxy, list);
-  return list;
+  return ownValueCreated<Vector<LS_Proxy>>(keys().proxy);
 }
 
 void LS_COutbound::proxiesChanged() {

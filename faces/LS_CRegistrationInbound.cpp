@@ -118,15 +118,11 @@ int LS_CRegistrationInbound::getGlobalContacts() {
 
 Vector<LS_Contact> const* LS_CRegistrationInbound::contacts(String const& key,
                                                             LS_Strategy::Type strategy) const {
-  ContactList const* list = nullptr;
-  LS_getDataElementPointer(this, key, strategy, list);
-  return list;
+  return valueIn<ContactList>(key, strategy);
 }
 
 Vector<LS_Contact>* LS_CRegistrationInbound::ownContacts(String const& key) {
-  ContactList* list = nullptr;
-  LS_getDataElementPointer(this, key, list);
-  return list;
+  return ownValue<ContactList>(key);
 }
 
 void LS_CRegistrationInbound::giveBackDynamicContacts() {
@@ -189,13 +185,12 @@ XCode LS_CRegistrationInbound::addConfigContact(CNameAddr const& contact,
                                                 unsigned int priority) {
   // A configured contact takes the place of a dynamic registration of it.
   removeContact(contact, String());
-  ContactList* list = nullptr;
-  XCode const result = LS_createDataElementPointer(this, keys().contact, list);
-  if (result.isFailure())
-    return result;
+  ContactList* const list = ownValueCreated<ContactList>(keys().contact);
+  if (!list)
+    return XCode::failure();
   store(*list, LS_Contact(String(), contact, CHostPort(), context, provider, priority, 0));
   changeElement(keys().contact);
-  return result;
+  return XCode::success();
 }
 
 void LS_CRegistrationInbound::removeConfigContact(CNameAddr const& contact) {
@@ -259,16 +254,15 @@ XCode LS_CRegistrationInbound::addContact(String const& callId,
                                           unsigned int expires) {
   if (holds(contacts(keys().contact, LS_Strategy::LOCAL_ONLY), contact))
     return XCode::failure();
-  ContactList* list = nullptr;
-  XCode const result = LS_createDataElementPointer(this, keys().dynamicContact, list);
-  if (result.isFailure())
-    return result;
+  ContactList* const list = ownValueCreated<ContactList>(keys().dynamicContact);
+  if (!list)
+    return XCode::failure();
   bool const added =
       store(*list, LS_Contact(callId, contact, received, context, provider, priority, expires));
   changeElement(keys().dynamicContact);
   if (added)
     incrementGlobalContacts();
-  return result;
+  return XCode::success();
 }
 
 void LS_CRegistrationInbound::removeContact(CNameAddr const& contact, String const& callId) {
