@@ -6,24 +6,10 @@
 
 namespace {
 
+// Bytes of UTF-8 sequences are let through unchecked, as the stack does for
+// display names.
 bool isTokenCharacter(unsigned char c) {
-  switch (c) {
-    case '-':
-    case '.':
-    case '!':
-    case '%':
-    case '*':
-    case '_':
-    case '+':
-    case '`':
-    case '\'':
-    case '~':
-      return true;
-    default:
-      // Bytes of UTF-8 sequences are let through unchecked, as the stack
-      // does for display names.
-      return SipGrammar::isAlphaNum(c) || c >= 0x80;
-  }
+  return SipGrammar::isAlphaNum(c) || c >= 0x80 || SipGrammar::isOneOf(c, "-.!%*_+`'~");
 }
 
 bool isControl(unsigned char c) {
@@ -32,24 +18,7 @@ bool isControl(unsigned char c) {
 
 // The characters of an absolute URI of a scheme the stack does not know.
 bool isGenericUriCharacter(unsigned char c) {
-  switch (c) {
-    case ':':
-    case '/':
-    case '?':
-    case '#':
-    case '[':
-    case ']':
-    case '@':
-    case '$':
-    case '&':
-    case '+':
-    case ',':
-    case ';':
-    case '=':
-      return true;
-    default:
-      return SipGrammar::isUnreserved(c);
-  }
+  return SipGrammar::isUnreserved(c) || SipGrammar::isOneOf(c, ":/?#[]@$&+,;=");
 }
 
 size_t skipWhiteSpace(char const* text, size_t position, size_t end) {

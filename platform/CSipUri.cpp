@@ -5,62 +5,15 @@
 namespace {
 
 bool isUserCharacter(unsigned char c) {
-  switch (c) {
-    case '&':
-    case '=':
-    case '+':
-    case '$':
-    case ',':
-    case ';':
-    case '?':
-    case '/':
-      return true;
-    default:
-      return SipGrammar::isUnreserved(c);
-  }
+  return SipGrammar::isUnreserved(c) || SipGrammar::isOneOf(c, "&=+$,;?/");
 }
 
 bool isPasswordCharacter(unsigned char c) {
-  switch (c) {
-    case '&':
-    case '=':
-    case '+':
-    case '$':
-    case ',':
-      return true;
-    default:
-      return SipGrammar::isUnreserved(c);
-  }
-}
-
-bool isParameterCharacter(unsigned char c) {
-  switch (c) {
-    case '[':
-    case ']':
-    case '/':
-    case ':':
-    case '&':
-    case '+':
-    case '$':
-      return true;
-    default:
-      return SipGrammar::isUnreserved(c);
-  }
+  return SipGrammar::isUnreserved(c) || SipGrammar::isOneOf(c, "&=+$,");
 }
 
 bool isHeaderCharacter(unsigned char c) {
-  switch (c) {
-    case '[':
-    case ']':
-    case '/':
-    case '?':
-    case ':':
-    case '+':
-    case '$':
-      return true;
-    default:
-      return SipGrammar::isUnreserved(c);
-  }
+  return SipGrammar::isUnreserved(c) || SipGrammar::isOneOf(c, "[]/?:+$");
 }
 
 // ";name[=value]" repeated; names and values are non-empty.
@@ -74,9 +27,10 @@ bool isParameterList(char const* text, size_t length) {
     size_t const equals = SipGrammar::find(text, begin, end, '=');
     if (equals == begin || equals + 1 == end)
       return false;
-    if (!SipGrammar::isEscapedRun(text + begin, equals - begin, isParameterCharacter))
+    if (!SipGrammar::isEscapedRun(text + begin, equals - begin, SipGrammar::isParameterCharacter))
       return false;
-    if (equals < end && !SipGrammar::isEscapedRun(text + equals + 1, end - equals - 1, isParameterCharacter))
+    if (equals < end &&
+        !SipGrammar::isEscapedRun(text + equals + 1, end - equals - 1, SipGrammar::isParameterCharacter))
       return false;
     position = end;
   }

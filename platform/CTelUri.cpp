@@ -27,21 +27,6 @@ bool isParameterNameCharacter(unsigned char c) {
   return SipGrammar::isAlphaNum(c) || c == '-';
 }
 
-bool isParameterValueCharacter(unsigned char c) {
-  switch (c) {
-    case '[':
-    case ']':
-    case '/':
-    case ':':
-    case '&':
-    case '+':
-    case '$':
-      return true;
-    default:
-      return SipGrammar::isUnreserved(c);
-  }
-}
-
 }  // namespace
 
 bool CTelUri::Parse(char const* text, size_t length) {
@@ -74,7 +59,7 @@ bool CTelUri::assign(char const* text, size_t length) {
         return false;
     }
     if (equals < end &&
-        !SipGrammar::isEscapedRun(text + equals + 1, end - equals - 1, isParameterValueCharacter))
+        !SipGrammar::isEscapedRun(text + equals + 1, end - equals - 1, SipGrammar::isParameterCharacter))
       return false;
     if (SipGrammar::equalsIgnoreCase(text + begin, equals - begin, "phone-context")) {
       if (hasPhoneContext || equals == end)

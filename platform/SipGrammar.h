@@ -32,25 +32,27 @@ inline bool isWhiteSpace(unsigned char c) {
   return c == ' ' || c == '\t';
 }
 
-inline bool isMark(unsigned char c) {
-  switch (c) {
-    case '-':
-    case '_':
-    case '.':
-    case '!':
-    case '~':
-    case '*':
-    case '\'':
-    case '(':
-    case ')':
+// True when c is one of the bytes of set (a zero byte never is).
+inline bool isOneOf(unsigned char c, char const* set) {
+  for (; *set; ++set) {
+    if (c == static_cast<unsigned char>(*set))
       return true;
-    default:
-      return false;
   }
+  return false;
+}
+
+inline bool isMark(unsigned char c) {
+  return isOneOf(c, "-_.!~*'()");
 }
 
 inline bool isUnreserved(unsigned char c) {
   return isAlphaNum(c) || isMark(c);
+}
+
+// A byte of a URI parameter name or value besides escapes: the unreserved
+// ones and "[]/:&+$".
+inline bool isParameterCharacter(unsigned char c) {
+  return isUnreserved(c) || isOneOf(c, "[]/:&+$");
 }
 
 // True when every byte of [text, text + length) satisfies allowed, except
