@@ -18,6 +18,9 @@ class LS_IMwiSubscription : public LS_Interface<LS_IMwiSubscriptionIdentifiers> 
   // The configured pair, inherited included; the dynamic notifier is not
   // consulted.
   virtual XCode getMwiNotifier(CHostPort& notifier, CHostPort& tlsNotifier) const = 0;
+  // This face's own pair only, as LS_IMwiSubscriptionConfig reads it; the
+  // run-time side offers it too, as its published method table does.
+  virtual XCode getConfigMwiNotifier(CHostPort& notifier, CHostPort& tlsNotifier) const = 0;
   virtual XCode getDynamicMwiNotifier(CHostPort& notifier) const = 0;
   virtual void setDynamicMwiNotifier(CHostPort const& notifier) = 0;
   virtual void removeDynamicMwiNotifier() = 0;
