@@ -4,13 +4,18 @@
 
 #include <initializer_list>
 #include <memory>
+#include <type_traits>
 
 #include "LS_Alias.h"
 #include "LS_AliasRange.h"
+#include "LS_Credentials.h"
 #include "LS_ForcedDestination.h"
 #include "LS_LifetimeRange.h"
 
 namespace {
+
+// Copied by value like every record, though it holds a counted reference.
+static_assert(std::is_copy_constructible_v<LS_Credentials> && std::is_copy_assignable_v<LS_Credentials>);
 
 CHostPort const kProxy("proxy.example.com", 5060);
 CHostPort const kProxyTls("proxy.example.com", 5061);
