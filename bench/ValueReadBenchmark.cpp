@@ -4,22 +4,12 @@
 // benchmarks of the same run.
 #include <benchmark/benchmark.h>
 
-#include <cstdio>
-#include <map>
-#include <string>
-#include <vector>
-
-#include "LS_CContainer.h"
+#include "BenchContainer.h"
 #include "LS_CData.h"
 #include "LS_Debug.h"
-#include "LS_ElementClassTable.h"
+#include "RatioReporter.h"
 
 namespace {
-
-class BenchContainer : public LS_CContainer {
- public:
-  XCode create(RefPtr<LS_IElement>& element) override { return LS_makeElement<BenchContainer>(element); }
-};
 
 // A chain of depth + 1 containers; the value lives at the top, twenty other
 // values on every level make the tables realistic.
@@ -83,38 +73,13 @@ BENCHMARK(BM_ReadInheritedValueTenLevelsUp);
 BENCHMARK(BM_NoDebugLine);
 BENCHMARK(BM_DisabledDebugLine);
 
-// Prints as usual, then each benchmark's time as a ratio to its baseline.
-class RatioReporter : public benchmark::ConsoleReporter {
- public:
-  void ReportRuns(std::vector<Run> const& runs) override {
-    for (Run const& run : runs)
-      m_nanoseconds[run.benchmark_name()] = run.GetAdjustedRealTime();
-    ConsoleReporter::ReportRuns(runs);
-  }
-  void Finalize() override {
-    ConsoleReporter::Finalize();
-    printRatio("BM_ReadInheritedValueThreeLevelsUp", "BM_ReadOwnValue");
-    printRatio("BM_ReadInheritedValueTenLevelsUp", "BM_ReadOwnValue");
-    printRatio("BM_DisabledDebugLine", "BM_NoDebugLine");
-  }
-
- private:
-  void printRatio(std::string const& name, std::string const& baseline) {
-    auto const measured = m_nanoseconds.find(name);
-    auto const base = m_nanoseconds.find(baseline);
-    if (measured == m_nanoseconds.end() || base == m_nanoseconds.end() || base->second <= 0)
-      return;
-    std::printf("%s / %s = %.2f\n", name.c_str(), baseline.c_str(), measured->second / base->second);
-  }
-
-  std::map<std::string, double> m_nanoseconds;
-};
-
 }  // namespace
 
 int main(int argc, char** argv) {
   benchmark::Initialize(&argc, argv);
-  RatioReporter reporter;
+  RatioReporter reporter({{"BM_ReadInheritedValueThreeLevelsUp", "BM_ReadOwnValue"},
+                          {"BM_ReadInheritedValueTenLevelsUp", "BM_ReadOwnValue"},
+                          {"BM_DisabledDebugLine", "BM_NoDebugLine"}});
   benchmark::RunSpecifiedBenchmarks(&reporter);
   benchmark::Shutdown();
   return 0;
