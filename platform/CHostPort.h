@@ -1,7 +1,7 @@
 // CHostPort: a SIP host with an optional 16-bit port, as written in a URI or
 // configured as a domain: "host", "host:port", "[v6]" or "[v6]:port". Hosts
-// are kept as written; no name resolution or case folding happens here, and
-// the text forms for dumps belong to the catalogue.
+// are kept as written; no name resolution happens here, and the text forms
+// for dumps belong to the catalogue.
 #pragma once
 
 #include <cstddef>
@@ -11,8 +11,10 @@
 // A value type; copies are independent. Host texts of IPv6 references keep
 // their brackets ("[::1]"), so "%s:%u" of host and port is again a valid
 // host-port. Hosts may contain "*" so that wildcard domains such as
-// "*.example.com" can be configured. Equality is that of the host bytes
-// (case-sensitive) and the port.
+// "*.example.com" can be configured. Equality is that of the port and of
+// the host text ignoring ASCII case, since SIP compares hosts without regard
+// to case: a request for "Example.COM" reaches the domain "example.com". The
+// host is still kept and printed as written.
 class CHostPort {
  public:
   // The port value that is not printed. The stand-in has no separate "use
@@ -43,7 +45,7 @@ class CHostPort {
   unsigned short GetPort() const { return m_port; }
 
   friend bool operator==(CHostPort const& a, CHostPort const& b) {
-    return a.m_port == b.m_port && a.m_host == b.m_host;
+    return a.m_port == b.m_port && a.m_host.equalsIgnoringCase(b.m_host);
   }
   friend bool operator!=(CHostPort const& a, CHostPort const& b) { return !(a == b); }
 

@@ -1,8 +1,9 @@
 // CString: the SIP stack's byte string, as its address types hand out host
 // texts, user parts and display names. Equality is that of the bytes
 // (case-sensitive, no trimming) and the text may hold any byte, a zero byte
-// included; c_str() is always zero-terminated. Conversion to the utility
-// library's String and any text processing belong to the callers.
+// included; c_str() is always zero-terminated. Host texts compare with
+// equalsIgnoringCase, as hosts do in SIP. Conversion to the utility
+// library's String and any other text processing belong to the callers.
 #pragma once
 
 #include <cstddef>
@@ -19,6 +20,10 @@ class CString {
   char const* c_str() const { return m_text.c_str(); }
   size_t length() const { return m_text.size(); }
   bool isEmpty() const { return m_text.empty(); }
+
+  // Equality of the bytes with ASCII letters folded: "Example.COM" equals
+  // "example.com". Bytes above 0x7f are compared as they are.
+  bool equalsIgnoringCase(CString const& other) const;
 
   friend bool operator==(CString const& a, CString const& b) { return a.m_text == b.m_text; }
   friend bool operator!=(CString const& a, CString const& b) { return a.m_text != b.m_text; }

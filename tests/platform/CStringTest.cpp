@@ -19,4 +19,11 @@ TEST(CString, EqualityIsByteEqualityIncludingLength) {
   EXPECT_NE(CString("Host"), "host");
 }
 
+TEST(CString, EqualsIgnoringCaseFoldsAsciiLettersOnly) {
+  EXPECT_TRUE(CString("Local-HOST").equalsIgnoringCase("local-host"));
+  EXPECT_FALSE(CString("local-host").equalsIgnoringCase("local-hos"));
+  EXPECT_FALSE(CString("\xc4").equalsIgnoringCase("\xe4"));
+  EXPECT_FALSE(CString("[").equalsIgnoringCase("{")) << "no folding outside the letters";
+}
+
 }  // namespace
