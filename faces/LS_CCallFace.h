@@ -1,8 +1,8 @@
 // LS_CCallFace<Self, Base>: what the inbound and the outbound call face have
 // in common, the names of the VoIP, tone-set and SIP profiles that calls of
 // the identity use ("voip-profile", "tone-set-profile", "sip-profile", one
-// text each). Self names its log texts (CLASS_NAME) and its dump heading
-// (INFO_HEADING); Base is the inbound or the outbound face, whose settings,
+// text each). Self supplies its log formats (LOG_FORMATS) and its dump
+// heading (INFO_HEADING); Base is the inbound or the outbound face, whose settings,
 // dump rows and value helpers (setValue, removeValue, readValue,
 // readValueOr) the call face takes over.
 //
@@ -10,8 +10,9 @@
 // because they differ only in base, log texts and dump heading; each
 // concrete class still derives from CInherit<Self, Base, LS_ICallConfig,
 // LS_ICall> (through this template), so its interfaces and queryInterface
-// are exactly those of a hand-written face. Log lines print the class name
-// through "%s", which yields the same bytes as a literal name.
+// are exactly those of a hand-written face. Each class writes its log
+// formats out in full, so that every line it prints can be found in the code
+// as printed.
 //
 // Config getters read "localOnly", effective getters "localOrBase"; an empty
 // name is stored like any other and hides the inherited one. Ownership and
@@ -36,6 +37,19 @@ struct LS_CallProfileKeys {
     static LS_CallProfileKeys const keys;
     return keys;
   }
+};
+
+// The log formats of one call face, each with the face's address first and
+// the profile name, where there is one, second.
+struct LS_CallFaceLogFormats {
+  char const* constructed;
+  char const* destroyed;
+  char const* setVoipProfile;
+  char const* removeVoipProfile;
+  char const* setToneSetProfile;
+  char const* removeToneSetProfile;
+  char const* setSipProfile;
+  char const* removeSipProfile;
 };
 
 template <class Self, class Base>
@@ -74,16 +88,17 @@ class LS_CCallFace : public CInherit<Self, Base, LS_ICallConfig, LS_ICall> {
 
  private:
   static LS_CallProfileKeys const& keys() { return LS_CallProfileKeys::get(); }
+  static LS_CallFaceLogFormats const& formats() { return Self::LOG_FORMATS; }
 };
 
 template <class Self, class Base>
 LS_CCallFace<Self, Base>::LS_CCallFace() {
-  LS_DEBUG("%s(%p)::%s()\n", Self::CLASS_NAME, this->logAddress(), Self::CLASS_NAME);
+  LS_DEBUG(formats().constructed, this->logAddress());
 }
 
 template <class Self, class Base>
 LS_CCallFace<Self, Base>::~LS_CCallFace() {
-  LS_DEBUG("%s(%p)::~%s()\n", Self::CLASS_NAME, this->logAddress(), Self::CLASS_NAME);
+  LS_DEBUG(formats().destroyed, this->logAddress());
 }
 
 template <class Self, class Base>
@@ -93,13 +108,13 @@ XCode LS_CCallFace<Self, Base>::getConfigVoipProfile(String& profile) const {
 
 template <class Self, class Base>
 void LS_CCallFace<Self, Base>::setConfigVoipProfile(String const& profile) {
-  LS_DEBUG("%s(%p)::setConfigVoipProfile(%s)\n", Self::CLASS_NAME, this->logAddress(), profile.c_str());
+  LS_DEBUG(formats().setVoipProfile, this->logAddress(), profile.c_str());
   this->setValue(keys().voipProfile, profile);
 }
 
 template <class Self, class Base>
 void LS_CCallFace<Self, Base>::removeConfigVoipProfile() {
-  LS_DEBUG("%s(%p)::removeConfigVoipProfile()\n", Self::CLASS_NAME, this->logAddress());
+  LS_DEBUG(formats().removeVoipProfile, this->logAddress());
   this->removeValue(keys().voipProfile);
 }
 
@@ -110,13 +125,13 @@ XCode LS_CCallFace<Self, Base>::getConfigToneSetProfile(String& profile) const {
 
 template <class Self, class Base>
 void LS_CCallFace<Self, Base>::setConfigToneSetProfile(String const& profile) {
-  LS_DEBUG("%s(%p)::setConfigToneSetProfile(%s)\n", Self::CLASS_NAME, this->logAddress(), profile.c_str());
+  LS_DEBUG(formats().setToneSetProfile, this->logAddress(), profile.c_str());
   this->setValue(keys().toneSetProfile, profile);
 }
 
 template <class Self, class Base>
 void LS_CCallFace<Self, Base>::removeConfigToneSetProfile() {
-  LS_DEBUG("%s(%p)::removeConfigToneSetProfile()\n", Self::CLASS_NAME, this->logAddress());
+  LS_DEBUG(formats().removeToneSetProfile, this->logAddress());
   this->removeValue(keys().toneSetProfile);
 }
 
@@ -127,13 +142,13 @@ XCode LS_CCallFace<Self, Base>::getConfigSipProfile(String& profile) const {
 
 template <class Self, class Base>
 void LS_CCallFace<Self, Base>::setConfigSipProfile(String const& profile) {
-  LS_DEBUG("%s(%p)::setConfigSipProfile(%s)\n", Self::CLASS_NAME, this->logAddress(), profile.c_str());
+  LS_DEBUG(formats().setSipProfile, this->logAddress(), profile.c_str());
   this->setValue(keys().sipProfile, profile);
 }
 
 template <class Self, class Base>
 void LS_CCallFace<Self, Base>::removeConfigSipProfile() {
-  LS_DEBUG("%s(%p)::removeConfigSipProfile()\n", Self::CLASS_NAME, this->logAddress());
+  LS_DEBUG(formats().removeSipProfile, this->logAddress());
   this->removeValue(keys().sipProfile);
 }
 
@@ -173,7 +188,7 @@ InfoContainer& LS_CCallFace<Self, Base>::getInfo(InfoContainer& info,
        {ProfileRow{"VoIP Profile", getVoipProfile()}, ProfileRow{"Tone-Set Profile", getToneSetProfile()},
         ProfileRow{"SIP Profile", getSipProfile()}}) {
     if (!row.text.isEmpty())
-      rows.add(level + 1, row.key, row.text);
+      rows.add(level + 1, row.key, String().format("%s", row.text.c_str()));
   }
   return info;
 }

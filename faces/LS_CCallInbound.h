@@ -9,7 +9,16 @@
 
 class LS_CCallInbound : public LS_CCallFace<LS_CCallInbound, LS_CInbound> {
  public:
-  static constexpr char const CLASS_NAME[] = "LS_CCallInbound";
+  static constexpr LS_CallFaceLogFormats LOG_FORMATS{
+      "LS_CCallInbound(%p)::LS_CCallInbound()\n",
+      "LS_CCallInbound(%p)::~LS_CCallInbound()\n",
+      "LS_CCallInbound(%p)::setConfigVoipProfile(%s)\n",
+      "LS_CCallInbound(%p)::removeConfigVoipProfile()\n",
+      "LS_CCallInbound(%p)::setConfigToneSetProfile(%s)\n",
+      "LS_CCallInbound(%p)::removeConfigToneSetProfile()\n",
+      "LS_CCallInbound(%p)::setConfigSipProfile(%s)\n",
+      "LS_CCallInbound(%p)::removeConfigSipProfile()\n",
+  };
   static constexpr char const INFO_HEADING[] = "Inbound Call";
 };
 

@@ -10,7 +10,16 @@
 
 class LS_CCallOutbound : public LS_CCallFace<LS_CCallOutbound, LS_COutbound> {
  public:
-  static constexpr char const CLASS_NAME[] = "LS_CCallOutbound";
+  static constexpr LS_CallFaceLogFormats LOG_FORMATS{
+      "LS_CCallOutbound(%p)::LS_CCallOutbound()\n",
+      "LS_CCallOutbound(%p)::~LS_CCallOutbound()\n",
+      "LS_CCallOutbound(%p)::setConfigVoipProfile(%s)\n",
+      "LS_CCallOutbound(%p)::removeConfigVoipProfile()\n",
+      "LS_CCallOutbound(%p)::setConfigToneSetProfile(%s)\n",
+      "LS_CCallOutbound(%p)::removeConfigToneSetProfile()\n",
+      "LS_CCallOutbound(%p)::setConfigSipProfile(%s)\n",
+      "LS_CCallOutbound(%p)::removeConfigSipProfile()\n",
+  };
   static constexpr char const INFO_HEADING[] = "Outbound Call";
 };
 

@@ -112,11 +112,11 @@ TYPED_TEST(CallFaceTest, DumpShowsPrefixedHeadingThenTheBaseFaceRowsThenTheNonEm
   using Traits = typename TestFixture::Traits;
   Traits::configureBaseFace(*this->base);
   this->base->setConfigSipProfile("sip-inherited");
-  this->face->setConfigVoipProfile("voip-own");
+  this->face->setConfigVoipProfile("voip%s-own");
   this->face->setConfigToneSetProfile("tones-own");
   DumpRows const head = DumpRows{std::string("0|* ") + Traits::HEADING + "|"} + Traits::baseFaceRows();
 
-  EXPECT_EQ(this->dump(), head + DumpRows({"1|VoIP Profile|voip-own", "1|Tone-Set Profile|tones-own",
+  EXPECT_EQ(this->dump(), head + DumpRows({"1|VoIP Profile|voip%s-own", "1|Tone-Set Profile|tones-own",
                                            "1|SIP Profile|sip-inherited"}));
   this->face->setConfigSipProfile("");
   this->face->removeConfigVoipProfile();
