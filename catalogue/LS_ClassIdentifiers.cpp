@@ -1,5 +1,7 @@
 #include "LS_ClassIdentifiers.h"
 
+#include "IDriver.h"
+
 #define LS_DEFINE_CLASS_IDENTIFIER(Accessor, text) \
   UUID const& Accessor() {                         \
     static UUID const id(text, #Accessor);         \
@@ -21,3 +23,9 @@ LS_DEFINE_CLASS_IDENTIFIER(CID_LS_AuthenticationService, "eb3ca04d-b15a-47be-b5b
 LS_DEFINE_CLASS_IDENTIFIER(CID_LS_MasterAuthenticationService, "f4946952-0b3e-4c63-9e44-0d9cd98f8c15")
 LS_DEFINE_CLASS_IDENTIFIER(DID_MasterLocationService, "ae0010e5-648d-415f-9c83-2003bd677420")
 LS_DEFINE_CLASS_IDENTIFIER(DID_MasterAuthenticationService, "b1cea50b-3642-4cef-a6f5-845eb242a05d")
+
+String LS_masterDriverName(char const* baseName) {
+  String name;
+  IDriver::BUILD_DRIVER_NAME(name, baseName, 0, 0, 0xFFFFFFFFu, String(), String(), String(), String());
+  return name;
+}

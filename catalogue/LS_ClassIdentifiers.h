@@ -1,5 +1,5 @@
 // The class identifiers of the objects that the element factories make, and
-// the driver identifiers under which the two masters register.
+// the driver identifiers and names under which the two masters register.
 //
 // Each accessor returns a function-local constant, made on first use
 // (thread-safe) and never destroyed, whose attached name is the accessor's
@@ -7,6 +7,7 @@
 // the business of the container helpers, not of this file.
 #pragma once
 
+#include "String.h"
 #include "UUID.h"
 
 UUID const& CID_LS_Data();
@@ -25,3 +26,9 @@ UUID const& CID_LS_MasterAuthenticationService();
 
 UUID const& DID_MasterLocationService();
 UUID const& DID_MasterAuthenticationService();
+
+// The driver name under which the host registers a master and the lookups
+// find it: IDriver::BUILD_DRIVER_NAME of baseName ("master-location-service"
+// or "master-authentication-service") with 0, 0, 0xFFFFFFFF and four empty
+// texts.
+String LS_masterDriverName(char const* baseName);

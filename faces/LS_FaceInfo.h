@@ -1,26 +1,20 @@
-// What the faces share in their diagnostic dumps: the rule that decides
-// whether a row goes in, and the text a dump shows for a configured
-// host-port. Which rows a face shows, and in what order, belongs to the face.
+// What the faces share in their diagnostic dumps: the rows of servers, and
+// the text a dump shows for a configured host-port. Which rows a face shows,
+// and in what order, belongs to the face.
 #pragma once
 
 #include "CHostPort.h"
 #include "InfoContainer.h"
 #include "LS_AddressText.h"
+#include "LS_InfoRows.h"
 #include "String.h"
 
-// The rows of one getInfo call: a row at some level goes in only when that
-// level is within maxLevel and the call's detail within maxDetail, so a dump
-// cut at a level leaves out everything deeper, headings included.
-class LS_FaceInfo {
+// The rows of one face's getInfo call, with the row that faces with servers
+// share.
+class LS_FaceInfo : public LS_InfoRows {
  public:
-  LS_FaceInfo(InfoContainer& info, unsigned int maxLevel, unsigned int maxDetail, unsigned int detail)
-      : m_info(info), m_maxLevel(maxLevel), m_maxDetail(maxDetail), m_detail(detail) {}
+  using LS_InfoRows::LS_InfoRows;
 
-  bool accepts(unsigned int level) const { return level <= m_maxLevel && m_detail <= m_maxDetail; }
-  void add(unsigned int level, String const& key, String const& value) const {
-    if (accepts(level))
-      m_info.add(level, m_detail, key, value);
-  }
   // A configured server and its TLS counterpart: the server's row, then the
   // TLS row only when the TLS port is one to be shown.
   void addServer(unsigned int level,
@@ -28,12 +22,6 @@ class LS_FaceInfo {
                  CHostPort const& server,
                  String const& tlsKey,
                  CHostPort const& tlsServer) const;
-
- private:
-  InfoContainer& m_info;
-  unsigned int m_maxLevel;
-  unsigned int m_maxDetail;
-  unsigned int m_detail;
 };
 
 // The host alone when the port is the stack's do-not-output marker, else

@@ -1,0 +1,27 @@
+// LS_IMasterAuthenticationService: the registry of the gateway's
+// authentication services, keyed by the name each was created with (bytes,
+// case-sensitive) and listed in creation order. Finding a service for a
+// lookup belongs to the lookup functions.
+#pragma once
+
+#include "LS_Interface.h"
+#include "LS_InterfaceIdentifiers.h"
+#include "String.h"
+#include "Vector.h"
+#include "XCode.h"
+
+class LS_IMasterAuthenticationService : public LS_Interface<LS_IMasterAuthenticationServiceIdentifiers> {
+ public:
+  virtual XCode getAuthenticationServiceIf(String const& name, UUID const& iid, void** out) = 0;
+  // Creates the service when the name is new, then as
+  // getAuthenticationServiceIf.
+  virtual XCode createAuthenticationServiceIf(String const& name, UUID const& iid, void** out) = 0;
+  // Identities whose entries name the service are not told: their entries
+  // simply stop resolving.
+  virtual void removeAuthenticationService(String const& name) = 0;
+  // Replaced by the names, in creation order.
+  virtual void getAuthenticationServices(Vector<String>& names) const = 0;
+
+ protected:
+  ~LS_IMasterAuthenticationService() = default;
+};
