@@ -1,9 +1,8 @@
 #include "LS_CAuthenticationService.h"
 
-#include <cstdint>
-
 #include "LS_Debug.h"
 #include "LS_InfoRows.h"
+#include "LS_ListPosition.h"
 
 LS_CAuthenticationService::LS_CAuthenticationService() {
   LS_DEBUG("LS_CAuthenticationService(%p)::LS_CAuthenticationService()\n", LS_ptr(this));
@@ -35,16 +34,7 @@ String LS_CAuthenticationService::getRealm(unsigned int index) const {
 }
 
 void LS_CAuthenticationService::moveRealm(unsigned int index, int delta) {
-  if (index >= m_realms.size())
-    return;
-  std::int64_t target = static_cast<std::int64_t>(index) + delta;
-  if (target < 0)
-    target = 0;
-  if (target >= static_cast<std::int64_t>(m_realms.size()))
-    target = static_cast<std::int64_t>(m_realms.size()) - 1;
-  String const realm = m_realms[index];
-  m_realms.remove(index);
-  m_realms.insert(static_cast<size_t>(target), realm);
+  LS_moveClamped(m_realms, index, delta);
 }
 
 unsigned int LS_CAuthenticationService::withoutRealm(unsigned int index, String const& realm) {
@@ -66,11 +56,7 @@ void LS_CAuthenticationService::modifyRealm(unsigned int index, String const& re
 }
 
 void LS_CAuthenticationService::insertRealm(unsigned int index, String const& realm) {
-  index = withoutRealm(index, realm);
-  if (index < m_realms.size())
-    m_realms.insert(index, realm);
-  else
-    m_realms.add(realm);
+  LS_insertClamped(m_realms, withoutRealm(index, realm), realm);
 }
 
 void LS_CAuthenticationService::removeRealm(String const& realm) {

@@ -6,6 +6,7 @@
 
 #include "LS_Interface.h"
 #include "LS_InterfaceIdentifiers.h"
+#include "RefPtr.h"
 #include "String.h"
 #include "Vector.h"
 #include "XCode.h"
@@ -25,3 +26,11 @@ class LS_IMasterAuthenticationService : public LS_Interface<LS_IMasterAuthentica
  protected:
   ~LS_IMasterAuthenticationService() = default;
 };
+
+// Interface T of the authentication service called name, or null and the
+// master's failure. Takes no lock on the master.
+template <class T>
+XCode LS_getAuthenticationServiceIf(LS_IMasterAuthenticationService* master, String const& name, RefPtr<T>& out) {
+  return adoptInterface(
+      out, [master, &name](UUID const& iid, void** raw) { return master->getAuthenticationServiceIf(name, iid, raw); });
+}
