@@ -2,7 +2,6 @@
 
 #include <gtest/gtest.h>
 
-#include "LS_Authenticate.h"
 #include "support/ElementRecorders.h"
 
 namespace {
@@ -103,23 +102,6 @@ TEST_F(AppendListTest, NewOwnListInheritsThroughTheShadowItReplaces) {
   ASSERT_TRUE(LS_createAppendListElement(leaf.get(), "authenticate", leafList).isSuccess());
   append(leafList, "E");
   EXPECT_EQ(shown(leafList, LS_Strategy::LOCAL_OR_BASE), (std::vector<std::string>{"A", "B", "C", "D", "E"}));
-}
-
-TEST(AuthenticationListTest, ShadowOfAListOfEntriesShowsTheBasesEntries) {
-  RefPtr<TestContainer> base = makeContainer();
-  RefPtr<TestContainer> derived = makeContainer();
-  derived->setBase(base.get());
-  LS_CAppendList<LS_Authenticate>* list = nullptr;
-  ASSERT_TRUE(LS_createAppendListElement(base.get(), "authenticate", list).isSuccess());
-  list->entries().add(LS_Authenticate{"service", "user"});
-  list->notifyChange();
-
-  LS_CAppendList<LS_Authenticate>* shadow = nullptr;
-  ASSERT_TRUE(LS_getAppendListElement(static_cast<LS_IContainer const*>(derived.get()), "authenticate",
-                                      LS_Strategy::BASE_ONLY, shadow)
-                  .isSuccess());
-  ASSERT_EQ(shadow->size(LS_Strategy::LOCAL_OR_BASE), 1u);
-  EXPECT_EQ(shadow->get(LS_Strategy::LOCAL_OR_BASE, 0)->userName, "user");
 }
 
 }  // namespace

@@ -2,7 +2,6 @@
 
 #include <gtest/gtest.h>
 
-#include "LS_Alias.h"
 #include "support/ElementRecorders.h"
 #include "support/LogCapture.h"
 
@@ -13,48 +12,10 @@ class DataValueTest : public ::testing::Test {
  protected:
   void SetUp() override { derived->setBase(base.get()); }
 
-  String read(LS_IContainer const* container, LS_Strategy::Type strategy) {
-    String value("<none>");
-    LS_getDataElement(container, "display-name", strategy, value);
-    return value;
-  }
-
   Journal journal;
   RefPtr<TestContainer> base = makeContainer();
   RefPtr<TestContainer> derived = makeContainer();
 };
-
-TEST_F(DataValueTest, InheritedValueIsSeenByLocalOrBaseAndBaseOnlyButNotLocalOnly) {
-  LS_setDataElement<String>(base.get(), "display-name", "Base");
-
-  EXPECT_EQ(read(derived.get(), LS_Strategy::LOCAL_OR_BASE), "Base");
-  EXPECT_EQ(read(derived.get(), LS_Strategy::BASE_ONLY), "Base");
-  EXPECT_EQ(read(derived.get(), LS_Strategy::LOCAL_ONLY), "<none>");
-}
-
-TEST_F(DataValueTest, LocalValueOverridesAndHidesLaterChangesOfTheBase) {
-  LS_setDataElement<String>(base.get(), "display-name", "Base");
-  LS_setDataElement<String>(derived.get(), "display-name", "Derived");
-  ContainerWatch watch(derived.get(), journal, "derived");
-
-  LS_setDataElement<String>(base.get(), "display-name", "Base 2");
-
-  EXPECT_EQ(read(derived.get(), LS_Strategy::LOCAL_OR_BASE), "Derived");
-  EXPECT_EQ(read(derived.get(), LS_Strategy::BASE_ONLY), "<none>");
-  EXPECT_TRUE(journal.empty());
-}
-
-TEST_F(DataValueTest, RemovingTheLocalValueShowsTheBaseAndResumesPropagation) {
-  LS_setDataElement<String>(base.get(), "display-name", "Base");
-  LS_setDataElement<String>(derived.get(), "display-name", "Derived");
-  derived->removeElement("display-name");
-  ContainerWatch watch(derived.get(), journal, "derived");
-
-  LS_setDataElement<String>(base.get(), "display-name", "Base 2");
-
-  EXPECT_EQ(read(derived.get(), LS_Strategy::LOCAL_OR_BASE), "Base 2");
-  EXPECT_EQ(journal, (Journal{"derived:change:display-name", "derived:change"}));
-}
 
 TEST_F(DataValueTest, WritingTheSameValueTwiceAnnouncesOneChange) {
   LS_setDataElement<String>(derived.get(), "display-name", "Derived");
@@ -127,18 +88,6 @@ TEST_F(DataValueTest, PointerReadOfAMissingValueStoresNull) {
 TEST_F(DataValueTest, ShadowWithoutAnyValueUpTheChainReadsAsMissing) {
   RefPtr<LS_IElement> orphan = adoptRef(static_cast<LS_IElement*>(new LS_CData<String>));
   EXPECT_EQ(static_cast<LS_CData<String>*>(orphan.get())->get(), nullptr);
-}
-
-TEST(StoredRecordTest, AliasRecordStartsEmptyAndIsEditedInPlace) {
-  RefPtr<TestContainer> container = makeContainer();
-  LS_Alias* alias = nullptr;
-  ASSERT_TRUE(LS_createDataElementPointer(container.get(), "alias", alias).isSuccess());
-  EXPECT_TRUE(alias->names.isEmpty() && alias->ranges.isEmpty() && alias->expressions.isEmpty() &&
-              alias->patterns.isEmpty());
-  alias->names.add("x");
-  LS_Alias const* shown = nullptr;
-  ASSERT_TRUE(LS_getDataElementPointer(container.get(), "alias", LS_Strategy::LOCAL_ONLY, shown).isSuccess());
-  EXPECT_EQ(shown->names[0], "x");
 }
 
 TEST(DataValueLogTest, FirstWriteLogsCreateLocalAndOverwriteLogsOverwrite) {

@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include "platform/QueryInterfaceContract.h"
 #include "support/ElementRecorders.h"
 #include "support/LogCapture.h"
 
@@ -139,16 +140,13 @@ TEST(ElementLogTest, NotificationsWriteTheirLines) {
                          }));
 }
 
-TEST(ElementInterfaceTest, AnswersItsInterfacesWithOneIdentity) {
-  RefPtr<LS_IElement> element = makeElement();
-  RefPtr<IUnknown> viaElement;
-  ASSERT_TRUE(element->queryIf(viaElement).isSuccess());
-  RefPtr<LS_IElement> again;
-  ASSERT_TRUE(viaElement->queryIf(again).isSuccess());
-  EXPECT_EQ(again.get(), element.get());
-  RefPtr<LS_IContainer> container;
-  EXPECT_TRUE(element->queryIf(container).isFailure());
-  EXPECT_EQ(container.get(), nullptr);
-}
+INSTANTIATE_TEST_SUITE_P(Element,
+                         QueryInterfaceContract,
+                         ::testing::Values(ContractClass{
+                             "PlainElement",
+                             [] { return static_cast<IUnknown*>(makeElement().leakRef()); },
+                             {ADVERTISED(IUnknown), ADVERTISED(LS_IElement)},
+                             {&LS_IContainer::IID()}}),
+                         contractRowName);
 
 }  // namespace

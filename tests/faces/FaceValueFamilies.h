@@ -1,7 +1,7 @@
-// Shared pieces of the outbound face tests: the value-family suite (a setter,
-// a config getter, an effective getter and a remover over one key; each face
+// Shared pieces of the face tests: the value-family suite (a setter, a config
+// getter, an effective getter and a remover over one key; each face
 // instantiates FaceValueFamilyTest with its own table, the tests live in
-// LS_COutboundTest.cpp) and the readers that turn values, dumps and log
+// FaceValueFamilyTest.cpp) and the readers that turn values, dumps and log
 // lines into text. NONE stands for a getter that failed.
 #pragma once
 
@@ -22,6 +22,9 @@ unsigned short const NO_PORT = CHostPort::ms_uUSE_SIP_DEFAULT_DONT_OUTPUT_PORT;
 template <class T>
 std::string valueText(T const& value) {
   return std::to_string(static_cast<unsigned long long>(value));
+}
+inline std::string valueText(String const& text) {
+  return text.str();
 }
 inline std::string valueText(CHostPort const& hostPort) {
   return LS_hostPortToString(hostPort).str();
@@ -81,11 +84,11 @@ struct FaceValueFamily {
   std::string defaultText;  // effective value when nothing is set anywhere
   std::string firstText;
   std::string secondText;
-  std::function<RefPtr<LS_COutbound>()> make;
-  std::function<void(LS_COutbound&, bool second)> set;
-  std::function<std::string(LS_COutbound const&)> configured;
-  std::function<std::string(LS_COutbound const&)> effective;
-  std::function<void(LS_COutbound&)> remove;
+  std::function<RefPtr<LS_CContainer>()> make;
+  std::function<void(LS_CContainer&, bool second)> set;
+  std::function<std::string(LS_CContainer const&)> configured;
+  std::function<std::string(LS_CContainer const&)> effective;
+  std::function<void(LS_CContainer&)> remove;
 };
 
 // The table of one face class: Face declares the operations, Made is the
@@ -103,15 +106,16 @@ class FaceValueFamilies {
                          Effective effective,
                          std::string defaultText,
                          void (Face::*remove)()) {
-    auto const as = [](LS_COutbound const& face) -> Face const& { return static_cast<Face const&>(face); };
-    m_rows.push_back(FaceValueFamily{name, key, defaultText, valueText(first), valueText(second),
-                                     [] { return RefPtr<LS_COutbound>(adoptRef(new Made)); },
-                                     [=](LS_COutbound& face, bool useSecond) {
-                                       (static_cast<Face&>(face).*set)(useSecond ? second : first);
-                                     },
-                                     [=](LS_COutbound const& face) { return readText(as(face), configured); },
-                                     [=](LS_COutbound const& face) { return readText(as(face), effective); },
-                                     [=](LS_COutbound& face) { (static_cast<Face&>(face).*remove)(); }});
+    auto const as = [](LS_CContainer const& face) -> Face const& { return static_cast<Face const&>(face); };
+    m_rows.push_back(
+        FaceValueFamily{name, key, defaultText, valueText(first), valueText(second),
+                        [] { return RefPtr<LS_CContainer>(adoptRef(new Made)); },
+                        [=](LS_CContainer& face, bool useSecond) {
+                          (static_cast<Face&>(face).*set)(useSecond ? second : first);
+                        },
+                        [=](LS_CContainer const& face) { return readText(as(face), configured); },
+                        [=](LS_CContainer const& face) { return readText(as(face), effective); },
+                        [=](LS_CContainer& face) { (static_cast<Face&>(face).*remove)(); }});
     return *this;
   }
 
@@ -146,6 +150,6 @@ class FaceValueFamilyTest : public ::testing::TestWithParam<FaceValueFamily> {
   // The configured and the effective value.
   std::vector<std::string> seen() const { return {family().configured(*face), family().effective(*face)}; }
 
-  RefPtr<LS_COutbound> base = GetParam().make();
-  RefPtr<LS_COutbound> face = GetParam().make();
+  RefPtr<LS_CContainer> base = GetParam().make();
+  RefPtr<LS_CContainer> face = GetParam().make();
 };

@@ -6,8 +6,7 @@
 #include <string>
 #include <vector>
 
-#include "DumpRows.h"
-#include "support/ElementRecorders.h"
+#include "FaceValueFamilies.h"
 #include "support/LogCapture.h"
 
 namespace {
@@ -17,13 +16,14 @@ DumpRows operator+(DumpRows rows, DumpRows const& more) {
   return rows;
 }
 
-// What tells the two call faces apart: their texts, and one setting of their
-// base face with the dump rows it gives at level 1.
+// What tells the two call faces apart: their base face, their texts, and one
+// setting of their base face with the dump rows it gives at level 1.
 template <class Face>
 struct CallFaceTraits;
 
 template <>
 struct CallFaceTraits<LS_CCallInbound> {
+  using Base = LS_CInbound;
   static constexpr char const* NAME = "LS_CCallInbound";
   static constexpr char const* HEADING = "Inbound Call";
   static void configureBaseFace(LS_CCallInbound& face) {
@@ -34,40 +34,33 @@ struct CallFaceTraits<LS_CCallInbound> {
 
 template <>
 struct CallFaceTraits<LS_CCallOutbound> {
+  using Base = LS_COutbound;
   static constexpr char const* NAME = "LS_CCallOutbound";
   static constexpr char const* HEADING = "Outbound Call";
   static void configureBaseFace(LS_CCallOutbound& face) { face.setConfigNonInviteTransactionTimeout(0); }
   static DumpRows baseFaceRows() { return {"1|Invite transaction timeout|32"}; }
 };
 
-// One profile family: its method stem, its element key and its operations.
-struct ProfileFamily {
-  char const* stem;
-  char const* key;
-  void (LS_ICallConfig::*set)(String const&);
-  XCode (LS_ICallConfig::*getConfig)(String&) const;
-  void (LS_ICallConfig::*remove)();
-  String (LS_ICall::*get)() const;
-};
-
-using Config = LS_ICallConfig;
-ProfileFamily const FAMILIES[] = {
-    {"VoipProfile", "voip-profile", &Config::setConfigVoipProfile, &Config::getConfigVoipProfile,
-     &Config::removeConfigVoipProfile, &LS_ICall::getVoipProfile},
-    {"ToneSetProfile", "tone-set-profile", &Config::setConfigToneSetProfile, &Config::getConfigToneSetProfile,
-     &Config::removeConfigToneSetProfile, &LS_ICall::getToneSetProfile},
-    {"SipProfile", "sip-profile", &Config::setConfigSipProfile, &Config::getConfigSipProfile,
-     &Config::removeConfigSipProfile, &LS_ICall::getSipProfile},
-};
-
-// The family on a face as "configured|effective", the configured text being
-// "<none>" when the config getter fails.
-template <class Face>
-std::string profileState(Face const& face, ProfileFamily const& family) {
-  String text;
-  std::string const configured = (face.*family.getConfig)(text).isSuccess() ? text.str() : "<none>";
-  return configured + "|" + (face.*family.get)().str();
+// The profiles of one call face, as value families: an empty text is a value
+// of its own that hides the inherited one.
+template <class Made>
+std::vector<FaceValueFamily> profileFamilies() {
+  using Face = LS_CCallFace<Made, typename CallFaceTraits<Made>::Base>;
+  return FaceValueFamilies<Face, Made>()
+      .FACE_VALUE_FAMILY(VoipProfile, "voip-profile", String("voip%s"), String(), "")
+      .FACE_VALUE_FAMILY(ToneSetProfile, "tone-set-profile", String("tones"), String(), "")
+      .FACE_VALUE_FAMILY(SipProfile, "sip-profile", String("sip"), String(), "")
+      .rows();
 }
+
+INSTANTIATE_TEST_SUITE_P(CallInbound,
+                         FaceValueFamilyTest,
+                         ::testing::ValuesIn(profileFamilies<LS_CCallInbound>()),
+                         rowName<FaceValueFamily>);
+INSTANTIATE_TEST_SUITE_P(CallOutbound,
+                         FaceValueFamilyTest,
+                         ::testing::ValuesIn(profileFamilies<LS_CCallOutbound>()),
+                         rowName<FaceValueFamily>);
 
 // A face whose base is the same face of the base identity.
 template <class Face>
@@ -90,24 +83,6 @@ class CallFaceTest : public ::testing::Test {
 using CallFaces = ::testing::Types<LS_CCallInbound, LS_CCallOutbound>;
 TYPED_TEST_SUITE(CallFaceTest, CallFaces);
 
-TYPED_TEST(CallFaceTest, EachProfileIsInheritedUntilSetOnTheFaceEvenToAnEmptyText) {
-  TypeParam& own = *this->face;
-  TypeParam& inherited = *this->base;
-  for (ProfileFamily const& family : FAMILIES) {
-    SCOPED_TRACE(family.stem);
-    (inherited.*family.set)("inherited");
-    EXPECT_EQ(profileState(own, family), "<none>|inherited");
-    (own.*family.set)("own");
-    EXPECT_EQ(profileState(own, family), "own|own");
-    (own.*family.set)("");
-    EXPECT_EQ(profileState(own, family), "|");
-    (own.*family.remove)();
-    EXPECT_EQ(profileState(own, family), "<none>|inherited");
-    (inherited.*family.remove)();
-    EXPECT_EQ(profileState(own, family), "<none>|");
-  }
-}
-
 TYPED_TEST(CallFaceTest, DumpShowsPrefixedHeadingThenTheBaseFaceRowsThenTheNonEmptyProfilesInEffect) {
   using Traits = typename TestFixture::Traits;
   Traits::configureBaseFace(*this->base);
@@ -123,33 +98,20 @@ TYPED_TEST(CallFaceTest, DumpShowsPrefixedHeadingThenTheBaseFaceRowsThenTheNonEm
   EXPECT_EQ(this->dump(), head + DumpRows{"1|Tone-Set Profile|tones-own"});
 }
 
-TYPED_TEST(CallFaceTest, ChangingAProfileIsAnnouncedAsOneChangeOfItsKey) {
-  TypeParam& face = *this->face;
-  for (ProfileFamily const& family : FAMILIES) {
-    (face.*family.set)("first");
-    Journal journal;
-    ContainerWatch watch(&face, journal, "face");
-
-    (face.*family.set)("second");
-    (face.*family.set)("second");
-
-    EXPECT_EQ(journal, (Journal{std::string("face:change:") + family.key, "face:change"}));
-  }
-}
-
 TYPED_TEST(CallFaceTest, SettersRemoversAndLifetimeWriteTheirLinesAndGettersNone) {
   char const* const name = TestFixture::Traits::NAME;
   LogCapture log;
   RefPtr<TypeParam> made = adoptRef(new TypeParam);
-  TypeParam& face = *made;
   void const* const self = static_cast<LS_IElement*>(made.get());
   std::vector<std::string> expected{formatted("%s(%p)::%s()\n", name, self, name)};
-  for (ProfileFamily const& family : FAMILIES) {
-    (face.*family.set)("p");
-    profileState(face, family);
-    (face.*family.remove)();
-    expected.push_back(formatted("%s(%p)::setConfig%s(p)\n", name, self, family.stem));
-    expected.push_back(formatted("%s(%p)::removeConfig%s()\n", name, self, family.stem));
+  for (FaceValueFamily const& family : profileFamilies<TypeParam>()) {
+    family.set(*made, false);
+    family.configured(*made);
+    family.effective(*made);
+    family.remove(*made);
+    expected.push_back(
+        formatted("%s(%p)::setConfig%s(%s)\n", name, self, family.name.c_str(), family.firstText.c_str()));
+    expected.push_back(formatted("%s(%p)::removeConfig%s()\n", name, self, family.name.c_str()));
   }
   made = nullptr;
   expected.push_back(formatted("%s(%p)::~%s()\n", name, self, name));

@@ -11,33 +11,6 @@
 #include "support/ElementRecorders.h"
 #include "support/LogCapture.h"
 
-// The shared suite of the value families; every outbound face instantiates it.
-
-TEST_P(FaceValueFamilyTest, NothingSetAnywhereShowsTheDefault) {
-  EXPECT_EQ(seen(), (std::vector<std::string>{NONE, family().defaultText}));
-}
-
-TEST_P(FaceValueFamilyTest, OwnValueHidesTheBaseValueUntilItIsRemoved) {
-  family().set(*base, false);
-  EXPECT_EQ(seen(), (std::vector<std::string>{NONE, family().firstText}));
-
-  family().set(*face, true);
-  EXPECT_EQ(seen(), (std::vector<std::string>{family().secondText, family().secondText}));
-
-  family().remove(*face);
-  EXPECT_EQ(seen(), (std::vector<std::string>{NONE, family().firstText}));
-}
-
-TEST_P(FaceValueFamilyTest, ChangingAValueIsAnnouncedAsOneChangeOfItsKey) {
-  family().set(*face, false);
-  Journal journal;
-  ContainerWatch watch(face.get(), journal, "face");
-
-  family().set(*face, true);
-
-  EXPECT_EQ(journal, (Journal{"face:change:" + family().key, "face:change"}));
-}
-
 namespace {
 
 // The outbound face is abstract; this is the smallest face that can be made.

@@ -3,12 +3,11 @@
 #include <gtest/gtest.h>
 
 #include <atomic>
-#include <functional>
-#include <string>
 #include <thread>
 #include <vector>
 
 #include "IUnknown.h"
+#include "QueryInterfaceContract.h"
 
 namespace {
 
@@ -51,70 +50,28 @@ class CFirstSecond : public CInherit<CFirstSecond, CFirst, ITestSecond> {
   int second() const override { return 2; }
 };
 
-// The count an object has now, observed through addRef's answer.
-template <class T>
-unsigned int countOf(T* object) {
-  unsigned int const count = object->addRef() - 1;
-  object->release();
-  return count;
-}
-
-struct ObjectModelCase {
-  char const* name;
-  std::function<IUnknown*()> make;  // a new object, count 1, as IUnknown
-  std::vector<UUID const*> answered;
-};
-
-class QueryInterfaceContract : public testing::TestWithParam<ObjectModelCase> {
- protected:
-  void SetUp() override { m_object = GetParam().make(); }
-  void TearDown() override { m_object->release(); }
-
-  IUnknown* m_object = nullptr;
-};
-
-// Every interface pointer derives from IUnknown first, so each can be asked for IUnknown again.
-TEST_P(QueryInterfaceContract, EachAdvertisedInterfaceAnswersWithAReferenceAddedAndOneIdentity) {
-  void* identity = nullptr;
-  ASSERT_TRUE(m_object->queryInterface(IUnknown::IID(), &identity).isSuccess());
-  RefPtr<IUnknown> const holdIdentity = adoptRef(static_cast<IUnknown*>(identity));
-  for (UUID const* iid : GetParam().answered) {
-    void* raw = nullptr;
-    ASSERT_TRUE(m_object->queryInterface(*iid, &raw).isSuccess()) << iid->name();
-    RefPtr<IUnknown> const asked = adoptRef(static_cast<IUnknown*>(raw));
-    EXPECT_EQ(countOf(m_object), 3u) << iid->name();
-    void* again = nullptr;
-    ASSERT_TRUE(asked->queryInterface(IUnknown::IID(), &again).isSuccess());
-    EXPECT_EQ(again, identity) << iid->name();
-    static_cast<IUnknown*>(again)->release();
-  }
-}
-
-TEST_P(QueryInterfaceContract, UnknownIdentifierFailsAndStoresNull) {
-  void* raw = this;
-  EXPECT_TRUE(
-      m_object->queryInterface(UUID("d9d777fe-fe4c-4041-b0a5-79558940e228", "INobody"), &raw).isFailure());
-  EXPECT_EQ(raw, nullptr);
-  EXPECT_EQ(countOf(m_object), 1u);
-}
-
 INSTANTIATE_TEST_SUITE_P(
     Classes,
     QueryInterfaceContract,
-    testing::Values(
-        ObjectModelCase{"CObject", [] { return static_cast<IUnknown*>(new CObject); }, {&IUnknown::IID()}},
-        ObjectModelCase{"CInheritOneInterface",
-                        [] { return static_cast<IUnknown*>(static_cast<ITestFirst*>(new CFirst)); },
-                        {&IUnknown::IID(), &ITestFirst::IID()}},
-        ObjectModelCase{"CInheritOverCInherit",
+    testing::Values(ContractClass{"CObject",
+                                  [] { return static_cast<IUnknown*>(new CObject); },
+                                  {ADVERTISED(IUnknown)},
+                                  {&ITestFirst::IID()}},
+                    ContractClass{"CInheritOneInterface",
+                                  [] { return static_cast<IUnknown*>(static_cast<ITestFirst*>(new CFirst)); },
+                                  {ADVERTISED(IUnknown), ADVERTISED(ITestFirst)},
+                                  {&ITestSecond::IID()}},
+                    ContractClass{
+                        "CInheritOverCInherit",
                         [] { return static_cast<IUnknown*>(static_cast<ITestSecond*>(new CFirstSecond)); },
-                        {&IUnknown::IID(), &ITestFirst::IID(), &ITestSecond::IID()}}),
-    [](testing::TestParamInfo<ObjectModelCase> const& info) { return std::string(info.param.name); });
+                        {ADVERTISED(IUnknown), ADVERTISED(ITestFirst), ADVERTISED(ITestSecond)},
+                        {}}),
+    contractRowName);
 
 TEST(ObjectLifetime, CountStartsAtOneAndTheLastReleaseDestroys) {
   g_destroyed = 0;
   RefPtr<CFirst> object = adoptRef(new CFirst);
-  EXPECT_EQ(countOf(object.get()), 1u);
+  EXPECT_EQ(countOf(static_cast<ITestFirst*>(object.get())), 1u);
   RefPtr<ITestFirst> second;
   ASSERT_TRUE(object->queryIf(second).isSuccess());
   object = nullptr;
@@ -139,7 +96,7 @@ TEST(ObjectLifetime, CountingFromSeveralThreadsIsAtomic) {
   for (std::thread& thread : threads)
     thread.join();
   EXPECT_EQ(g_destroyed, 0);
-  EXPECT_EQ(countOf(object), 1u);
+  EXPECT_EQ(countOf(static_cast<ITestFirst*>(object)), 1u);
   object->release();
   EXPECT_EQ(g_destroyed, 1);
 }
