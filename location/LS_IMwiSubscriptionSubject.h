@@ -1,0 +1,40 @@
+// LS_IMwiSubscriptionSubject: an identity as the subject of its
+// message-waiting subscription: observers register here and receive an EvIdentity whose subject is the
+// identity's face (own or inherited; null while the identity has none) and
+// which names the identity. When the identity raises the events belongs to
+// the identity.
+#pragma once
+
+#include <memory>
+
+#include "LS_IIdentity.h"
+#include "LS_IMwiSubscription.h"
+#include "LS_IMwiSubscriptionObserver.h"
+#include "LS_Interface.h"
+#include "LS_InterfaceIdentifiers.h"
+#include "ObserverEvent.h"
+#include "RefPtr.h"
+
+class LS_IMwiSubscriptionSubject : public LS_Interface<LS_IMwiSubscriptionSubjectIdentifiers> {
+ public:
+  // Holds the identity by a counted reference, so an observer may drop
+  // every other reference to it while the event is being delivered.
+  class EvIdentity : public ObserverEvent<LS_IMwiSubscription> {
+   public:
+    EvIdentity(LS_IMwiSubscription* face, LS_IIdentity* concerned)
+        : ObserverEvent<LS_IMwiSubscription>(face), identity(concerned) {}
+    EvIdentity(EvIdentity const&) = default;
+    std::unique_ptr<ObserverEvent<LS_IMwiSubscription>> clone() const override {
+      return std::make_unique<EvIdentity>(*this);
+    }
+
+    RefPtr<LS_IIdentity> identity;
+  };
+
+  virtual void addMwiSubscriptionObserver(LS_IMwiSubscriptionObserver* observer, unsigned int priority) = 0;
+  // Undoes one registration; unknown observers are ignored.
+  virtual void removeMwiSubscriptionObserver(LS_IMwiSubscriptionObserver* observer) = 0;
+
+ protected:
+  ~LS_IMwiSubscriptionSubject() = default;
+};
