@@ -1,0 +1,145 @@
+#include "LS_ServiceResolution.h"
+
+#include "LS_AddressText.h"
+#include "LS_ClassIdentifiers.h"
+#include "LS_DriverInterface.h"
+#include "LockedPtr.h"
+#include "SystemRepository.h"
+
+namespace {
+
+template <class Master>
+XCode findMaster(String& error, RefPtr<Master>& out, char const* baseName, char const* missing) {
+  out = nullptr;
+  RefPtr<IDriverRepository> repository = SYSTEM::DRIVER_REPOSITORY();
+  if (!repository) {
+    error = "DRIVER REPOSITORY DOES NOT EXIST";
+    return XCode::failure();
+  }
+  XCode const result = getDriverInterface(repository, LS_masterDriverName(baseName), out);
+  if (result.isFailure())
+    error = missing;
+  return result;
+}
+
+// The master to use: the one given, else the registered one.
+template <class Master>
+XCode resolveMaster(String& error,
+                    Master* given,
+                    RefPtr<Master>& master,
+                    XCode (*findRegistered)(String&, RefPtr<Master>&)) {
+  master = given;
+  return given ? XCode::success() : findRegistered(error, master);
+}
+
+// One pass over names asking isResponsible with localHostPorts: the first
+// exact match, else the first partial one, else null.
+RefPtr<LS_ILocationService> responsibleByDomain(LS_IMasterLocationService* master,
+                                                CHostPort const& host,
+                                                Vector<String> const& names,
+                                                Vector<CHostPort> const& localHostPorts,
+                                                LS_Imperative::Type imperative) {
+  RefPtr<LS_ILocationService> partial;
+  for (String const& name : names) {
+    RefPtr<LS_ILocationService> service;
+    if (LS_getLocationServiceIf(master, name, service).isFailure())
+      continue;
+    bool exact = false;
+    if (!LockedPtr<LS_ILocationService>(service)->isResponsible(host, localHostPorts, imperative, exact))
+      continue;
+    if (exact)
+      return service;
+    if (!partial)
+      partial = service;
+  }
+  return partial;
+}
+
+RefPtr<LS_ILocationService> firstDefaultDomain(LS_IMasterLocationService* master, Vector<String> const& names) {
+  for (String const& name : names) {
+    RefPtr<LS_ILocationService> service;
+    if (LS_getLocationServiceIf(master, name, service).isSuccess() &&
+        LockedPtr<LS_ILocationService>(service)->getDefaultDomain())
+      return service;
+  }
+  return nullptr;
+}
+
+}  // namespace
+
+XCode LS_getMasterLocationService(String& error, RefPtr<LS_IMasterLocationService>& out) {
+  return findMaster(error, out, "master-location-service", "MASTER LOCATION-SERVICE DOES NOT EXIST");
+}
+
+XCode LS_getMasterAuthenticationService(String& error, RefPtr<LS_IMasterAuthenticationService>& out) {
+  return findMaster(error, out, "master-authentication-service", "MASTER AUTHENTICATION-SERVICE DOES NOT EXIST");
+}
+
+XCode LS_getLocationService(String& error,
+                            RefPtr<LS_ILocationService>& out,
+                            String const& name,
+                            LS_IMasterLocationService* master) {
+  out = nullptr;
+  RefPtr<LS_IMasterLocationService> resolved;
+  XCode result = resolveMaster(error, master, resolved, &LS_getMasterLocationService);
+  if (result.isFailure())
+    return result;
+  result = LS_getLocationServiceIf(resolved.get(), name, out);
+  if (result.isFailure())
+    error.format("LOCATION-SERVICE '%s' DOES NOT EXIST", name.c_str());
+  return result;
+}
+
+XCode LS_getAuthenticationService(String& error,
+                                  RefPtr<LS_IAuthenticationService>& out,
+                                  String const& name,
+                                  LS_IMasterAuthenticationService* master) {
+  out = nullptr;
+  RefPtr<LS_IMasterAuthenticationService> resolved;
+  XCode result = resolveMaster(error, master, resolved, &LS_getMasterAuthenticationService);
+  if (result.isFailure())
+    return result;
+  result = LS_getAuthenticationServiceIf(resolved.get(), name, out);
+  if (result.isFailure())
+    error.format("AUTHENTICATION-SERVICE '%s' DOES NOT EXIST", name.c_str());
+  return result;
+}
+
+XCode LS_getLocationService(String& error,
+                            RefPtr<LS_ILocationService>& out,
+                            CHostPort const& host,
+                            Vector<String> const& names,
+                            Vector<CHostPort> const& localHostPorts,
+                            LS_Imperative::Type imperative,
+                            LS_IMasterLocationService* master) {
+  out = nullptr;
+  RefPtr<LS_IMasterLocationService> resolved;
+  XCode const result = resolveMaster(error, master, resolved, &LS_getMasterLocationService);
+  if (result.isFailure())
+    return result;
+  out = responsibleByDomain(resolved.get(), host, names, Vector<CHostPort>(), imperative);
+  if (!out)
+    out = firstDefaultDomain(resolved.get(), names);
+  if (!out)
+    out = responsibleByDomain(resolved.get(), host, names, localHostPorts, imperative);
+  if (out)
+    return XCode::success();
+  error.format("NO LOCATION-SERVICE IS RESPONSIBLE FOR DOMAIN '%s'", LS_hostPortToString(host).c_str());
+  return XCode::failure();
+}
+
+XCode LS_getLocationService(String& error,
+                            RefPtr<LS_ILocationService>& out,
+                            CHostPort const& host,
+                            Vector<CHostPort> const& localHostPorts,
+                            LS_Imperative::Type imperative,
+                            LS_IMasterLocationService* master) {
+  out = nullptr;
+  RefPtr<LS_IMasterLocationService> resolved;
+  XCode const result = resolveMaster(error, master, resolved, &LS_getMasterLocationService);
+  if (result.isFailure())
+    return result;
+  Vector<String> names;
+  LockedPtr<LS_IMasterLocationService>(resolved)->getLocationServices(names);
+  return LS_getLocationService(error, out, host, names, localHostPorts, imperative, resolved.get());
+}

@@ -1,0 +1,165 @@
+#include "LS_ServiceResolution.h"
+
+#include <gtest/gtest.h>
+
+#include <string>
+#include <vector>
+
+#include "CDriverRepository.h"
+#include "LS_CMasterAuthenticationService.h"
+#include "LS_CMasterLocationService.h"
+#include "LS_ILocationServiceConfig.h"
+#include "SystemRepository.h"
+
+namespace {
+
+CHostPort hostPort(char const* text) {
+  CHostPort parsed;
+  parsed = CString(text);
+  return parsed;
+}
+
+template <class... Texts>
+Vector<String> namesOf(Texts... texts) {
+  Vector<String> names;
+  for (char const* text : {texts...})
+    names.add(text);
+  return names;
+}
+
+// Both masters, registered in a repository that a test installs when it
+// wants the lookups to find them, with location services of every kind.
+class ServiceResolutionTest : public ::testing::Test {
+ protected:
+  void SetUp() override {
+    repository->registerDriver(locationMaster.get());
+    repository->registerDriver(authenticationMaster.get());
+    service("partial1")->insertConfigDomain(0, hostPort("example.com"));
+    service("partial2")->insertConfigDomain(0, hostPort("example.com"));
+    service("exact")->insertConfigDomain(0, hostPort("example.com:5060"));
+    RefPtr<LS_ILocationServiceConfig> const backup = service("backup");
+    backup->setConfigImperative(LS_Imperative::BACKUP);
+    backup->insertConfigDomain(0, hostPort("backup.org"));
+    RefPtr<LS_ILocationServiceConfig> const fallback = service("default");
+    fallback->setConfigImperative(LS_Imperative::BACKUP);
+    fallback->setConfigDefaultDomain(true);
+    service("local");
+  }
+  void TearDown() override { SYSTEM::SET_DRIVER_REPOSITORY(nullptr); }
+
+  RefPtr<LS_ILocationServiceConfig> service(char const* name) {
+    RefPtr<LS_ILocationServiceConfig> created;
+    adoptInterface(created,
+                   [&](UUID const& iid, void** raw) { return locationMaster->createLocationServiceIf(name, iid, raw); });
+    return created;
+  }
+
+  RefPtr<LS_CMasterLocationService> locationMaster = adoptRef(new LS_CMasterLocationService);
+  RefPtr<LS_CMasterAuthenticationService> authenticationMaster = adoptRef(new LS_CMasterAuthenticationService);
+  RefPtr<CDriverRepository> repository = adoptRef(new CDriverRepository);
+  String error{"untouched"};
+};
+
+struct HostCase {
+  char const* what;
+  char const* host;
+  Vector<String> names;
+  char const* localHostPort;
+  LS_Imperative::Type imperative;
+  char const* expected;  // the service's name, or the error text
+};
+
+void PrintTo(HostCase const& c, std::ostream* os) {
+  *os << c.what;
+}
+
+class HostResolution : public ServiceResolutionTest, public ::testing::WithParamInterface<HostCase> {};
+
+TEST_P(HostResolution, ChoosesByDomainThenDefaultThenLocalHostPorts) {
+  HostCase const& c = GetParam();
+  Vector<CHostPort> local;
+  local.add(hostPort(c.localHostPort));
+  RefPtr<LS_ILocationService> found;
+  XCode const result =
+      LS_getLocationService(error, found, hostPort(c.host), c.names, local, c.imperative, locationMaster.get());
+  if (result.isSuccess()) {
+    EXPECT_EQ(found->getName().str(), c.expected);
+    EXPECT_EQ(error, "untouched");
+    return;
+  }
+  EXPECT_EQ(found.get(), nullptr);
+  EXPECT_EQ(error.str(), c.expected);
+}
+
+constexpr auto AUTHORITATIVE = LS_Imperative::AUTHORITATIVE;
+
+INSTANTIATE_TEST_SUITE_P(
+    Table,
+    HostResolution,
+    ::testing::Values(
+        HostCase{"exact beats an earlier partial", "example.com:5060", namesOf("partial1", "exact"), "gw",
+                 AUTHORITATIVE, "exact"},
+        HostCase{"first of two partials", "example.com:5060", namesOf("partial2", "partial1"), "gw", AUTHORITATIVE,
+                 "partial2"},
+        HostCase{"host case ignored", "EXAMPLE.com:5070", namesOf("exact", "partial1"), "gw", AUTHORITATIVE,
+                 "partial1"},
+        HostCase{"other port is no match", "example.com:5061", namesOf("exact"), "gw", AUTHORITATIVE,
+                 "NO LOCATION-SERVICE IS RESPONSIBLE FOR DOMAIN 'example.com:5061'"},
+        HostCase{"default beats a local host-port", "gw:5060", namesOf("local", "default"), "gw:5060", AUTHORITATIVE,
+                 "default"},
+        HostCase{"configured domain beats default", "example.com", namesOf("default", "partial1"), "gw",
+                 AUTHORITATIVE, "partial1"},
+        HostCase{"local host-port in the last pass", "gw:5060", namesOf("local"), "gw", AUTHORITATIVE, "local"},
+        HostCase{"backup invisible to authoritative", "backup.org", namesOf("backup"), "gw", AUTHORITATIVE,
+                 "NO LOCATION-SERVICE IS RESPONSIBLE FOR DOMAIN 'backup.org'"},
+        HostCase{"backup seen by backup", "backup.org", namesOf("backup"), "gw", LS_Imperative::BACKUP, "backup"},
+        HostCase{"missing name skipped silently", "example.com", namesOf("gone", "partial1"), "gw", AUTHORITATIVE,
+                 "partial1"},
+        HostCase{"no names", "example.com", Vector<String>(), "gw", AUTHORITATIVE,
+                 "NO LOCATION-SERVICE IS RESPONSIBLE FOR DOMAIN 'example.com'"}));
+
+TEST_F(ServiceResolutionTest, WithoutNamesEveryServiceIsTriedInCreationOrderThroughTheRepository) {
+  SYSTEM::SET_DRIVER_REPOSITORY(repository.get());
+  RefPtr<LS_ILocationService> found;
+  ASSERT_TRUE(LS_getLocationService(error, found, hostPort("example.com:5060"), Vector<CHostPort>(), AUTHORITATIVE,
+                                    nullptr)
+                  .isSuccess());
+  EXPECT_EQ(found->getName(), "exact");
+  ASSERT_TRUE(
+      LS_getLocationService(error, found, hostPort("nowhere"), Vector<CHostPort>(), AUTHORITATIVE, nullptr).isSuccess());
+  EXPECT_EQ(found->getName(), "default");
+  EXPECT_EQ(error, "untouched");
+}
+
+TEST_F(ServiceResolutionTest, MissingRepositoryMastersAndNamesSayWhatIsMissing) {
+  RefPtr<LS_ILocationService> location;
+  RefPtr<LS_IAuthenticationService> authentication;
+  EXPECT_TRUE(LS_getLocationService(error, location, "exact", nullptr).isFailure());
+  EXPECT_EQ(error, "DRIVER REPOSITORY DOES NOT EXIST");
+  EXPECT_TRUE(LS_getLocationService(error, location, "exact", locationMaster.get()).isSuccess())
+      << "a given master needs no repository";
+
+  RefPtr<CDriverRepository> const empty = adoptRef(new CDriverRepository);
+  SYSTEM::SET_DRIVER_REPOSITORY(empty.get());
+  EXPECT_TRUE(LS_getLocationService(error, location, "exact", nullptr).isFailure());
+  EXPECT_EQ(error, "MASTER LOCATION-SERVICE DOES NOT EXIST");
+  EXPECT_TRUE(LS_getAuthenticationService(error, authentication, "a", nullptr).isFailure());
+  EXPECT_EQ(error, "MASTER AUTHENTICATION-SERVICE DOES NOT EXIST");
+
+  SYSTEM::SET_DRIVER_REPOSITORY(repository.get());
+  EXPECT_TRUE(LS_getLocationService(error, location, "Exact", nullptr).isFailure());
+  EXPECT_EQ(error, "LOCATION-SERVICE 'Exact' DOES NOT EXIST");
+  EXPECT_EQ(location.get(), nullptr);
+  EXPECT_TRUE(LS_getAuthenticationService(error, authentication, "a%s", nullptr).isFailure());
+  EXPECT_EQ(error, "AUTHENTICATION-SERVICE 'a%s' DOES NOT EXIST");
+
+  adoptInterface(authentication, [&](UUID const& iid, void** raw) {
+    return authenticationMaster->createAuthenticationServiceIf("a", iid, raw);
+  });
+  error = "untouched";
+  EXPECT_TRUE(LS_getAuthenticationService(error, authentication, "a", nullptr).isSuccess());
+  EXPECT_TRUE(LS_getLocationService(error, location, "exact", nullptr).isSuccess());
+  EXPECT_EQ(error, "untouched");
+}
+
+}  // namespace
