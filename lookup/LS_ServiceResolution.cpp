@@ -32,6 +32,27 @@ XCode resolveMaster(String& error,
   return given ? XCode::success() : findRegistered(error, master);
 }
 
+// The service called name, from the given or the registered master; missing
+// names the service in the error text.
+template <class Master, class Service>
+XCode serviceByName(String& error,
+                    RefPtr<Service>& out,
+                    String const& name,
+                    Master* given,
+                    XCode (*findRegistered)(String&, RefPtr<Master>&),
+                    XCode (*serviceIf)(Master*, String const&, RefPtr<Service>&),
+                    char const* missing) {
+  out = nullptr;
+  RefPtr<Master> master;
+  XCode result = resolveMaster(error, given, master, findRegistered);
+  if (result.isFailure())
+    return result;
+  result = serviceIf(master.get(), name, out);
+  if (result.isFailure())
+    error.format(missing, name.c_str());
+  return result;
+}
+
 // One pass over names asking isResponsible with localHostPorts: the first
 // exact match, else the first partial one, else null.
 RefPtr<LS_ILocationService> responsibleByDomain(LS_IMasterLocationService* master,
@@ -79,30 +100,17 @@ XCode LS_getLocationService(String& error,
                             RefPtr<LS_ILocationService>& out,
                             String const& name,
                             LS_IMasterLocationService* master) {
-  out = nullptr;
-  RefPtr<LS_IMasterLocationService> resolved;
-  XCode result = resolveMaster(error, master, resolved, &LS_getMasterLocationService);
-  if (result.isFailure())
-    return result;
-  result = LS_getLocationServiceIf(resolved.get(), name, out);
-  if (result.isFailure())
-    error.format("LOCATION-SERVICE '%s' DOES NOT EXIST", name.c_str());
-  return result;
+  return serviceByName(error, out, name, master, &LS_getMasterLocationService,
+                       &LS_getLocationServiceIf<LS_ILocationService>, "LOCATION-SERVICE '%s' DOES NOT EXIST");
 }
 
 XCode LS_getAuthenticationService(String& error,
                                   RefPtr<LS_IAuthenticationService>& out,
                                   String const& name,
                                   LS_IMasterAuthenticationService* master) {
-  out = nullptr;
-  RefPtr<LS_IMasterAuthenticationService> resolved;
-  XCode result = resolveMaster(error, master, resolved, &LS_getMasterAuthenticationService);
-  if (result.isFailure())
-    return result;
-  result = LS_getAuthenticationServiceIf(resolved.get(), name, out);
-  if (result.isFailure())
-    error.format("AUTHENTICATION-SERVICE '%s' DOES NOT EXIST", name.c_str());
-  return result;
+  return serviceByName(error, out, name, master, &LS_getMasterAuthenticationService,
+                       &LS_getAuthenticationServiceIf<LS_IAuthenticationService>,
+                       "AUTHENTICATION-SERVICE '%s' DOES NOT EXIST");
 }
 
 XCode LS_getLocationService(String& error,
