@@ -37,11 +37,6 @@ class MasterAuthenticationTest : public ::testing::Test {
 TEST_F(MasterAuthenticationTest, IsTheDriverTheLookupsLookFor) {
   EXPECT_EQ(master->getDID(), DID_MasterAuthenticationService());
   EXPECT_EQ(master->getDriverName(), LS_masterDriverName("master-authentication-service"));
-  for (UUID const* iid : {&IUnknown::IID(), &IDriver::IID(), &LS_IMasterAuthenticationService::IID(), &IInfo::IID()}) {
-    void* raw = nullptr;
-    EXPECT_TRUE(master->queryInterface(*iid, &raw).isSuccess());
-    static_cast<IUnknown*>(raw)->release();
-  }
 }
 
 TEST_F(MasterAuthenticationTest, NamesServicesOnceAndListsThemInCreationOrder) {
