@@ -100,11 +100,20 @@ class ObserverContainer {
 
   // Unlinks the entries marked dead, unless a broadcast is running.
   void doHousekeeping() {
-    if (m_busy || m_dead.empty())
+    if (m_busy || m_retired == 0)
       return;
-    for (Position const position : m_dead)
+    m_retired = 0;
+    if (!m_index) {
+      // Short: sweeping it costs no more than keeping a list of the dead.
+      for (Position position = m_entries.begin(); position != m_entries.end();)
+        position = position->count > 0 ? std::next(position) : unlink(position);
+      return;
+    }
+    // Unlinking the last entry drops the index, and with it this list.
+    std::vector<Position> retired;
+    retired.swap(m_index->retired);
+    for (Position const position : retired)
       unlink(position);
-    m_dead.clear();
   }
 
   // Registrations still linked, dead ones awaiting housekeeping included.
@@ -119,7 +128,8 @@ class ObserverContainer {
     // The observer the entry is indexed under: the delegate's at
     // registration, which a stopped delegate no longer names.
     O* observer;
-    // Among equal priorities, higher serials come first.
+    // Among equal priorities, higher serials come first; given only while
+    // the list keeps an index, which alone compares entries this way.
     std::uint64_t serial;
   };
   using Position = typename List<Wrapper>::iterator;
@@ -128,6 +138,8 @@ class ObserverContainer {
     explicit Index(size_t expected) : live(expected) {}
     ObserverIndex<O, Position> live;  // by Wrapper::observer
     std::map<unsigned int, Position> firstOfPriority;  // dead entries included
+    std::vector<Position> retired;  // during a broadcast, still linked
+    std::uint64_t nextSerial = 0;
   };
 
   static bool comesBefore(Wrapper const& left, Wrapper const& right) {
@@ -184,7 +196,8 @@ class ObserverContainer {
   }
 
   void link(Delegate* delegate, unsigned int priority, bool flag) {
-    Wrapper wrapper{RefPtr<Delegate>(delegate), priority, flag, 1, delegate->getObserver(), m_serial++};
+    Wrapper wrapper{RefPtr<Delegate>(delegate), priority, flag, 1, delegate->getObserver(),
+                    m_index ? m_index->nextSerial++ : 0};
     Position const position = m_entries.insert(insertionPoint(priority), std::move(wrapper));
     if (!m_index) {
       if (m_entries.size() > kIndexedFrom)
@@ -198,9 +211,15 @@ class ObserverContainer {
 
   void buildIndex() {
     m_index = std::make_unique<Index>(m_entries.size());
+    // Serials that fall along the list: newest first within a priority.
+    m_index->nextSerial = m_entries.size() + 1;
+    std::uint64_t serial = m_entries.size();
     for (Position position = m_entries.begin(); position != m_entries.end(); ++position) {
+      position->serial = serial--;
       m_index->firstOfPriority.emplace(position->priority, position);  // keeps the first of each
-      if (position->count > 0 && position->observer)
+      if (position->count <= 0)
+        m_index->retired.push_back(position);
+      else if (position->observer)
         m_index->live.add(position->observer, position);
     }
   }
@@ -213,13 +232,16 @@ class ObserverContainer {
     if (m_index && position->observer)
       m_index->live.remove(position->observer, position);
     if (m_busy) {
-      m_dead.push_back(position);
+      ++m_retired;
+      if (m_index)
+        m_index->retired.push_back(position);
       return;
     }
     unlink(position);
   }
 
-  void unlink(Position position) {
+  // Returns the position after the unlinked one.
+  Position unlink(Position position) {
     if (m_index) {
       auto const group = m_index->firstOfPriority.find(position->priority);
       if (group != m_index->firstOfPriority.end() && group->second == position) {
@@ -230,14 +252,14 @@ class ObserverContainer {
           m_index->firstOfPriority.erase(group);
       }
     }
-    m_entries.remove(position);
+    Position const next = m_entries.remove(position);
     if (m_entries.isEmpty())
       m_index.reset();
+    return next;
   }
 
   List<Wrapper> m_entries;
   unsigned int m_busy = 0;  // nesting depth of running broadcasts
-  std::uint64_t m_serial = 0;
-  std::vector<Position> m_dead;  // retired during a broadcast, still linked
+  unsigned int m_retired = 0;  // entries retired during a broadcast, still linked
   std::unique_ptr<Index> m_index;  // built past kIndexedFrom entries, dropped when empty
 };
