@@ -7,7 +7,9 @@
 // a ratio to one lookup of the same key in a std::unordered_map, the floor
 // any name table has to pay.
 #include <benchmark/benchmark.h>
+#include <malloc.h>
 
+#include <cstdio>
 #include <map>
 #include <memory>
 #include <string>
@@ -17,6 +19,11 @@
 #include "LS_CMasterLocationService.h"
 #include "LS_CredentialLookup.h"
 #include "LS_IAuthenticationConfig.h"
+#include "LS_ICallConfig.h"
+#include "LS_IMwiSubscriptionConfig.h"
+#include "LS_IOutboundConfig.h"
+#include "LS_IRegistrationInboundConfig.h"
+#include "LS_IRegistrationOutboundConfig.h"
 #include "LS_IIdentityConfig.h"
 #include "LS_ILocationServiceConfig.h"
 #include "LS_IdentityResolution.h"
@@ -196,6 +203,53 @@ BENCHMARK(BM_ResolveDefault)->Apply(sizes);
 BENCHMARK(BM_InboundChallenge)->Apply(sizes);
 BENCHMARK(BM_InboundResponse)->Apply(sizes);
 
+// Interface T of the group's face, created on first use.
+template <class T>
+RefPtr<T> faceOf(LS_IIdentityConfig* group, LS_IdentityFace::Type face) {
+  RefPtr<T> created;
+  adoptInterface(created, [&](UUID const& iid, void** raw) { return group->createConfigFaceIf(face, iid, raw); });
+  return created;
+}
+
+// The heap that one more identity takes when it inherits a group with all
+// seven faces and some twenty settings on them, as a gateway's subscribers
+// inherit their group.
+size_t bytesOfOneInheritingIdentity() {
+  Model model(0);
+  RefPtr<LS_IIdentityConfig> const group = model.identity("FULL", "", LS_IdentityType::IDENTITY_GROUP);
+  group->setConfigDisplayName("Group");
+  group->setConfigPhoneContext("example.com");
+  RefPtr<LS_IRegistrationOutboundConfig> const outbound =
+      faceOf<LS_IRegistrationOutboundConfig>(group.get(), LS_IdentityFace::REGISTRATION_OUTBOUND);
+  outbound->setConfigRegistrar(Model::hostPortOf("registrar.example.com"), CHostPort());
+  outbound->setConfigLifetime(600);
+  RefPtr<LS_IOutboundConfig> transport;
+  outbound->queryIf(transport);
+  transport->setConfigTrafficClass(46);
+  transport->setConfigPenaltyBox(true);
+  outbound->setConfigKeepAliveInterval(30);
+  RefPtr<LS_IRegistrationInboundConfig> const inbound =
+      faceOf<LS_IRegistrationInboundConfig>(group.get(), LS_IdentityFace::REGISTRATION_INBOUND);
+  inbound->setConfigLifetimeRange(60, 3600, 600);
+  RefPtr<LS_IMwiSubscriptionConfig> const mwi =
+      faceOf<LS_IMwiSubscriptionConfig>(group.get(), LS_IdentityFace::MESSAGE_SUBSCRIPTION);
+  mwi->setConfigMwiNotifier(Model::hostPortOf("mwi.example.com"), CHostPort());
+  mwi->setConfigLifetime(3600);
+  for (LS_IdentityFace::Type face : {LS_IdentityFace::CALL_OUTBOUND, LS_IdentityFace::CALL_INBOUND}) {
+    RefPtr<LS_ICallConfig> const call = faceOf<LS_ICallConfig>(group.get(), face);
+    call->setConfigVoipProfile("voip");
+    call->setConfigToneSetProfile("tones");
+    call->setConfigSipProfile("sip");
+  }
+  for (LS_IdentityFace::Type face : {LS_IdentityFace::AUTHENTICATION_OUTBOUND, LS_IdentityFace::AUTHENTICATION_INBOUND})
+    faceOf<LS_IAuthenticationConfig>(group.get(), face)->insertConfigAuthenticate(0, "http", "");
+
+  model.identity("warm-up", "FULL", LS_IdentityType::IDENTITY);
+  size_t const before = mallinfo2().uordblks;
+  RefPtr<LS_IIdentityConfig> const member = model.identity("member", "FULL", LS_IdentityType::IDENTITY);
+  return mallinfo2().uordblks - before;
+}
+
 }  // namespace
 
 int main(int argc, char** argv) {
@@ -209,6 +263,7 @@ int main(int argc, char** argv) {
   }
   RatioReporter reporter(ratios);
   benchmark::RunSpecifiedBenchmarks(&reporter);
+  std::printf("one identity inheriting a full group: %zu bytes\n", bytesOfOneInheritingIdentity());
   benchmark::Shutdown();
   return 0;
 }
