@@ -15,7 +15,9 @@ String effectiveUserName(LS_Authenticate const& entry, LS_IIdentity* identity) {
   return LockedPtr<LS_IIdentity>(identity)->getName();
 }
 
-bool containsPair(Vector<LS_ProtocolRealm> const& pairs, LS_AuthenticationProtocol::Type protocol, String const& realm) {
+bool containsPair(Vector<LS_ProtocolRealm> const& pairs,
+                  LS_AuthenticationProtocol::Type protocol,
+                  String const& realm) {
   for (LS_ProtocolRealm const& pair : pairs) {
     if (pair.protocol == protocol && pair.realm == realm)
       return true;
@@ -29,33 +31,30 @@ void appendFace(Vector<LS_Authenticate>& out, LS_IIdentity* identity, LS_Identit
     LS_getIdentityAuthenticates(out, authentication.get());
 }
 
-// The identity of nameAddr among names, or among all location services
-// when names is null.
-XCode resolveIdentity(String& error,
-                      RefPtr<LS_IIdentity>& identity,
-                      CNameAddr const& nameAddr,
-                      Vector<String> const* names,
-                      bool useDefault,
-                      Vector<CHostPort> const& localHostPorts,
-                      LS_Imperative::Type imperative,
-                      LS_IMasterLocationService* master) {
-  if (names)
-    return LS_getIdentity(error, identity, nameAddr, *names, useDefault, localHostPorts, imperative, master);
-  return LS_getIdentity(error, identity, nameAddr, useDefault, localHostPorts, imperative, master);
-}
+// How the name-addr forms find their identity: among names, or among all
+// location services when names is null.
+struct IdentityQuery {
+  Vector<String> const* names;
+  bool useDefault;
+  Vector<CHostPort> const& localHostPorts;
+  LS_Imperative::Type imperative;
+  LS_IMasterLocationService* master;
+
+  XCode resolve(String& error, RefPtr<LS_IIdentity>& identity, CNameAddr const& nameAddr) const {
+    if (names)
+      return LS_getIdentity(error, identity, nameAddr, *names, useDefault, localHostPorts, imperative,
+                            master);
+    return LS_getIdentity(error, identity, nameAddr, useDefault, localHostPorts, imperative, master);
+  }
+};
 
 XCode challengeForNameAddr(String& error,
                            Vector<LS_ProtocolRealm>& out,
                            CNameAddr const& nameAddr,
-                           Vector<String> const* names,
-                           bool useDefault,
-                           Vector<CHostPort> const& localHostPorts,
-                           LS_Imperative::Type imperative,
-                           LS_IMasterLocationService* master,
+                           IdentityQuery const& query,
                            LS_IMasterAuthenticationService* authenticationMaster) {
   RefPtr<LS_IIdentity> identity;
-  XCode const result =
-      resolveIdentity(error, identity, nameAddr, names, useDefault, localHostPorts, imperative, master);
+  XCode const result = query.resolve(error, identity, nameAddr);
   if (result.isFailure()) {
     out.clear();
     return result;
@@ -69,21 +68,16 @@ XCode responseForNameAddr(String& error,
                           LS_AuthenticationProtocol::Type protocol,
                           String const& realm,
                           String const& userName,
-                          Vector<String> const* names,
-                          bool useDefault,
-                          Vector<CHostPort> const& localHostPorts,
-                          LS_Imperative::Type imperative,
-                          LS_IMasterLocationService* master,
+                          IdentityQuery const& query,
                           LS_IMasterAuthenticationService* authenticationMaster) {
   RefPtr<LS_IIdentity> identity;
-  XCode const result =
-      resolveIdentity(error, identity, nameAddr, names, useDefault, localHostPorts, imperative, master);
+  XCode const result = query.resolve(error, identity, nameAddr);
   if (result.isFailure()) {
     passwords.clear();
     return result;
   }
-  return LS_getInboundAuthenticationResponse(error, passwords, identity.get(), nameAddr, protocol, realm, userName,
-                                             authenticationMaster);
+  return LS_getInboundAuthenticationResponse(error, passwords, identity.get(), nameAddr, protocol, realm,
+                                             userName, authenticationMaster);
 }
 
 XCode outboundForNameAddr(String& error,
@@ -92,22 +86,17 @@ XCode outboundForNameAddr(String& error,
                           CNameAddr const& nameAddr,
                           LS_AuthenticationProtocol::Type protocol,
                           String const& realm,
-                          Vector<String> const* names,
-                          bool useDefault,
-                          Vector<CHostPort> const& localHostPorts,
-                          LS_Imperative::Type imperative,
-                          LS_IMasterLocationService* master,
+                          IdentityQuery const& query,
                           LS_IMasterAuthenticationService* authenticationMaster) {
   RefPtr<LS_IIdentity> identity;
-  XCode const result =
-      resolveIdentity(error, identity, nameAddr, names, useDefault, localHostPorts, imperative, master);
+  XCode const result = query.resolve(error, identity, nameAddr);
   if (result.isFailure()) {
     userName = String();
     password = String();
     return result;
   }
-  return LS_getOutboundAuthenticationCredentials(error, userName, password, identity.get(), nameAddr, protocol, realm,
-                                                 authenticationMaster);
+  return LS_getOutboundAuthenticationCredentials(error, userName, password, identity.get(), nameAddr,
+                                                 protocol, realm, authenticationMaster);
 }
 
 }  // namespace
@@ -165,7 +154,9 @@ XCode LS_getIdentityAuthenticates(String& error,
   return XCode::success();
 }
 
-XCode LS_getIdentityOutboundAuthenticates(String& error, Vector<LS_Authenticate>& out, LS_IIdentity* identity) {
+XCode LS_getIdentityOutboundAuthenticates(String& error,
+                                          Vector<LS_Authenticate>& out,
+                                          LS_IIdentity* identity) {
   return LS_getIdentityAuthenticates(error, out, identity, LS_AuthenticationType::OUTBOUND);
 }
 
@@ -206,7 +197,7 @@ XCode LS_getInboundAuthenticationChallenge(String& error,
                                            LS_Imperative::Type imperative,
                                            LS_IMasterLocationService* master,
                                            LS_IMasterAuthenticationService* authenticationMaster) {
-  return challengeForNameAddr(error, out, nameAddr, nullptr, useDefault, localHostPorts, imperative, master,
+  return challengeForNameAddr(error, out, nameAddr, {nullptr, useDefault, localHostPorts, imperative, master},
                               authenticationMaster);
 }
 
@@ -219,7 +210,7 @@ XCode LS_getInboundAuthenticationChallenge(String& error,
                                            LS_Imperative::Type imperative,
                                            LS_IMasterLocationService* master,
                                            LS_IMasterAuthenticationService* authenticationMaster) {
-  return challengeForNameAddr(error, out, nameAddr, &names, useDefault, localHostPorts, imperative, master,
+  return challengeForNameAddr(error, out, nameAddr, {&names, useDefault, localHostPorts, imperative, master},
                               authenticationMaster);
 }
 
@@ -270,8 +261,8 @@ XCode LS_getInboundAuthenticationResponse(String& error,
                                           LS_Imperative::Type imperative,
                                           LS_IMasterLocationService* master,
                                           LS_IMasterAuthenticationService* authenticationMaster) {
-  return responseForNameAddr(error, passwords, nameAddr, protocol, realm, userName, nullptr, useDefault,
-                             localHostPorts, imperative, master, authenticationMaster);
+  return responseForNameAddr(error, passwords, nameAddr, protocol, realm, userName,
+                             {nullptr, useDefault, localHostPorts, imperative, master}, authenticationMaster);
 }
 
 XCode LS_getInboundAuthenticationResponse(String& error,
@@ -286,8 +277,8 @@ XCode LS_getInboundAuthenticationResponse(String& error,
                                           LS_Imperative::Type imperative,
                                           LS_IMasterLocationService* master,
                                           LS_IMasterAuthenticationService* authenticationMaster) {
-  return responseForNameAddr(error, passwords, nameAddr, protocol, realm, userName, &names, useDefault,
-                             localHostPorts, imperative, master, authenticationMaster);
+  return responseForNameAddr(error, passwords, nameAddr, protocol, realm, userName,
+                             {&names, useDefault, localHostPorts, imperative, master}, authenticationMaster);
 }
 
 XCode LS_getOutboundAuthenticationCredentials(String& error,
@@ -330,8 +321,8 @@ XCode LS_getOutboundAuthenticationCredentials(String& error,
   }
   if (result.isSuccess() && !found) {
     error.format("NO CREDENTIALS ON IDENTITY '%s' FOR PROTOCOL '%s', AND REALM '%s'",
-                 LockedPtr<LS_IIdentity>(identity)->getName().c_str(), LS_AuthenticationProtocol::NAME(protocol),
-                 realm.c_str());
+                 LockedPtr<LS_IIdentity>(identity)->getName().c_str(),
+                 LS_AuthenticationProtocol::NAME(protocol), realm.c_str());
     result = XCode::failure();
   }
   if (result.isFailure()) {
@@ -355,8 +346,8 @@ XCode LS_getOutboundAuthenticationCredentials(String& error,
                                               LS_Imperative::Type imperative,
                                               LS_IMasterLocationService* master,
                                               LS_IMasterAuthenticationService* authenticationMaster) {
-  return outboundForNameAddr(error, userName, password, nameAddr, protocol, realm, nullptr, useDefault,
-                             localHostPorts, imperative, master, authenticationMaster);
+  return outboundForNameAddr(error, userName, password, nameAddr, protocol, realm,
+                             {nullptr, useDefault, localHostPorts, imperative, master}, authenticationMaster);
 }
 
 XCode LS_getOutboundAuthenticationCredentials(String& error,
@@ -371,6 +362,6 @@ XCode LS_getOutboundAuthenticationCredentials(String& error,
                                               LS_Imperative::Type imperative,
                                               LS_IMasterLocationService* master,
                                               LS_IMasterAuthenticationService* authenticationMaster) {
-  return outboundForNameAddr(error, userName, password, nameAddr, protocol, realm, &names, useDefault,
-                             localHostPorts, imperative, master, authenticationMaster);
+  return outboundForNameAddr(error, userName, password, nameAddr, protocol, realm,
+                             {&names, useDefault, localHostPorts, imperative, master}, authenticationMaster);
 }
