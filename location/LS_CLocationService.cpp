@@ -64,6 +64,15 @@ String decimal(unsigned int value) {
   return String().format("%u", value);
 }
 
+// The identity's configuration interface; fails when the identity no
+// longer carries the name it is kept under.
+XCode configOfNamed(RefPtr<LS_IIdentity> const& identity, String const& name, RefPtr<LS_IIdentityConfig>& config) {
+  XCode const result = LockedPtr<LS_IIdentity>(identity)->queryIf(config);
+  if (result.isFailure())
+    return result;
+  return testExpression(LockedPtr<LS_IIdentityConfig>(config)->getConfigName() == name);
+}
+
 }  // namespace
 
 LS_CLocationService::LS_CLocationService() {
@@ -283,11 +292,9 @@ XCode LS_CLocationService::takeOverDynamicIdentity(String const& name,
   m_dynamicIdentities.remove(name);
   m_configuredIdentities.add(name, identity);
   RefPtr<LS_IIdentityConfig> config;
-  XCode const result = LockedPtr<LS_IIdentity>(identity)->queryIf(config);
+  XCode const result = configOfNamed(identity, name, config);
   if (result.isFailure())
     return result;
-  if (LockedPtr<LS_IIdentityConfig>(config)->getConfigName() != name)
-    return XCode::failure();
   LockedPtr<LS_IIdentityConfig>(config)->setConfigIdentityType(type);
   return inheritFrom(config.get(), baseName);
 }
@@ -300,11 +307,9 @@ XCode LS_CLocationService::checkConfiguredIdentity(String const& name,
                                                    RefPtr<LS_IIdentity>& identity) {
   identity = *m_configuredIdentities.get(name);
   RefPtr<LS_IIdentityConfig> config;
-  XCode const result = LockedPtr<LS_IIdentity>(identity)->queryIf(config);
+  XCode const result = configOfNamed(identity, name, config);
   if (result.isFailure())
     return result;
-  if (LockedPtr<LS_IIdentityConfig>(config)->getConfigName() != name)
-    return XCode::failure();
   if (LockedPtr<LS_IIdentityConfig>(config)->getConfigIdentityType() != type)
     return XCode::failure();
   return inheritFrom(config.get(), baseName);
