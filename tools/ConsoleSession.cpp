@@ -1,0 +1,111 @@
+#include "ConsoleSession.h"
+
+#include "DebugMonitor.h"
+#include "FaceNames.h"
+#include "ModelWatcher.h"
+#include "SystemRepository.h"
+
+namespace {
+
+// The debug monitor the library writes its lines to, at level 0.
+constexpr unsigned int kLibraryMonitor = 57;
+
+}  // namespace
+
+ConsoleSession::ConsoleSession()
+    : m_repository(adoptRef(new CDriverRepository)),
+      m_locationMaster(adoptRef(new LS_CMasterLocationService)),
+      m_authenticationMaster(adoptRef(new LS_CMasterAuthenticationService)),
+      m_watcher(std::make_unique<ModelWatcher>(*this)) {
+  // As the driver host starts a gateway: the lookups find the masters by
+  // their driver names in the system repository.
+  m_repository->registerDriver(m_locationMaster.get());
+  m_repository->registerDriver(m_authenticationMaster.get());
+  SYSTEM::SET_DRIVER_REPOSITORY(m_repository.get());
+}
+
+ConsoleSession::~ConsoleSession() {
+  showDebugLines(false);
+  m_watcher.reset();
+  SYSTEM::SET_DRIVER_REPOSITORY(nullptr);
+}
+
+std::string ConsoleSession::takeOutput() {
+  std::string const text = m_output.str();
+  m_output.str(std::string());
+  return text;
+}
+
+void ConsoleSession::showDebugLines(bool show) {
+  if (!show) {
+    DebugMonitor::disable(kLibraryMonitor);
+    return;
+  }
+  DebugMonitor::enable(kLibraryMonitor, 0, [this](char const* line) {
+    std::string text = line;
+    // A few formats end without a line break; each still gets a line here.
+    if (text.empty() || text.back() != '\n')
+      text += '\n';
+    m_output << "debug: " << text;
+  });
+}
+
+RefPtr<LS_ILocationServiceConfig> ConsoleSession::serviceConfig(Arguments const& arguments) const {
+  RefPtr<LS_ILocationServiceConfig> found;
+  if (LS_getLocationServiceIf(m_locationMaster.get(), arguments.text("service").c_str(), found).isFailure())
+    throw CommandError(arguments.column("service"), "no location service \"" + arguments.text("service") + "\"");
+  return found;
+}
+
+RefPtr<LS_ILocationService> ConsoleSession::service(Arguments const& arguments) const {
+  RefPtr<LS_ILocationService> found;
+  if (LS_getLocationServiceIf(m_locationMaster.get(), arguments.text("service").c_str(), found).isFailure())
+    throw CommandError(arguments.column("service"), "no location service \"" + arguments.text("service") + "\"");
+  return found;
+}
+
+RefPtr<LS_IIdentityConfig> ConsoleSession::identityConfig(Arguments const& arguments) const {
+  RefPtr<LS_IIdentityConfig> found;
+  if (LS_getConfigIdentityIf(serviceConfig(arguments).get(), arguments.text("identity").c_str(), found).isFailure())
+    throw CommandError(arguments.column("identity"), "no configured identity \"" + arguments.text("identity") +
+                                                         "\" in location service \"" + arguments.text("service") +
+                                                         "\"");
+  return found;
+}
+
+RefPtr<LS_IIdentity> ConsoleSession::identity(Arguments const& arguments) const {
+  RefPtr<LS_IIdentity> found;
+  if (LS_getIdentityIf(service(arguments).get(), arguments.text("identity").c_str(), found).isFailure())
+    throw CommandError(arguments.column("identity"), "no identity \"" + arguments.text("identity") +
+                                                         "\" in location service \"" + arguments.text("service") +
+                                                         "\"");
+  return found;
+}
+
+RefPtr<LS_IAuthenticationService> ConsoleSession::authenticationService(Arguments const& arguments) const {
+  RefPtr<LS_IAuthenticationService> found;
+  std::string const& name = arguments.text("authentication-service");
+  if (LS_getAuthenticationServiceIf(m_authenticationMaster.get(), name.c_str(), found).isFailure())
+    throw CommandError(arguments.column("authentication-service"), "no authentication service \"" + name + "\"");
+  return found;
+}
+
+RefPtr<IUnknown> ConsoleSession::ownFace(Arguments const& arguments) const {
+  RefPtr<LS_IIdentityConfig> const identity = identityConfig(arguments);
+  RefPtr<IUnknown> face;
+  LS_IdentityFace::Type const type = arguments.choice<LS_IdentityFace>("face");
+  if (adoptInterface(face, [&](UUID const& iid, void** raw) { return identity->getConfigFaceIf(type, iid, raw); })
+          .isFailure())
+    throw CommandError(arguments.column("face"), "identity \"" + arguments.text("identity") + "\" has no " +
+                                                     arguments.text("face") + " face of its own; create it with: " +
+                                                     "identity " + arguments.text("service") + " " +
+                                                     arguments.text("identity") + " face " +
+                                                     faceNames()[type] + " create");
+  return face;
+}
+
+std::string ConsoleSession::pathOf(LS_IIdentity const* identity) {
+  RefPtr<LS_ILocationService> service;
+  adoptInterface(service, [&](UUID const& iid, void** raw) { return identity->getLocationServiceIf(iid, raw); });
+  return (service ? service->getName().str() : std::string("?")) + "/" + identity->getName().str();
+}

@@ -1,0 +1,102 @@
+// location-console: configures the location-service library from a script
+// and answers the SIP stack's questions about it, without a gateway. It
+// plays the driver host (builds and registers both masters), the
+// configuration layer and the SIP stack, through the library's public
+// interfaces only.
+
+#include <unistd.h>
+
+#include <cstring>
+#include <fstream>
+#include <iostream>
+#include <sstream>
+#include <vector>
+
+#include "CommandTable.h"
+#include "ConfigCommands.h"
+#include "ConsoleSession.h"
+#include "DefaultSession.h"
+#include "ScriptRunner.h"
+#include "SessionCommands.h"
+#include "StackCommands.h"
+
+namespace {
+
+char const kUsage[] =
+    "usage: location-console [--debug] [--keep-going] [--print-default] [--help] [script ...]\n"
+    "\n"
+    "Runs each script in turn against one model; \"-\" reads standard input\n"
+    "(with a prompt when it is a terminal). Without a script it runs the\n"
+    "embedded default session: a small gateway, its dump, requests resolved\n"
+    "and explained, a challenge and a response.\n"
+    "\n"
+    "  --debug          show the library's debug lines for each command\n"
+    "  --keep-going     go on after a line that cannot be applied\n"
+    "  --print-default  print the default session's script and exit\n"
+    "  --help           print this and the command reference, and exit\n"
+    "\n"
+    "Exit status: 0, 1 when a line could not be applied, 2 for a usage error\n"
+    "or a script that cannot be read.\n";
+
+void buildTable(CommandTable& table) {
+  addConfigCommands(table);
+  addStackCommands(table);
+  addSessionCommands(table);
+  table.add("help [<topic>]", "the command reference, or the commands that begin with topic",
+            [&table](ConsoleSession& session, Arguments const& arguments) {
+              session.output() << table.reference(arguments.has("topic") ? arguments.text("topic") : "");
+            });
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+  bool debug = false;
+  bool keepGoing = false;
+  std::vector<std::string> scripts;
+  CommandTable table;
+  buildTable(table);
+  for (int i = 1; i < argc; ++i) {
+    std::string const argument = argv[i];
+    if (argument == "--debug") {
+      debug = true;
+    } else if (argument == "--keep-going") {
+      keepGoing = true;
+    } else if (argument == "--print-default") {
+      std::cout << defaultSession();
+      return 0;
+    } else if (argument == "--help") {
+      std::cout << kUsage << "\nCommands:\n" << table.reference("");
+      return 0;
+    } else if (argument.size() > 1 && argument[0] == '-') {
+      std::cerr << "location-console: unknown option " << argument << "\n" << kUsage;
+      return 2;
+    } else {
+      scripts.push_back(argument);
+    }
+  }
+
+  ConsoleSession session;
+  session.showDebugLines(debug);
+  ScriptRunner runner(session, table, std::cout, std::cerr);
+  runner.keepGoing(keepGoing);
+  if (scripts.empty()) {
+    std::istringstream script(defaultSession());
+    runner.run(script, "<default>", false);
+  }
+  for (std::string const& name : scripts) {
+    if (name == "-") {
+      if (!runner.run(std::cin, "<stdin>", isatty(STDIN_FILENO) != 0))
+        break;
+      continue;
+    }
+    std::ifstream file(name);
+    if (!file) {
+      std::cerr << "location-console: cannot read " << name << ": " << std::strerror(errno) << "\n";
+      return 2;
+    }
+    if (!runner.run(file, name, false))
+      break;
+  }
+  return runner.anyLineFailed() ? 1 : 0;
+}

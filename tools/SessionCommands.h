@@ -1,0 +1,8 @@
+// SessionCommands: the commands about the session rather than the model:
+// diagnostic dumps of any object, watching the model's events, showing the
+// debug monitor's lines, echoing a text, and the command reference.
+#pragma once
+
+class CommandTable;
+
+void addSessionCommands(CommandTable& table);
