@@ -50,18 +50,20 @@ void ConsoleSession::showDebugLines(bool show) {
   });
 }
 
-RefPtr<LS_ILocationServiceConfig> ConsoleSession::serviceConfig(Arguments const& arguments) const {
-  RefPtr<LS_ILocationServiceConfig> found;
+template <class T>
+RefPtr<T> ConsoleSession::serviceAs(Arguments const& arguments) const {
+  RefPtr<T> found;
   if (LS_getLocationServiceIf(m_locationMaster.get(), arguments.text("service").c_str(), found).isFailure())
     throw CommandError(arguments.column("service"), "no location service \"" + arguments.text("service") + "\"");
   return found;
 }
 
+RefPtr<LS_ILocationServiceConfig> ConsoleSession::serviceConfig(Arguments const& arguments) const {
+  return serviceAs<LS_ILocationServiceConfig>(arguments);
+}
+
 RefPtr<LS_ILocationService> ConsoleSession::service(Arguments const& arguments) const {
-  RefPtr<LS_ILocationService> found;
-  if (LS_getLocationServiceIf(m_locationMaster.get(), arguments.text("service").c_str(), found).isFailure())
-    throw CommandError(arguments.column("service"), "no location service \"" + arguments.text("service") + "\"");
-  return found;
+  return serviceAs<LS_ILocationService>(arguments);
 }
 
 RefPtr<LS_IIdentityConfig> ConsoleSession::identityConfig(Arguments const& arguments) const {

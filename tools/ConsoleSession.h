@@ -94,6 +94,8 @@ class ConsoleSession {
   static std::string pathOf(LS_IIdentity const* identity);
 
  private:
+  template <class T>
+  RefPtr<T> serviceAs(Arguments const& arguments) const;
 
   std::ostringstream m_output;
   RefPtr<CDriverRepository> m_repository;
