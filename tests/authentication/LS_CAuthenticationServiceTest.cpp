@@ -46,34 +46,24 @@ TEST_P(RealmEdits, KeepEachRealmOnceAndFollowTheIndexRules) {
   EXPECT_EQ(realmsOf(*service), GetParam().expected);
 }
 
-INSTANTIATE_TEST_SUITE_P(
-    Table,
-    RealmEdits,
-    ::testing::Values(
-        RealmEdit{"insert existing in front", [](LS_IAuthenticationService& s) { s.insertRealm(0, "r3"); },
-                  {"r3", "r1", "r2"}},
-        RealmEdit{"insert existing past the end", [](LS_IAuthenticationService& s) { s.insertRealm(3, "r1"); },
-                  {"r2", "r3", "r1"}},
-        RealmEdit{"insert existing after itself", [](LS_IAuthenticationService& s) { s.insertRealm(2, "r1"); },
-                  {"r2", "r1", "r3"}},
-        RealmEdit{"insert new in the middle", [](LS_IAuthenticationService& s) { s.insertRealm(1, "n"); },
-                  {"r1", "n", "r2", "r3"}},
-        RealmEdit{"modify onto an existing realm", [](LS_IAuthenticationService& s) { s.modifyRealm(0, "r3"); },
-                  {"r3", "r2"}},
-        RealmEdit{"modify past the end appends", [](LS_IAuthenticationService& s) { s.modifyRealm(7, "n"); },
-                  {"r1", "r2", "r3", "n"}},
-        RealmEdit{"modify after an earlier equal realm", [](LS_IAuthenticationService& s) { s.modifyRealm(2, "r1"); },
-                  {"r2", "r1"}},
-        RealmEdit{"move beyond the end", [](LS_IAuthenticationService& s) { s.moveRealm(0, 5); },
-                  {"r2", "r3", "r1"}},
-        RealmEdit{"move beyond the front", [](LS_IAuthenticationService& s) { s.moveRealm(1, -5); },
-                  {"r2", "r1", "r3"}},
-        RealmEdit{"move one place", [](LS_IAuthenticationService& s) { s.moveRealm(0, 1); }, {"r2", "r1", "r3"}},
-        RealmEdit{"move from past the end", [](LS_IAuthenticationService& s) { s.moveRealm(3, -1); },
-                  {"r1", "r2", "r3"}},
-        RealmEdit{"remove", [](LS_IAuthenticationService& s) { s.removeRealm("r2"); }, {"r1", "r3"}},
-        RealmEdit{"remove unknown", [](LS_IAuthenticationService& s) { s.removeRealm("R2"); },
-                  {"r1", "r2", "r3"}}));
+using S = LS_IAuthenticationService;
+
+// Moves beyond either end follow the list rule shared with the proxies and
+// pinned there; these rows keep the service's own rule: each realm once.
+std::vector<RealmEdit> const REALM_EDITS = {
+    {"insert existing in front", [](S& s) { s.insertRealm(0, "r3"); }, {"r3", "r1", "r2"}},
+    {"insert existing past the end", [](S& s) { s.insertRealm(3, "r1"); }, {"r2", "r3", "r1"}},
+    {"insert existing after itself", [](S& s) { s.insertRealm(2, "r1"); }, {"r2", "r1", "r3"}},
+    {"insert new in the middle", [](S& s) { s.insertRealm(1, "n"); }, {"r1", "n", "r2", "r3"}},
+    {"modify onto an existing realm", [](S& s) { s.modifyRealm(0, "r3"); }, {"r3", "r2"}},
+    {"modify past the end appends", [](S& s) { s.modifyRealm(7, "n"); }, {"r1", "r2", "r3", "n"}},
+    {"modify after an earlier equal realm", [](S& s) { s.modifyRealm(2, "r1"); }, {"r2", "r1"}},
+    {"move one place", [](S& s) { s.moveRealm(0, 1); }, {"r2", "r1", "r3"}},
+    {"remove", [](S& s) { s.removeRealm("r2"); }, {"r1", "r3"}},
+    {"remove unknown", [](S& s) { s.removeRealm("R2"); }, {"r1", "r2", "r3"}},
+};
+
+INSTANTIATE_TEST_SUITE_P(Table, RealmEdits, ::testing::ValuesIn(REALM_EDITS));
 
 struct Responsibility {
   LS_AuthenticationProtocol::Type protocol;
@@ -94,14 +84,16 @@ TEST_P(AuthenticationServiceResponsibility, FollowsProtocolThenRealms) {
   EXPECT_EQ(exact, GetParam().exact);
 }
 
+constexpr auto HTTP = LS_AuthenticationProtocol::HTTP;
+constexpr auto GPP = LS_AuthenticationProtocol::THREE_GPP;
+
 INSTANTIATE_TEST_SUITE_P(Table,
                          AuthenticationServiceResponsibility,
-                         ::testing::Values(Responsibility{LS_AuthenticationProtocol::HTTP, {}, "any", true, false},
-                                           Responsibility{LS_AuthenticationProtocol::THREE_GPP, {}, "any", false, false},
-                                           Responsibility{LS_AuthenticationProtocol::HTTP, {"a", "b"}, "b", true, true},
-                                           Responsibility{LS_AuthenticationProtocol::HTTP, {"a"}, "A", false, false},
-                                           Responsibility{LS_AuthenticationProtocol::THREE_GPP, {"a"}, "a", false,
-                                                          false}));
+                         ::testing::Values(Responsibility{HTTP, {}, "any", true, false},
+                                           Responsibility{GPP, {}, "any", false, false},
+                                           Responsibility{HTTP, {"a", "b"}, "b", true, true},
+                                           Responsibility{HTTP, {"a"}, "A", false, false},
+                                           Responsibility{GPP, {"a"}, "a", false, false}));
 
 TEST(AuthenticationService, SettingAUserAgainMovesItLastAndLogsThePassword) {
   LogCapture log;

@@ -51,7 +51,7 @@ class AuthenticationFaceTest : public ::testing::Test {
   RefPtr<LS_CAuthentication> face = adoptRef(new LS_CAuthentication);
 };
 
-TEST_F(AuthenticationFaceTest, RunTimeViewIsTheBaseEntriesFollowedByTheOwnOnes) {
+TEST_F(AuthenticationFaceTest, RunTimeViewIsTheBaseEntriesThenTheOwnOnesWhichClearEmptiesAndDestroyDrops) {
   unsigned int count = 7;
   EXPECT_TRUE(face->getNumberOfConfigAuthenticates(count).isFailure());
   EXPECT_EQ(count, 0u);
@@ -62,6 +62,17 @@ TEST_F(AuthenticationFaceTest, RunTimeViewIsTheBaseEntriesFollowedByTheOwnOnes) 
   base->insertConfigAuthenticate(99, "s3", "u3");
   EXPECT_EQ(runTime(*face), (Entries{"s1/u1", "s2/u2", "s3/u3", "own/me"})) << "follows the base live";
   EXPECT_EQ(configured(*face), Entries{"own/me"});
+
+  face->clearConfigAuthenticates();
+  count = 7;
+  EXPECT_TRUE(face->getNumberOfConfigAuthenticates(count).isSuccess()) << "clear keeps an empty own list";
+  EXPECT_EQ(count, 0u);
+  EXPECT_EQ(runTime(*face), (Entries{"s1/u1", "s2/u2", "s3/u3"}));
+  face->insertConfigAuthenticate(0, "own", "me");
+  face->destroyConfigAuthenticates();
+  EXPECT_TRUE(face->getNumberOfConfigAuthenticates(count).isFailure());
+  face->insertConfigAuthenticate(0, "again", "me");
+  EXPECT_EQ(runTime(*face), (Entries{"s1/u1", "s2/u2", "s3/u3", "again/me"}));
 }
 
 TEST_F(AuthenticationFaceTest, EditsFollowTheIndexRulesOfTheOwnList) {
@@ -84,22 +95,6 @@ TEST_F(AuthenticationFaceTest, EditsFollowTheIndexRulesOfTheOwnList) {
   face->removeConfigAuthenticate(0);
   EXPECT_EQ(configured(*face), (Entries{"c/3", "a/1"}));
   EXPECT_EQ(runTime(*face), (Entries{"s1/u1", "s2/u2", "c/3", "a/1"})) << "inherited entries untouched";
-}
-
-TEST_F(AuthenticationFaceTest, ClearKeepsAnEmptyOwnListWhileDestroyDropsIt) {
-  face->insertConfigAuthenticate(0, "own", "me");
-  face->clearConfigAuthenticates();
-  unsigned int count = 7;
-  EXPECT_TRUE(face->getNumberOfConfigAuthenticates(count).isSuccess());
-  EXPECT_EQ(count, 0u);
-  EXPECT_EQ(runTime(*face), (Entries{"s1/u1", "s2/u2"}));
-
-  face->insertConfigAuthenticate(0, "own", "me");
-  face->destroyConfigAuthenticates();
-  EXPECT_TRUE(face->getNumberOfConfigAuthenticates(count).isFailure());
-  EXPECT_EQ(runTime(*face), (Entries{"s1/u1", "s2/u2"}));
-  face->insertConfigAuthenticate(0, "again", "me");
-  EXPECT_EQ(runTime(*face), (Entries{"s1/u1", "s2/u2", "again/me"}));
 }
 
 TEST_F(AuthenticationFaceTest, EditsLogOnEntryWithTheirArguments) {
@@ -155,7 +150,7 @@ class AuthenticationFaceDumpTest : public AuthenticationFaceTest {
   RefPtr<CDriverRepository> repository = adoptRef(new CDriverRepository);
 };
 
-TEST_F(AuthenticationFaceDumpTest, MarksMissingServicesAndUsersWithTheDefaultFallback) {
+TEST_F(AuthenticationFaceDumpTest, MarksMissingServicesUsersAndTheDefaultFallbackAndAllWithoutARepository) {
   service("s1")->setCredentials("u1", "p");
   service("s2")->setCredentials("DEFAULT", "p");
   EXPECT_EQ(dump(), (DumpRows{
@@ -172,15 +167,11 @@ TEST_F(AuthenticationFaceDumpTest, MarksMissingServicesAndUsersWithTheDefaultFal
                         "2|Authentication-Service|s3 (DOES NOT EXIST)",
                         "2|User Name|u3 (DOES NOT EXIST)",
                     }));
-}
 
-TEST_F(AuthenticationFaceDumpTest, WithoutARepositoryEveryServiceIsMissing) {
-  service("s1")->setCredentials("u1", "p");
   SYSTEM::SET_DRIVER_REPOSITORY(nullptr);
   DumpRows const rows = dump();
-  ASSERT_GE(rows.size(), 4u);
-  EXPECT_EQ(rows[2], "2|Authentication-Service|s1 (DOES NOT EXIST)");
-  EXPECT_EQ(rows[3], "2|User Name|u1 (DOES NOT EXIST)");
+  EXPECT_EQ(DumpRows(rows.begin() + 2, rows.begin() + 4),
+            (DumpRows{"2|Authentication-Service|s1 (DOES NOT EXIST)", "2|User Name|u1 (DOES NOT EXIST)"}));
 }
 
 }  // namespace

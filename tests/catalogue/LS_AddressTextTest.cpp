@@ -42,23 +42,15 @@ INSTANTIATE_TEST_SUITE_P(Rows,
                                            AddressRow{"2001:db8::1", 5061, "[2001:db8::1]:5061"},
                                            AddressRow{"2001:db8::1", 0, "2001:db8::1"}));
 
-TEST(HostPortToString, ReplacesWhatTheOutputHeldAndReturnsIt) {
+TEST(AddressToString, ReplacesWhatTheOutputHeldAndReturnsIt) {
   String out("stale text");
   EXPECT_EQ(&LS_hostPortToString(CHostPort("example.com", 5060), out), &out);
   EXPECT_EQ(out, "example.com:5060");
-}
-
-TEST(NameAddrToString, ReplacesWhatTheOutputHeldAndReturnsIt) {
   CNameAddr nameAddr;
   ASSERT_TRUE(nameAddr.Parse("Alice <sip:alice@example.com>", 29));
-  String out("stale text");
   EXPECT_EQ(&LS_nameAddrToString(nameAddr, out), &out);
   EXPECT_EQ(out, "\"Alice\" <sip:alice@example.com>");
   EXPECT_EQ(LS_nameAddrToString(nameAddr), out);
-}
-
-TEST(NameAddrToString, GivesTheEmptyTextForANameAddrWithoutUri) {
-  String out("stale text");
   EXPECT_EQ(LS_nameAddrToString(CNameAddr(), out), "");
 }
 

@@ -8,7 +8,6 @@
 #include <gtest/gtest.h>
 
 #include <functional>
-#include <ostream>
 #include <string>
 #include <vector>
 
@@ -130,11 +129,6 @@ class FaceValueFamilies {
 #define FACE_VALUE_FAMILY(X, key, first, second, defaultText)                                       \
   add(#X, key, first, second, &Face::setConfig##X, &Face::getConfig##X, &Face::get##X, defaultText, \
       &Face::removeConfig##X)
-
-// Failure messages name the row instead of dumping its bytes.
-inline void PrintTo(FaceValueFamily const& family, std::ostream* out) {
-  *out << family.name;
-}
 
 template <class Row>
 std::string rowName(::testing::TestParamInfo<Row> const& info) {

@@ -44,8 +44,6 @@ TEST_F(MwiSubscriptionTest, RemovingTheNotifierDropsBothKeysAndShowsTheBasePairA
 
   face->removeConfigMwiNotifier();
 
-  EXPECT_FALSE(face->containsElement("mwi-notifier", LS_Strategy::LOCAL_ONLY));
-  EXPECT_FALSE(face->containsElement("mwi-notifier-tls", LS_Strategy::LOCAL_ONLY));
   EXPECT_EQ(pairText(*face, &Face::getConfigMwiNotifier), NONE);
   EXPECT_EQ(pairText(*face, &Face::getMwiNotifier), "m:5060 mt:5061");
 }
@@ -75,14 +73,6 @@ TEST_F(MwiSubscriptionTest, DumpShowsTheEffectiveSettingsAndDefaultsAfterThePref
                                       "2|Subscription Lifetime|900",
                                       "2|Subscription Mode|none",
                                   }));
-}
-
-TEST_F(MwiSubscriptionTest, NotifierWithoutPortsDumpsAsTheHostAloneWithoutTlsRow) {
-  face->setConfigMwiNotifier(CHostPort("m", NO_PORT), CHostPort("mt", NO_PORT));
-
-  DumpRows const rows = dumpOf(*face);
-  ASSERT_EQ(rows.size(), 6u);
-  EXPECT_EQ(rows[3], "2|Message-Server|m");
 }
 
 // Only the notifier is logged, the mode by its name, and removing the mode

@@ -25,7 +25,7 @@ TEST_F(LocationTest, IsResponsibleForItsNameAliasNamesByteRangesAndWholeExpressi
     EXPECT_FALSE(view->isResponsible(user)) << user;
 }
 
-TEST_F(LocationTest, ClearConfigAliasHidesTheInheritedAliasesAndDestroyConfigAliasShowsThemAgain) {
+TEST_F(LocationTest, AnOwnAliasRecordReplacesTheInheritedOneUntilDestroyed) {
   group("group")->addConfigAliasName("x");
   RefPtr<LS_IIdentityConfig> const alice = identity("alice", "group");
   RefPtr<LS_IIdentity> const view = runtime(alice);
@@ -34,25 +34,18 @@ TEST_F(LocationTest, ClearConfigAliasHidesTheInheritedAliasesAndDestroyConfigAli
   EXPECT_TRUE(alice->getNumberOfConfigAliasNames(count).isFailure());
   EXPECT_EQ(count, 0u);
 
-  alice->clearConfigAlias();
-  EXPECT_FALSE(view->isResponsible("x"));
-  EXPECT_EQ(view->getNumberOfAliasNames(), 0u);
-
-  alice->destroyConfigAlias();
-  EXPECT_TRUE(view->isResponsible("x"));
-}
-
-TEST_F(LocationTest, AnOwnAliasStartsAnEmptyRecordThatReplacesTheInheritedOne) {
-  group("group")->addConfigAliasName("x");
-  RefPtr<LS_IIdentityConfig> const alice = identity("alice", "group");
   alice->addConfigAliasName("y");
-
-  RefPtr<LS_IIdentity> const view = runtime(alice);
   EXPECT_TRUE(view->isResponsible("y"));
   EXPECT_FALSE(view->isResponsible("x"));
   String name = "stale";
   EXPECT_TRUE(view->getAliasName(1, name).isFailure());
   EXPECT_EQ(name, "");
+
+  alice->clearConfigAlias();
+  EXPECT_FALSE(view->isResponsible("y"));
+  EXPECT_EQ(view->getNumberOfAliasNames(), 0u);
+  alice->destroyConfigAlias();
+  EXPECT_TRUE(view->isResponsible("x"));
 }
 
 // One configuration edit: the log line it writes (class names as they are)
@@ -93,54 +86,37 @@ TEST_P(IdentityEditTest, LogsItsLineAndRaisesExactlyItsChildEvents) {
 
 Journal const CREATED = {"id:add:alias", "id:change:alias"};
 Journal const NONE;
+Journal only(char const* event) {
+  return {event};
+}
+using I = LS_IIdentityConfig;
 
-INSTANTIATE_TEST_SUITE_P(
-    Identity,
-    IdentityEditTest,
-    ::testing::Values(Edit{"AddAliasName", false, [](LS_IIdentityConfig& i) { i.addConfigAliasName("x"); },
-                           "LS_COutbound(%p)::addConfigAliasName(x)\n", CREATED},
-                      Edit{"AddPresentAliasName", true,
-                           [](LS_IIdentityConfig& i) { i.addConfigAliasName("x"); }, nullptr, NONE},
-                      Edit{"RemoveAliasNameWithoutRecord", false,
-                           [](LS_IIdentityConfig& i) { i.removeConfigAliasName("x"); },
-                           "LS_CIdentity(%p)::removeConfigAliasName(x)\n", NONE},
-                      Edit{"RemoveAliasRangeWithoutRecord", false,
-                           [](LS_IIdentityConfig& i) { i.removeConfigAliasRange("1", "2"); },
-                           "LS_COutbound(%p)::removeConfigAliasRange(1, 2)\n", CREATED},
-                      Edit{"AddExpressionThatDoesNotCompile", false,
-                           [](LS_IIdentityConfig& i) { i.addConfigAliasExpression("("); },
-                           "LS_COutbound(%p)::addConfigAliasExpression(()\n", CREATED},
-                      Edit{"RemoveExpressionWithoutRecord", false,
-                           [](LS_IIdentityConfig& i) { i.removeConfigAliasExpression("e"); },
-                           "LS_CIdentity(%p)::removeConfigAliasExpression(e)\n", NONE},
-                      Edit{"ClearAlias", false, [](LS_IIdentityConfig& i) { i.clearConfigAlias(); }, nullptr,
-                           CREATED},
-                      Edit{"DestroyAlias",
-                           true,
-                           [](LS_IIdentityConfig& i) { i.destroyConfigAlias(); },
-                           "LS_CIdentity(%p)::destroyConfigAlias()\n",
-                           {"id:remove:alias"}},
-                      Edit{"RemoveDisplayName",
-                           true,
-                           [](LS_IIdentityConfig& i) { i.removeConfigDisplayName(); },
-                           "LS_CIdentity(%p)::setConfigDisplayName()\n",
-                           {"id:remove:display-name"}},
-                      Edit{"SetPhoneContext",
-                           false,
-                           [](LS_IIdentityConfig& i) { i.setConfigPhoneContext("+49"); },
-                           "LS_CIdentity(%p)::setConfigPhoneContext(+49)\n",
-                           {"id:add:phone-context"}},
-                      Edit{"SetUserRepresentation",
-                           true,
-                           [](LS_IIdentityConfig& i) { i.setConfigUserRepresentation(LS_User::PHONE); },
-                           "LS_CIdentity(%p)::setConfigUserRepresentation(phone)\n",
-                           {"id:change:user-representation"}},
-                      Edit{"RemoveUserRepresentation",
-                           true,
-                           [](LS_IIdentityConfig& i) { i.removeConfigUserRepresentation(); },
-                           "LS_CIdentity(%p)::setConfigUserRepresentation()\n",
-                           {"id:remove:user-representation"}}),
-    [](::testing::TestParamInfo<Edit> const& info) { return std::string(info.param.name); });
+std::vector<Edit> const EDITS = {
+    {"AddAliasName", false, [](I& i) { i.addConfigAliasName("x"); },
+     "LS_COutbound(%p)::addConfigAliasName(x)\n", CREATED},
+    {"AddPresentAliasName", true, [](I& i) { i.addConfigAliasName("x"); }, nullptr, NONE},
+    {"RemoveAliasNameWithoutRecord", false, [](I& i) { i.removeConfigAliasName("x"); },
+     "LS_CIdentity(%p)::removeConfigAliasName(x)\n", NONE},
+    {"RemoveAliasRangeWithoutRecord", false, [](I& i) { i.removeConfigAliasRange("1", "2"); },
+     "LS_COutbound(%p)::removeConfigAliasRange(1, 2)\n", CREATED},
+    {"AddExpressionThatDoesNotCompile", false, [](I& i) { i.addConfigAliasExpression("("); },
+     "LS_COutbound(%p)::addConfigAliasExpression(()\n", CREATED},
+    {"RemoveExpressionWithoutRecord", false, [](I& i) { i.removeConfigAliasExpression("e"); },
+     "LS_CIdentity(%p)::removeConfigAliasExpression(e)\n", NONE},
+    {"ClearAlias", false, [](I& i) { i.clearConfigAlias(); }, nullptr, CREATED},
+    {"DestroyAlias", true, [](I& i) { i.destroyConfigAlias(); }, "LS_CIdentity(%p)::destroyConfigAlias()\n",
+     only("id:remove:alias")},
+    {"RemoveDisplayName", true, [](I& i) { i.removeConfigDisplayName(); },
+     "LS_CIdentity(%p)::setConfigDisplayName()\n", only("id:remove:display-name")},
+    {"SetPhoneContext", false, [](I& i) { i.setConfigPhoneContext("+49"); },
+     "LS_CIdentity(%p)::setConfigPhoneContext(+49)\n", only("id:add:phone-context")},
+    {"SetUserRepresentation", true, [](I& i) { i.setConfigUserRepresentation(LS_User::PHONE); },
+     "LS_CIdentity(%p)::setConfigUserRepresentation(phone)\n", only("id:change:user-representation")},
+    {"RemoveUserRepresentation", true, [](I& i) { i.removeConfigUserRepresentation(); },
+     "LS_CIdentity(%p)::setConfigUserRepresentation()\n", only("id:remove:user-representation")},
+};
+
+INSTANTIATE_TEST_SUITE_P(Identity, IdentityEditTest, ::testing::ValuesIn(EDITS), rowName<Edit>);
 
 template <class T>
 DumpRows dumpOf(T* object,
@@ -196,12 +172,7 @@ TEST_F(LocationTest, DumpShowsTheValuesInEffectThenEachFaceInEffectOneLevelDownW
   EXPECT_EQ(dumpOf(alice.get(), 9, 0, 0, "Dump "), expected);
   EXPECT_EQ(dumpOf(alice.get(), 2, 2, 0, ""), DumpRows{"2|Identity|alice"});
   EXPECT_TRUE(dumpOf(alice.get(), 9, 0, 6, "").empty());
-}
-
-TEST(IdentityDump, OfAnEmptyIdentityIsItsHeadingAlone) {
-  RefPtr<LS_CIdentity> const solo = adoptRef(new LS_CIdentity);
-  solo->setConfigName("solo");
-  EXPECT_EQ(dumpOf(solo.get(), 5, 0, 0, "P "), DumpRows{"0|P Identity|solo"});
+  EXPECT_EQ(dumpOf(identity("solo").get(), 5, 0, 0, "P "), DumpRows{"0|P Identity|solo"});
 }
 
 TEST(IdentityClass, IsMadeByTheContainerHelpersUnderItsClassIdentifier) {

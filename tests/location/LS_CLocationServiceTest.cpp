@@ -65,27 +65,25 @@ TEST_P(DomainEditTest, FollowsTheIndexRulesAndSendsTheThreeChangeNoticesInOrder)
 
 using Service = LS_ILocationServiceConfig;
 
-INSTANTIATE_TEST_SUITE_P(
-    LocationService,
-    DomainEditTest,
-    ::testing::Values(
-        DomainEdit{"InsertPresent", [](Service& s) { s.insertConfigDomain(0, host("c")); }, {"c", "a", "b"}},
-        DomainEdit{"InsertPastTheEnd",
-                   [](Service& s) { s.insertConfigDomain(7, host("a")); },
-                   {"b", "c", "a"}},
-        DomainEdit{"InsertWithPort",
-                   [](Service& s) { s.insertConfigDomain(1, host("a", 5060)); },
-                   {"a", "a:5060", "b", "c"}},
-        DomainEdit{"ModifyWithPresent", [](Service& s) { s.modifyConfigDomain(0, host("c")); }, {"c", "b"}},
-        DomainEdit{"ModifyWithPresentBefore",
-                   [](Service& s) { s.modifyConfigDomain(1, host("a")); },
-                   {"a", "c"}},
-        DomainEdit{"MovePastTheEnd", [](Service& s) { s.moveConfigDomain(0, 5); }, {"b", "c", "a"}},
-        DomainEdit{"MoveBackOne", [](Service& s) { s.moveConfigDomain(2, -1); }, {"a", "c", "b"}},
-        DomainEdit{"MovePastTheFront", [](Service& s) { s.moveConfigDomain(1, -5); }, {"b", "a", "c"}},
-        DomainEdit{"MoveFromPastTheEnd", [](Service& s) { s.moveConfigDomain(3, -1); }, {"a", "b", "c"}},
-        DomainEdit{"Remove", [](Service& s) { s.removeConfigDomain(host("b")); }, {"a", "c"}}),
-    [](::testing::TestParamInfo<DomainEdit> const& info) { return std::string(info.param.name); });
+std::vector<DomainEdit> const DOMAIN_EDITS = {
+    {"InsertPresent", [](Service& s) { s.insertConfigDomain(0, host("c")); }, {"c", "a", "b"}},
+    {"InsertPastTheEnd", [](Service& s) { s.insertConfigDomain(7, host("a")); }, {"b", "c", "a"}},
+    {"InsertWithPort",
+     [](Service& s) { s.insertConfigDomain(1, host("a", 5060)); },
+     {"a", "a:5060", "b", "c"}},
+    {"ModifyWithPresent", [](Service& s) { s.modifyConfigDomain(0, host("c")); }, {"c", "b"}},
+    {"ModifyWithPresentBefore", [](Service& s) { s.modifyConfigDomain(1, host("a")); }, {"a", "c"}},
+    {"MovePastTheEnd", [](Service& s) { s.moveConfigDomain(0, 5); }, {"b", "c", "a"}},
+    {"MoveBackOne", [](Service& s) { s.moveConfigDomain(2, -1); }, {"a", "c", "b"}},
+    {"MovePastTheFront", [](Service& s) { s.moveConfigDomain(1, -5); }, {"b", "a", "c"}},
+    {"MoveFromPastTheEnd", [](Service& s) { s.moveConfigDomain(3, -1); }, {"a", "b", "c"}},
+    {"Remove", [](Service& s) { s.removeConfigDomain(host("b")); }, {"a", "c"}},
+};
+
+INSTANTIATE_TEST_SUITE_P(LocationService,
+                         DomainEditTest,
+                         ::testing::ValuesIn(DOMAIN_EDITS),
+                         rowName<DomainEdit>);
 
 TEST_F(LocationServiceTest, OnlyImperativeAndDomainEditsNoticeAndOnlyConfiguredIdentitiesHearIt) {
   RefPtr<LS_IIdentity> const bob = dynamicIdentity("bob");
@@ -113,14 +111,18 @@ TEST_F(LocationServiceTest, OnlyImperativeAndDomainEditsNoticeAndOnlyConfiguredI
                    formatted("LS_CLocationService(%p)::notifyMwiSubscriptionChange()\n", address)}));
 }
 
+constexpr LS_Imperative::Type AUTHORITATIVE = LS_Imperative::AUTHORITATIVE;
+
+// Host "h" with port 5060 asked of a service with one domain and at most
+// one local host-port.
 struct Responsibility {
   char const* name;
-  LS_Imperative::Type own;
-  LS_Imperative::Type asked;
   CHostPort domain;
   CHostPort local;  // none when empty
   bool responsible;
   bool exact;
+  LS_Imperative::Type asked = AUTHORITATIVE;
+  LS_Imperative::Type own = AUTHORITATIVE;
 };
 
 class ResponsibilityTest : public LocationTest, public ::testing::WithParamInterface<Responsibility> {};
@@ -138,67 +140,41 @@ TEST_P(ResponsibilityTest, ForHostHWithPort5060) {
   EXPECT_EQ(exact, row.exact);
 }
 
-constexpr LS_Imperative::Type AUTHORITATIVE = LS_Imperative::AUTHORITATIVE;
+CHostPort const NO_LOCAL;
 
-INSTANTIATE_TEST_SUITE_P(
-    LocationService,
-    ResponsibilityTest,
-    ::testing::Values(
-        Responsibility{"EqualDomain", AUTHORITATIVE, AUTHORITATIVE, host("h", 5060), {}, true, true},
-        Responsibility{"DomainWithoutPort", AUTHORITATIVE, AUTHORITATIVE, host("h"), {}, true, false},
-        Responsibility{"DomainInOtherCaseWithoutPort",
-                       AUTHORITATIVE,
-                       AUTHORITATIVE,
-                       host("H"),
-                       {},
-                       true,
-                       false},
-        Responsibility{"DomainWithOtherPort",
-                       AUTHORITATIVE,
-                       AUTHORITATIVE,
-                       host("h", 5070),
-                       {},
-                       false,
-                       false},
-        Responsibility{"OtherHostWithoutPort", AUTHORITATIVE, AUTHORITATIVE, host("g"), {}, false, false},
-        Responsibility{"PartialDomainThenEqualLocal", AUTHORITATIVE, AUTHORITATIVE, host("h"),
-                       host("h", 5060), true, true},
-        Responsibility{"LocalWithoutPort", AUTHORITATIVE, AUTHORITATIVE, host("g"), host("h"), true, false},
-        Responsibility{"BackupAskedForAuthoritative",
-                       LS_Imperative::BACKUP,
-                       AUTHORITATIVE,
-                       host("h", 5060),
-                       {},
-                       false,
-                       false},
-        Responsibility{"AuthoritativeAskedForForeign",
-                       AUTHORITATIVE,
-                       LS_Imperative::FOREIGN,
-                       host("h", 5060),
-                       {},
-                       true,
-                       true}),
-    [](::testing::TestParamInfo<Responsibility> const& info) { return std::string(info.param.name); });
+std::vector<Responsibility> const RESPONSIBILITIES = {
+    {"EqualDomain", host("h", 5060), NO_LOCAL, true, true},
+    {"DomainWithoutPort", host("h"), NO_LOCAL, true, false},
+    {"DomainInOtherCaseWithoutPort", host("H"), NO_LOCAL, true, false},
+    {"DomainWithOtherPort", host("h", 5070), NO_LOCAL, false, false},
+    {"OtherHostWithoutPort", host("g"), NO_LOCAL, false, false},
+    {"PartialDomainThenEqualLocal", host("h"), host("h", 5060), true, true},
+    {"LocalWithoutPort", host("g"), host("h"), true, false},
+    {"BackupAskedForAuthoritative", host("h", 5060), NO_LOCAL, false, false, AUTHORITATIVE,
+     LS_Imperative::BACKUP},
+    {"AuthoritativeAskedForForeign", host("h", 5060), NO_LOCAL, true, true, LS_Imperative::FOREIGN},
+};
 
-TEST_F(LocationTest, AConfiguredIdentityTakesOverTheDynamicOneOfItsNameWithItsBase) {
+INSTANTIATE_TEST_SUITE_P(LocationService,
+                         ResponsibilityTest,
+                         ::testing::ValuesIn(RESPONSIBILITIES),
+                         rowName<Responsibility>);
+
+TEST_F(LocationTest, AConfiguredIdentityTakesOverTheDynamicOneOfItsNameWithItsBaseOfDefaultIfAny) {
   IdentityRecorder recorder(journal);
   auto const subject = handedOut<LS_ILocationServiceSubject>(
       [&](UUID const& iid, void** out) { return service->queryInterface(iid, out); });
   subject->addLocationServiceObserver(&recorder, 0);
+  EXPECT_EQ(baseNameOf(dynamicIdentity("bob").get()), "<none>");
   group("DEFAULT");
   RefPtr<LS_IIdentity> const alice = dynamicIdentity("alice");
   dynamicIdentity("zed");
 
   EXPECT_EQ(runtime(identity("alice")), alice);
   EXPECT_EQ(baseNameOf(alice.get()), "DEFAULT");
-  EXPECT_EQ(identityNames(true), (Texts{"DEFAULT", "alice", "zed"}));
-  EXPECT_EQ(journal, (Journal{"added:DEFAULT", "added:alice", "added:zed"}));
+  EXPECT_EQ(identityNames(true), (Texts{"DEFAULT", "alice", "bob", "zed"}));
+  EXPECT_EQ(journal, (Journal{"added:bob", "added:DEFAULT", "added:alice", "added:zed"}));
   subject->removeLocationServiceObserver(&recorder);
-}
-
-TEST_F(LocationTest, ADynamicIdentityGetsNoBaseWithoutDefault) {
-  EXPECT_EQ(baseNameOf(dynamicIdentity("bob").get()), "<none>");
-  EXPECT_EQ(dynamicIdentity("alice"), runtime(identity("alice")));
 }
 
 TEST_F(LocationTest, AGroupIsNeitherHandedOutAsDynamicIdentityNorRecreatedAsAnIdentity) {
@@ -254,14 +230,11 @@ DumpRows dumpOf(LS_ILocationServiceConfig* service, char const* prefix) {
   return dumpRows(dumped->getInfo(info, 9, 0, 9, 0, prefix));
 }
 
-TEST_F(LocationTest, DumpOfAnEmptyServiceShowsNoDomainsAndNoGroups) {
+TEST_F(LocationTest, DumpCountsIdentitiesByTheirDirectBaseLeavingGroupsAndDynamicOnesOut) {
   EXPECT_EQ(dumpOf(service.get(), "P "),
             (DumpRows{"0|P Location-Service|example", "1|Imperative|authoritative", "1|Match any domain|no",
                       "1|Domains|(none)", "1|Identities|", "2|Number of inherited identities|0",
                       "2|Number of no-inherited identities|0"}));
-}
-
-TEST_F(LocationTest, DumpCountsIdentitiesByTheirDirectBaseLeavingGroupsAndDynamicOnesOut) {
   service->setConfigImperative(LS_Imperative::BACKUP);
   service->setConfigDefaultDomain(true);
   service->insertConfigDomain(0, host("a"));

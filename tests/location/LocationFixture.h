@@ -17,6 +17,12 @@
 
 using Texts = std::vector<std::string>;
 
+// A parameterised row is named by its name field.
+template <class Row>
+std::string rowName(::testing::TestParamInfo<Row> const& info) {
+  return info.param.name;
+}
+
 inline Texts textsOf(Vector<String> const& names) {
   Texts texts;
   for (String const& name : names)

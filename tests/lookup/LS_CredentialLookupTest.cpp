@@ -30,6 +30,7 @@ class CredentialLookupTest : public LookupTest {
     tmpl = identity("ls", "tmpl", LS_IdentityType::IDENTITY_GROUP);
     identity("ls", "alice", LS_IdentityType::IDENTITY, "tmpl")->addConfigAliasName("al");
     LS_getIdentityIf(runtimeService("ls").get(), "alice", alice);
+    asked = alice.get();
 
     RefPtr<LS_IAuthenticationService> const httpA = authenticationService("httpA", HTTP, {"r1", "r2"});
     httpA->setCredentials("alice", "pa");
@@ -51,62 +52,57 @@ class CredentialLookupTest : public LookupTest {
   }
   enum class Form { IDENTITY, ALL_SERVICES, NAMES };
 
-  // Each question in one of its forms: the identity form asks identity,
-  // the name-addr forms resolve address over all services or over among.
-  XCode challenge(Form form,
-                  Vector<LS_ProtocolRealm>& out,
-                  LS_IIdentity* identity,
-                  CNameAddr const& address,
-                  Vector<String> const& among) {
+  // Each question in one of its forms: the identity form asks asked, the
+  // name-addr forms resolve address over all services or over among.
+  XCode challenge(Form form, Vector<LS_ProtocolRealm>& out) {
     if (form == Form::IDENTITY)
-      return LS_getInboundAuthenticationChallenge(error, out, identity, authenticationMaster.get());
+      return LS_getInboundAuthenticationChallenge(error, out, asked, authenticationMaster.get());
     if (form == Form::NAMES)
-      return LS_getInboundAuthenticationChallenge(error, out, address, among, false, local, AUTHORITATIVE,
+      return LS_getInboundAuthenticationChallenge(error, out, address, among, useDefault, local, AUTHORITATIVE,
                                                   locationMaster.get(), authenticationMaster.get());
-    return LS_getInboundAuthenticationChallenge(error, out, address, false, local, AUTHORITATIVE,
+    return LS_getInboundAuthenticationChallenge(error, out, address, useDefault, local, AUTHORITATIVE,
                                                 locationMaster.get(), authenticationMaster.get());
   }
   XCode response(Form form,
                  Vector<String>& passwords,
-                 LS_IIdentity* identity,
-                 CNameAddr const& address,
-                 Vector<String> const& among,
                  LS_AuthenticationProtocol::Type protocol,
                  char const* realm,
                  char const* claimed) {
     if (form == Form::IDENTITY)
-      return LS_getInboundAuthenticationResponse(error, passwords, identity, address, protocol, realm, claimed,
+      return LS_getInboundAuthenticationResponse(error, passwords, asked, address, protocol, realm, claimed,
                                                  authenticationMaster.get());
     if (form == Form::NAMES)
-      return LS_getInboundAuthenticationResponse(error, passwords, address, protocol, realm, claimed, among, false,
-                                                 local, AUTHORITATIVE, locationMaster.get(),
+      return LS_getInboundAuthenticationResponse(error, passwords, address, protocol, realm, claimed, among,
+                                                 useDefault, local, AUTHORITATIVE, locationMaster.get(),
                                                  authenticationMaster.get());
-    return LS_getInboundAuthenticationResponse(error, passwords, address, protocol, realm, claimed, false, local,
-                                               AUTHORITATIVE, locationMaster.get(), authenticationMaster.get());
+    return LS_getInboundAuthenticationResponse(error, passwords, address, protocol, realm, claimed, useDefault,
+                                               local, AUTHORITATIVE, locationMaster.get(),
+                                               authenticationMaster.get());
   }
   XCode outbound(Form form,
                  String& userName,
                  String& password,
-                 LS_IIdentity* identity,
-                 CNameAddr const& address,
-                 Vector<String> const& among,
                  LS_AuthenticationProtocol::Type protocol,
                  char const* realm) {
     if (form == Form::IDENTITY)
-      return LS_getOutboundAuthenticationCredentials(error, userName, password, identity, address, protocol, realm,
+      return LS_getOutboundAuthenticationCredentials(error, userName, password, asked, address, protocol, realm,
                                                      authenticationMaster.get());
     if (form == Form::NAMES)
       return LS_getOutboundAuthenticationCredentials(error, userName, password, address, protocol, realm, among,
-                                                     false, local, AUTHORITATIVE, locationMaster.get(),
+                                                     useDefault, local, AUTHORITATIVE, locationMaster.get(),
                                                      authenticationMaster.get());
-    return LS_getOutboundAuthenticationCredentials(error, userName, password, address, protocol, realm, false, local,
-                                                   AUTHORITATIVE, locationMaster.get(), authenticationMaster.get());
+    return LS_getOutboundAuthenticationCredentials(error, userName, password, address, protocol, realm,
+                                                   useDefault, local, AUTHORITATIVE, locationMaster.get(),
+                                                   authenticationMaster.get());
   }
 
   RefPtr<LS_IIdentityConfig> tmpl;
   RefPtr<LS_IIdentity> alice;
-  CNameAddr const request = nameAddr("sip:al@example.com");
-  Vector<String> const names = namesOf({"gone", "ls"});
+  // What the questions ask about, unless a test says otherwise.
+  LS_IIdentity* asked = nullptr;
+  CNameAddr address = nameAddr("sip:al@example.com");
+  Vector<String> among = namesOf({"gone", "ls"});
+  bool useDefault = false;
   Vector<CHostPort> const local = hostPortsOf({"gw"});
 };
 
@@ -184,7 +180,7 @@ TEST_F(CredentialLookupTest, ChallengeListsEachProtocolRealmPairOnce) {
       error = "untouched";
       Vector<LS_ProtocolRealm> out;
       out.add(LS_ProtocolRealm{HTTP, "stale"});
-      XCode const result = challenge(form, out, alice.get(), request, names);
+      XCode const result = challenge(form, out);
       EXPECT_TRUE(result.isSuccess());
       std::string text;
       for (LS_ProtocolRealm const& pair : out)
@@ -223,7 +219,7 @@ TEST_F(CredentialLookupTest, ResponseChecksAgainstResponsibleCredentialsOfTheCla
     std::string const answer = sameForEveryForm([&](Form form) {
       Vector<String> passwords;
       passwords.add("stale");
-      XCode const result = response(form, passwords, alice.get(), request, names, c.protocol, c.realm, c.claimed);
+      XCode const result = response(form, passwords, c.protocol, c.realm, c.claimed);
       EXPECT_TRUE(result.isSuccess());
       std::string text;
       for (String const& password : passwords)
@@ -260,7 +256,7 @@ TEST_F(CredentialLookupTest, OutboundTakesTheFirstAnswerUnlessALaterOneListsTheR
     std::string const answer = sameForEveryForm([&](Form form) {
       String userName("stale");
       String password("stale");
-      XCode const result = outbound(form, userName, password, alice.get(), request, names, c.protocol, c.realm);
+      XCode const result = outbound(form, userName, password, c.protocol, c.realm);
       if (result.isSuccess())
         return userName.str() + ":" + password.str();
       EXPECT_EQ(userName.str() + password.str(), "");
@@ -274,26 +270,19 @@ TEST_F(CredentialLookupTest, DefaultGroupAuthenticatesWithTheDefaultCredentialsF
   RefPtr<LS_IIdentityConfig> const group = identity("ls", "DEFAULT", LS_IdentityType::IDENTITY_GROUP);
   setEntries(group.get(), INBOUND, {{"httpA", ""}});
   setEntries(group.get(), OUTBOUND, {{"httpA", ""}});
-  CNameAddr const stranger = nameAddr("sip:zed@example.com");
-  auto const imperative = LS_Imperative::AUTHORITATIVE;
+  address = nameAddr("sip:zed@example.com");
+  useDefault = true;
 
   Vector<LS_ProtocolRealm> realms;
-  ASSERT_TRUE(LS_getInboundAuthenticationChallenge(error, realms, stranger, true, local, imperative,
-                                                   locationMaster.get(), authenticationMaster.get())
-                  .isSuccess());
+  ASSERT_TRUE(challenge(Form::ALL_SERVICES, realms).isSuccess());
   EXPECT_EQ(realms.size(), 2u);
   Vector<String> passwords;
-  ASSERT_TRUE(LS_getInboundAuthenticationResponse(error, passwords, stranger, HTTP, "r1", "zed", true, local,
-                                                  imperative, locationMaster.get(), authenticationMaster.get())
-                  .isSuccess());
+  ASSERT_TRUE(response(Form::ALL_SERVICES, passwords, HTTP, "r1", "zed").isSuccess());
   EXPECT_EQ(passwords, namesOf({"pd"}));
   String userName;
   String password;
-  ASSERT_TRUE(LS_getOutboundAuthenticationCredentials(error, userName, password, stranger, HTTP, "r1", true, local,
-                                                      imperative, locationMaster.get(), authenticationMaster.get())
-                  .isSuccess());
-  EXPECT_EQ(userName, "zed");
-  EXPECT_EQ(password, "pd");
+  ASSERT_TRUE(outbound(Form::ALL_SERVICES, userName, password, HTTP, "r1").isSuccess());
+  EXPECT_EQ(userName.str() + ":" + password.str(), "zed:pd");
   EXPECT_EQ(error, "untouched");
 }
 
@@ -312,32 +301,32 @@ TEST_F(CredentialLookupTest, EveryQuestionEmptiesItsOutputsOnFailure) {
       {"no identity for the user", false, "sip:zed@example.com", "untouched"},
       {"unknown scheme", false, "<mailto:al@example.com>", "CANNOT PROCESS UNKNOWN URI; MUST BE A SIP, SIPS OR TEL URI"},
   };
-  Vector<String> const onlyLs = namesOf({"ls"});
+  among = namesOf({"ls"});
   for (FailureCase const& c : cases) {
     for (Form form : {Form::IDENTITY, Form::ALL_SERVICES, Form::NAMES}) {
       if ((form == Form::IDENTITY) != c.nullIdentity)
         continue;
       SCOPED_TRACE(std::string(c.what) + " form " + std::to_string(int(form)));
-      CNameAddr const address = nameAddr(c.nameAddr);
-      LS_IIdentity* const identity = c.nullIdentity ? nullptr : alice.get();
+      address = nameAddr(c.nameAddr);
+      asked = c.nullIdentity ? nullptr : alice.get();
 
       error = "untouched";
       Vector<LS_ProtocolRealm> realms;
       realms.add(LS_ProtocolRealm{HTTP, "stale"});
-      EXPECT_TRUE(challenge(form, realms, identity, address, onlyLs).isFailure() && realms.isEmpty());
+      EXPECT_TRUE(challenge(form, realms).isFailure() && realms.isEmpty());
       EXPECT_EQ(error.str(), c.error);
 
       error = "untouched";
       Vector<String> passwords;
       passwords.add("stale");
-      EXPECT_TRUE(response(form, passwords, identity, address, onlyLs, HTTP, "r1", "al").isFailure() &&
+      EXPECT_TRUE(response(form, passwords, HTTP, "r1", "al").isFailure() &&
                   passwords.isEmpty());
       EXPECT_EQ(error.str(), c.error);
 
       error = "untouched";
       String userName("stale");
       String password("stale");
-      EXPECT_TRUE(outbound(form, userName, password, identity, address, onlyLs, HTTP, "r1").isFailure() &&
+      EXPECT_TRUE(outbound(form, userName, password, HTTP, "r1").isFailure() &&
                   userName.isEmpty() && password.isEmpty());
       EXPECT_EQ(error.str(), c.error);
     }

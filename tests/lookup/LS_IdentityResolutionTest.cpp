@@ -95,14 +95,19 @@ class IdentityResolutionTest : public LookupTest {
   }
 };
 
+Vector<String> const ALL = namesOf({"alpha", "beta", "exact", "defA", "defB", "own", "backup"});
+Vector<CHostPort> const GW = hostPortsOf({"gw:5060"});
+Vector<String> const BETA = namesOf({"beta"});
+constexpr bool USE_DEFAULT = true;
+
 struct IdentityCase {
   char const* what;
   char const* nameAddr;
   Vector<String> names;
-  bool useDefault;
-  Vector<CHostPort> localHostPorts;
   char const* expected;  // "service/identity", or "-" for failure
-  char const* error;
+  bool useDefault = false;
+  Vector<CHostPort> localHostPorts = GW;
+  char const* error = "untouched";
 };
 
 void PrintTo(IdentityCase const& c, std::ostream* os) {
@@ -116,67 +121,51 @@ TEST_P(IdentityResolution, FindsTheIdentityThroughTheThreePasses) {
   // A failed lookup must leave what the caller held.
   RefPtr<LS_IIdentity> found;
   LS_getIdentityIf(runtimeService("own").get(), "dave", found);
-  std::string const before = whereIs(found);
   XCode const result = LS_getIdentity(error, found, nameAddr(c.nameAddr), c.names, c.useDefault, c.localHostPorts,
                                       LS_Imperative::AUTHORITATIVE, locationMaster.get());
   EXPECT_EQ(result.isSuccess() ? whereIs(found) : "-", c.expected);
   if (result.isFailure()) {
-    EXPECT_EQ(whereIs(found), before);
+    EXPECT_EQ(whereIs(found), "own/dave");
   }
   EXPECT_EQ(error.str(), c.error);
 }
-
-Vector<String> const ALL = namesOf({"alpha", "beta", "exact", "defA", "defB", "own", "backup"});
-Vector<CHostPort> const GW = hostPortsOf({"gw:5060"});
 
 INSTANTIATE_TEST_SUITE_P(
     Table,
     IdentityResolution,
     ::testing::Values(
-        IdentityCase{"direct", "sip:bob@exact.org:5060", ALL, false, GW, "exact/bob", "untouched"},
-        IdentityCase{"last partial wins", "sip:alice@example.com:5070", namesOf({"alpha", "beta"}), false, GW,
-                     "beta/alice", "untouched"},
-        IdentityCase{"exact beats partial", "sip:bob@example.com:5060", namesOf({"alpha", "exact", "beta"}), false,
-                     GW, "exact/bob", "untouched"},
-        IdentityCase{"alias name", "sip:al@example.com:5070", namesOf({"beta"}), false, GW, "beta/alice",
-                     "untouched"},
-        IdentityCase{"alias range", "sip:150@example.com:5070", namesOf({"beta"}), false, GW, "beta/alice",
-                     "untouched"},
-        IdentityCase{"alias expression", "sip:9123@example.com:5070", namesOf({"beta"}), false, GW, "beta/alice",
-                     "untouched"},
-        IdentityCase{"inherited alias", "sip:inh@exact.org:5060", ALL, false, GW, "exact/derived", "untouched"},
-        IdentityCase{"group name is no user", "sip:grp@example.com:5070", namesOf({"beta"}), true, GW, "-",
-                     "untouched"},
-        IdentityCase{"group alias is no user", "sip:g@example.com:5070", namesOf({"beta"}), false, GW, "-",
-                     "untouched"},
-        IdentityCase{"DEFAULT of type identity unused", "sip:nobody@example.com:5070", namesOf({"beta"}), true, GW,
-                     "-", "untouched"},
-        IdentityCase{"DEFAULT group", "sip:nobody@example.com:5070", namesOf({"alpha"}), true, GW, "alpha/DEFAULT",
-                     "untouched"},
-        IdentityCase{"DEFAULT group only when asked", "sip:nobody@example.com:5070", namesOf({"alpha"}), false, GW,
-                     "-", "untouched"},
-        IdentityCase{"responsible service decides alone", "sip:carol@example.com", namesOf({"alpha", "defB"}),
-                     false, hostPortsOf({"example.com"}), "-", "untouched"},
-        IdentityCase{"every default-domain service", "sip:carol@nowhere.net", ALL, false, GW, "defB/carol",
-                     "untouched"},
-        IdentityCase{"DEFAULT group of a default-domain service", "sip:zed@nowhere.net", ALL, true, GW,
-                     "defB/DEFAULT", "untouched"},
-        IdentityCase{"own host, other port, other case", "sip:dave@GW:7", ALL, false, GW, "own/dave", "untouched"},
-        IdentityCase{"own host without the user", "sip:nobody@gw", ALL, false, GW, "-", "untouched"},
-        IdentityCase{"own host only for local hosts", "sip:dave@nowhere.net", ALL, false, GW, "-", "untouched"},
-        IdentityCase{"backup invisible to authoritative", "sip:eve@backup.org", ALL, false, GW, "-", "untouched"},
+        IdentityCase{"direct", "sip:bob@exact.org:5060", ALL, "exact/bob"},
+        IdentityCase{"last partial wins", "sip:alice@example.com:5070", namesOf({"alpha", "beta"}), "beta/alice"},
+        IdentityCase{"exact beats partial", "sip:bob@example.com:5060", namesOf({"alpha", "exact", "beta"}),
+                     "exact/bob"},
+        IdentityCase{"alias name", "sip:al@example.com:5070", BETA, "beta/alice"},
+        IdentityCase{"alias range", "sip:150@example.com:5070", BETA, "beta/alice"},
+        IdentityCase{"alias expression", "sip:9123@example.com:5070", BETA, "beta/alice"},
+        IdentityCase{"inherited alias", "sip:inh@exact.org:5060", ALL, "exact/derived"},
+        IdentityCase{"group name is no user", "sip:grp@example.com:5070", BETA, "-", USE_DEFAULT},
+        IdentityCase{"group alias is no user", "sip:g@example.com:5070", BETA, "-"},
+        IdentityCase{"DEFAULT of type identity unused", "sip:nobody@example.com:5070", BETA, "-", USE_DEFAULT},
+        IdentityCase{"DEFAULT group", "sip:nobody@example.com:5070", namesOf({"alpha"}), "alpha/DEFAULT",
+                     USE_DEFAULT},
+        IdentityCase{"DEFAULT group only when asked", "sip:nobody@example.com:5070", namesOf({"alpha"}), "-"},
+        IdentityCase{"responsible service decides alone", "sip:carol@example.com", namesOf({"alpha", "defB"}), "-",
+                     false, hostPortsOf({"example.com"})},
+        IdentityCase{"every default-domain service", "sip:carol@nowhere.net", ALL, "defB/carol"},
+        IdentityCase{"DEFAULT group of a default-domain service", "sip:zed@nowhere.net", ALL, "defB/DEFAULT",
+                     USE_DEFAULT},
+        IdentityCase{"own host, other port, other case", "sip:dave@GW:7", ALL, "own/dave"},
+        IdentityCase{"own host without the user", "sip:nobody@gw", ALL, "-"},
+        IdentityCase{"own host only for local hosts", "sip:dave@nowhere.net", ALL, "-"},
+        IdentityCase{"backup invisible to authoritative", "sip:eve@backup.org", ALL, "-"},
         IdentityCase{"local-host in any case is the first local host-port", "sip:bob@Local-Host",
-                     namesOf({"alpha", "exact"}), false, hostPortsOf({"example.com:5060", "gw"}), "exact/bob",
-                     "untouched"},
-        IdentityCase{"local-host without local host-ports", "sip:bob@local-host", ALL, false, Vector<CHostPort>(),
-                     "-", "NO LOCAL DOMAINS"},
-        IdentityCase{"TEL phone-context as host", "tel:+4930;phone-context=exact.org", ALL, false, GW, "exact/bob",
-                     "untouched"},
-        IdentityCase{"TEL without host reaches own host only if local host is empty", "tel:+4930", ALL, false,
-                     GW, "-", "untouched"},
-        IdentityCase{"missing name leaves its message", "sip:bob@exact.org:5060", namesOf({"gone", "exact"}), false,
-                     GW, "exact/bob", "LOCATION-SERVICE 'gone' DOES NOT EXIST"},
-        IdentityCase{"unknown scheme", "<http://example.com/>", ALL, false, GW, "-",
+                     namesOf({"alpha", "exact"}), "exact/bob", false, hostPortsOf({"example.com:5060", "gw"})},
+        IdentityCase{"local-host without local host-ports", "sip:bob@local-host", ALL, "-", false,
+                     Vector<CHostPort>(), "NO LOCAL DOMAINS"},
+        IdentityCase{"TEL phone-context as host", "tel:+4930;phone-context=exact.org", ALL, "exact/bob"},
+        IdentityCase{"TEL without host reaches own host only if local host is empty", "tel:+4930", ALL, "-"},
+        IdentityCase{"missing name leaves its message", "sip:bob@exact.org:5060", namesOf({"gone", "exact"}),
+                     "exact/bob", false, GW, "LOCATION-SERVICE 'gone' DOES NOT EXIST"},
+        IdentityCase{"unknown scheme", "<http://example.com/>", ALL, "-", false, GW,
                      "CANNOT PROCESS UNKNOWN URI; MUST BE A SIP, SIPS OR TEL URI"}));
 
 TEST_F(IdentityResolutionTest, WithoutNamesEveryServiceIsTriedInCreationOrderThroughTheRepository) {

@@ -3,70 +3,46 @@
 #include <gtest/gtest.h>
 
 #include <string>
-#include <vector>
 
 #include "CDriverRepository.h"
-#include "LS_CMasterAuthenticationService.h"
-#include "LS_CMasterLocationService.h"
-#include "LS_ILocationServiceConfig.h"
+#include "LookupFixture.h"
 #include "SystemRepository.h"
 
 namespace {
 
-CHostPort hostPort(char const* text) {
-  CHostPort parsed;
-  parsed = CString(text);
-  return parsed;
-}
-
-template <class... Texts>
-Vector<String> namesOf(Texts... texts) {
-  Vector<String> names;
-  for (char const* text : {texts...})
-    names.add(text);
-  return names;
-}
-
 // Both masters, registered in a repository that a test installs when it
 // wants the lookups to find them, with location services of every kind.
-class ServiceResolutionTest : public ::testing::Test {
+class ServiceResolutionTest : public LookupTest {
  protected:
   void SetUp() override {
     repository->registerDriver(locationMaster.get());
     repository->registerDriver(authenticationMaster.get());
-    service("partial1")->insertConfigDomain(0, hostPort("example.com"));
-    service("partial2")->insertConfigDomain(0, hostPort("example.com"));
-    service("exact")->insertConfigDomain(0, hostPort("example.com:5060"));
-    RefPtr<LS_ILocationServiceConfig> const backup = service("backup");
+    locationService("partial1")->insertConfigDomain(0, hostPort("example.com"));
+    locationService("partial2")->insertConfigDomain(0, hostPort("example.com"));
+    locationService("exact")->insertConfigDomain(0, hostPort("example.com:5060"));
+    RefPtr<LS_ILocationServiceConfig> const backup = locationService("backup");
     backup->setConfigImperative(LS_Imperative::BACKUP);
     backup->insertConfigDomain(0, hostPort("backup.org"));
-    RefPtr<LS_ILocationServiceConfig> const fallback = service("default");
+    RefPtr<LS_ILocationServiceConfig> const fallback = locationService("default");
     fallback->setConfigImperative(LS_Imperative::BACKUP);
     fallback->setConfigDefaultDomain(true);
-    service("local");
+    locationService("local");
   }
   void TearDown() override { SYSTEM::SET_DRIVER_REPOSITORY(nullptr); }
 
-  RefPtr<LS_ILocationServiceConfig> service(char const* name) {
-    RefPtr<LS_ILocationServiceConfig> created;
-    adoptInterface(created,
-                   [&](UUID const& iid, void** raw) { return locationMaster->createLocationServiceIf(name, iid, raw); });
-    return created;
-  }
-
-  RefPtr<LS_CMasterLocationService> locationMaster = adoptRef(new LS_CMasterLocationService);
-  RefPtr<LS_CMasterAuthenticationService> authenticationMaster = adoptRef(new LS_CMasterAuthenticationService);
   RefPtr<CDriverRepository> repository = adoptRef(new CDriverRepository);
-  String error{"untouched"};
 };
+
+constexpr auto AUTHORITATIVE = LS_Imperative::AUTHORITATIVE;
+constexpr char const* NONE_FOR = "NO LOCATION-SERVICE IS RESPONSIBLE FOR DOMAIN ";
 
 struct HostCase {
   char const* what;
   char const* host;
   Vector<String> names;
-  char const* localHostPort;
-  LS_Imperative::Type imperative;
-  char const* expected;  // the service's name, or the error text
+  std::string expected;  // the service's name, or the error text
+  char const* localHostPort = "gw";
+  LS_Imperative::Type imperative = AUTHORITATIVE;
 };
 
 void PrintTo(HostCase const& c, std::ostream* os) {
@@ -77,46 +53,32 @@ class HostResolution : public ServiceResolutionTest, public ::testing::WithParam
 
 TEST_P(HostResolution, ChoosesByDomainThenDefaultThenLocalHostPorts) {
   HostCase const& c = GetParam();
-  Vector<CHostPort> local;
-  local.add(hostPort(c.localHostPort));
   RefPtr<LS_ILocationService> found;
-  XCode const result =
-      LS_getLocationService(error, found, hostPort(c.host), c.names, local, c.imperative, locationMaster.get());
-  if (result.isSuccess()) {
-    EXPECT_EQ(found->getName().str(), c.expected);
-    EXPECT_EQ(error, "untouched");
-    return;
-  }
-  EXPECT_EQ(found.get(), nullptr);
-  EXPECT_EQ(error.str(), c.expected);
+  XCode const result = LS_getLocationService(error, found, hostPort(c.host), c.names,
+                                             hostPortsOf({c.localHostPort}), c.imperative, locationMaster.get());
+  EXPECT_EQ(result.isSuccess() ? found->getName().str() : error.str(), c.expected);
+  EXPECT_TRUE(result.isSuccess() ? error == "untouched" : !found);
 }
-
-constexpr auto AUTHORITATIVE = LS_Imperative::AUTHORITATIVE;
 
 INSTANTIATE_TEST_SUITE_P(
     Table,
     HostResolution,
     ::testing::Values(
-        HostCase{"exact beats an earlier partial", "example.com:5060", namesOf("partial1", "exact"), "gw",
-                 AUTHORITATIVE, "exact"},
-        HostCase{"first of two partials", "example.com:5060", namesOf("partial2", "partial1"), "gw", AUTHORITATIVE,
-                 "partial2"},
-        HostCase{"host case ignored", "EXAMPLE.com:5070", namesOf("exact", "partial1"), "gw", AUTHORITATIVE,
-                 "partial1"},
-        HostCase{"other port is no match", "example.com:5061", namesOf("exact"), "gw", AUTHORITATIVE,
-                 "NO LOCATION-SERVICE IS RESPONSIBLE FOR DOMAIN 'example.com:5061'"},
-        HostCase{"default beats a local host-port", "gw:5060", namesOf("local", "default"), "gw:5060", AUTHORITATIVE,
-                 "default"},
-        HostCase{"configured domain beats default", "example.com", namesOf("default", "partial1"), "gw",
-                 AUTHORITATIVE, "partial1"},
-        HostCase{"local host-port in the last pass", "gw:5060", namesOf("local"), "gw", AUTHORITATIVE, "local"},
-        HostCase{"backup invisible to authoritative", "backup.org", namesOf("backup"), "gw", AUTHORITATIVE,
-                 "NO LOCATION-SERVICE IS RESPONSIBLE FOR DOMAIN 'backup.org'"},
-        HostCase{"backup seen by backup", "backup.org", namesOf("backup"), "gw", LS_Imperative::BACKUP, "backup"},
-        HostCase{"missing name skipped silently", "example.com", namesOf("gone", "partial1"), "gw", AUTHORITATIVE,
-                 "partial1"},
-        HostCase{"no names", "example.com", Vector<String>(), "gw", AUTHORITATIVE,
-                 "NO LOCATION-SERVICE IS RESPONSIBLE FOR DOMAIN 'example.com'"}));
+        HostCase{"exact beats an earlier partial", "example.com:5060", namesOf({"partial1", "exact"}), "exact"},
+        HostCase{"first of two partials", "example.com:5060", namesOf({"partial2", "partial1"}), "partial2"},
+        HostCase{"host case ignored", "EXAMPLE.com:5070", namesOf({"exact", "partial1"}), "partial1"},
+        HostCase{"other port is no match", "example.com:5061", namesOf({"exact"}),
+                 std::string(NONE_FOR) + "'example.com:5061'"},
+        HostCase{"default beats a local host-port", "gw:5060", namesOf({"local", "default"}), "default",
+                 "gw:5060"},
+        HostCase{"configured domain beats default", "example.com", namesOf({"default", "partial1"}), "partial1"},
+        HostCase{"local host-port in the last pass", "gw:5060", namesOf({"local"}), "local"},
+        HostCase{"backup invisible to authoritative", "backup.org", namesOf({"backup"}),
+                 std::string(NONE_FOR) + "'backup.org'"},
+        HostCase{"backup seen by backup", "backup.org", namesOf({"backup"}), "backup", "gw",
+                 LS_Imperative::BACKUP},
+        HostCase{"missing name skipped silently", "example.com", namesOf({"gone", "partial1"}), "partial1"},
+        HostCase{"no names", "example.com", Vector<String>(), std::string(NONE_FOR) + "'example.com'"}));
 
 TEST_F(ServiceResolutionTest, WithoutNamesEveryServiceIsTriedInCreationOrderThroughTheRepository) {
   SYSTEM::SET_DRIVER_REPOSITORY(repository.get());

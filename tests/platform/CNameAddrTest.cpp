@@ -141,13 +141,6 @@ TEST(CNameAddr, SerializesTheDisplayNameQuotedAndTheUriAsWritten) {
     EXPECT_EQ(expected, serialized(parsed(text))) << text;
 }
 
-TEST(CNameAddr, SerializedTextParsesToAnEqualValueWithTheSameDisplayName) {
-  CNameAddr const original = parsed("\"A \\\"B\\\"\" <sip:+49;phone-context=x@h:1>");
-  CNameAddr const again = parsed(serialized(original));
-  EXPECT_EQ(original, again);
-  EXPECT_EQ(original.GetDisplayName(), again.GetDisplayName());
-}
-
 TEST(CNameAddr, SerializeAppendsToTheBufferAndWritesNothingWithoutUri) {
   CBlob blob;
   unsigned char const prefix[] = {'X'};
