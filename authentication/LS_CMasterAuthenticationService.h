@@ -11,6 +11,8 @@
 // count is process-wide and shared by every master of this class.
 #pragma once
 
+#include "Export.h"
+
 #include "CDriver.h"
 #include "CInherit.h"
 #include "IInfo.h"
@@ -18,7 +20,7 @@
 #include "LS_IMasterAuthenticationService.h"
 #include "StringHashTable.h"
 
-class LS_CMasterAuthenticationService
+class LS_EXPORT LS_CMasterAuthenticationService
     : public CInherit<LS_CMasterAuthenticationService, CDriver, LS_IMasterAuthenticationService, IInfo> {
  public:
   // Identified by DID_MasterAuthenticationService() and named by

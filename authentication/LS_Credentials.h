@@ -6,11 +6,13 @@
 // belong here.
 #pragma once
 
+#include "Export.h"
+
 #include "LS_IAuthenticationService.h"
 #include "RefPtr.h"
 #include "String.h"
 
-struct LS_Credentials {
+struct LS_EXPORT LS_Credentials {
   RefPtr<LS_IAuthenticationService> authenticationService;
   String userName;
   String password;

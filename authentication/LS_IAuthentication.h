@@ -4,12 +4,14 @@
 // to the lookups.
 #pragma once
 
+#include "Export.h"
+
 #include "LS_Interface.h"
 #include "LS_InterfaceIdentifiers.h"
 #include "String.h"
 #include "XCode.h"
 
-class LS_IAuthentication : public LS_Interface<LS_IAuthenticationIdentifiers> {
+class LS_EXPORT LS_IAuthentication : public LS_Interface<LS_IAuthenticationIdentifiers> {
  public:
   virtual unsigned int getNumberOfAuthenticates() const = 0;
   virtual XCode getAuthenticate(unsigned int index, String& authenticationService, String& userName) const = 0;

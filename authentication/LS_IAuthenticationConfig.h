@@ -4,12 +4,14 @@
 // run-time view is LS_IAuthentication.
 #pragma once
 
+#include "Export.h"
+
 #include "LS_Interface.h"
 #include "LS_InterfaceIdentifiers.h"
 #include "String.h"
 #include "XCode.h"
 
-class LS_IAuthenticationConfig : public LS_Interface<LS_IAuthenticationConfigIdentifiers> {
+class LS_EXPORT LS_IAuthenticationConfig : public LS_Interface<LS_IAuthenticationConfigIdentifiers> {
  public:
   // Fails, with count 0, while the face holds no list of its own.
   virtual XCode getNumberOfConfigAuthenticates(unsigned int& count) const = 0;

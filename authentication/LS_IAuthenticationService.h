@@ -7,6 +7,8 @@
 // service.
 #pragma once
 
+#include "Export.h"
+
 #include "LS_AuthenticationProtocol.h"
 #include "LS_Interface.h"
 #include "LS_InterfaceIdentifiers.h"
@@ -14,7 +16,7 @@
 #include "Vector.h"
 #include "XCode.h"
 
-class LS_IAuthenticationService : public LS_Interface<LS_IAuthenticationServiceIdentifiers> {
+class LS_EXPORT LS_IAuthenticationService : public LS_Interface<LS_IAuthenticationServiceIdentifiers> {
  public:
   virtual String getName() const = 0;
   virtual void setName(String const& name) = 0;

@@ -4,6 +4,8 @@
 // lookup belongs to the lookup functions.
 #pragma once
 
+#include "Export.h"
+
 #include "LS_Interface.h"
 #include "LS_InterfaceIdentifiers.h"
 #include "RefPtr.h"
@@ -11,7 +13,7 @@
 #include "Vector.h"
 #include "XCode.h"
 
-class LS_IMasterAuthenticationService : public LS_Interface<LS_IMasterAuthenticationServiceIdentifiers> {
+class LS_EXPORT LS_IMasterAuthenticationService : public LS_Interface<LS_IMasterAuthenticationServiceIdentifiers> {
  public:
   virtual XCode getAuthenticationServiceIf(String const& name, UUID const& iid, void** out) = 0;
   // Creates the service when the name is new, then as

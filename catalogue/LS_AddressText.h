@@ -7,6 +7,8 @@
 // the one whose output their log or dump format was written for.
 #pragma once
 
+#include "Export.h"
+
 #include "CHostPort.h"
 #include "CNameAddr.h"
 #include "CSocketAddr.h"
@@ -15,21 +17,21 @@
 // Sets out to the serialised name-addr and returns it. When the text cannot
 // be made, out is left as it was and the returned reference is a shared
 // constant holding the platform's invalid-value text instead.
-String const& LS_nameAddrToString(CNameAddr const& nameAddr, String& out);
-String LS_nameAddrToString(CNameAddr const& nameAddr);
+LS_EXPORT String const& LS_nameAddrToString(CNameAddr const& nameAddr, String& out);
+LS_EXPORT String LS_nameAddrToString(CNameAddr const& nameAddr);
 
 // Host, then ":port" unless the port is the do-not-output marker. Returns
 // out.
-String& LS_hostPortToString(CHostPort const& hostPort, String& out);
-String LS_hostPortToString(CHostPort const& hostPort);
+LS_EXPORT String& LS_hostPortToString(CHostPort const& hostPort, String& out);
+LS_EXPORT String LS_hostPortToString(CHostPort const& hostPort);
 
 // "host:port", or the bare host when the port is 0.
-String hostPortStr(CHostPort const& hostPort);
+LS_EXPORT String hostPortStr(CHostPort const& hostPort);
 // "address:port", "[address]:port" for an IPv6 address, or the bare address
 // (without brackets) when the port is 0.
-String hostPortStr(CSocketAddr const& socketAddr);
+LS_EXPORT String hostPortStr(CSocketAddr const& socketAddr);
 
 // A default host-port, made on the first call and kept until the library is
 // unloaded: every call returns the same object, so operations that have no
 // host-port to report can hand out a reference to it.
-CHostPort const& LS_emptyHostPort();
+LS_EXPORT CHostPort const& LS_emptyHostPort();

@@ -3,6 +3,8 @@
 // name against the aliases belongs to the identity, not here.
 #pragma once
 
+#include "Export.h"
+
 #include "LS_AliasRange.h"
 #include "RefPtr.h"
 #include "RegEx.h"
@@ -11,7 +13,7 @@
 
 // Copies share the compiled patterns (one more reference each) and compile
 // nothing again; a pattern is immutable, so the sharing is safe.
-struct LS_Alias {
+struct LS_EXPORT LS_Alias {
   Vector<String> names;
   Vector<LS_AliasRange> ranges;
   // As the configuration gave them.

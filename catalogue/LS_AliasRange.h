@@ -3,9 +3,11 @@
 // identity's business, not this record's.
 #pragma once
 
+#include "Export.h"
+
 #include "String.h"
 
-struct LS_AliasRange {
+struct LS_EXPORT LS_AliasRange {
   String from;
   String to;
 

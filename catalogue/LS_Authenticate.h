@@ -3,9 +3,11 @@
 // credentials belongs to the authentication lookups, not here.
 #pragma once
 
+#include "Export.h"
+
 #include "String.h"
 
-struct LS_Authenticate {
+struct LS_EXPORT LS_Authenticate {
   // The entry's "Authentication Link".
   String authenticationService;
   String userName;

@@ -3,9 +3,11 @@
 // print; any value outside the table gives the platform's invalid-value text.
 #pragma once
 
+#include "Export.h"
+
 #include <cstdint>
 
-struct LS_AuthenticationProtocol {
+struct LS_EXPORT LS_AuthenticationProtocol {
   enum Type : uint32_t {
     HTTP = 0,
     THREE_GPP = 1,

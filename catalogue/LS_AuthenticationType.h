@@ -3,9 +3,11 @@
 // platform's invalid-value text.
 #pragma once
 
+#include "Export.h"
+
 #include <cstdint>
 
-struct LS_AuthenticationType {
+struct LS_EXPORT LS_AuthenticationType {
   enum Type : uint32_t {
     OUTBOUND = 0,
     INBOUND = 1,

@@ -7,28 +7,30 @@
 // the business of the container helpers, not of this file.
 #pragma once
 
+#include "Export.h"
+
 #include "String.h"
 #include "UUID.h"
 
-UUID const& CID_LS_Data();
-UUID const& CID_LS_AppendList();
-UUID const& CID_LS_Authentication();
-UUID const& CID_LS_RegistrationOutbound();
-UUID const& CID_LS_RegistrationInbound();
-UUID const& CID_LS_MessageSubscription();
-UUID const& CID_LS_CallOutbound();
-UUID const& CID_LS_CallInbound();
-UUID const& CID_LS_Identity();
-UUID const& CID_LS_LocationService();
-UUID const& CID_LS_MasterLocationService();
-UUID const& CID_LS_AuthenticationService();
-UUID const& CID_LS_MasterAuthenticationService();
+LS_EXPORT UUID const& CID_LS_Data();
+LS_EXPORT UUID const& CID_LS_AppendList();
+LS_EXPORT UUID const& CID_LS_Authentication();
+LS_EXPORT UUID const& CID_LS_RegistrationOutbound();
+LS_EXPORT UUID const& CID_LS_RegistrationInbound();
+LS_EXPORT UUID const& CID_LS_MessageSubscription();
+LS_EXPORT UUID const& CID_LS_CallOutbound();
+LS_EXPORT UUID const& CID_LS_CallInbound();
+LS_EXPORT UUID const& CID_LS_Identity();
+LS_EXPORT UUID const& CID_LS_LocationService();
+LS_EXPORT UUID const& CID_LS_MasterLocationService();
+LS_EXPORT UUID const& CID_LS_AuthenticationService();
+LS_EXPORT UUID const& CID_LS_MasterAuthenticationService();
 
-UUID const& DID_MasterLocationService();
-UUID const& DID_MasterAuthenticationService();
+LS_EXPORT UUID const& DID_MasterLocationService();
+LS_EXPORT UUID const& DID_MasterAuthenticationService();
 
 // The driver name under which the host registers a master and the lookups
 // find it: IDriver::BUILD_DRIVER_NAME of baseName ("master-location-service"
 // or "master-authentication-service") with 0, 0, 0xFFFFFFFF and four empty
 // texts.
-String LS_masterDriverName(char const* baseName);
+LS_EXPORT String LS_masterDriverName(char const* baseName);

@@ -4,11 +4,13 @@
 // belong to the face, not here.
 #pragma once
 
+#include "Export.h"
+
 #include "CHostPort.h"
 #include "CNameAddr.h"
 #include "String.h"
 
-struct LS_Contact {
+struct LS_EXPORT LS_Contact {
   LS_Contact() = default;
   LS_Contact(String const& callId,
              CNameAddr const& contact,

@@ -3,10 +3,12 @@
 // here.
 #pragma once
 
+#include "Export.h"
+
 #include "IpAddress.h"
 #include "LS_FilterType.h"
 
-struct LS_FilterRule {
+struct LS_EXPORT LS_FilterRule {
   LS_FilterType::Type type = LS_FilterType::ACCEPT;
   // Address and net mask that the rule matches; empty matches any address.
   IpAddress address;

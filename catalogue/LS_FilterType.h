@@ -3,9 +3,11 @@
 // table gives the platform's invalid-value text.
 #pragma once
 
+#include "Export.h"
+
 #include <cstdint>
 
-struct LS_FilterType {
+struct LS_EXPORT LS_FilterType {
   enum Type : uint32_t {
     ACCEPT = 0,
     DENY = 1,

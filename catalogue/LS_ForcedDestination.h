@@ -2,11 +2,13 @@
 // the request URI says. How the face dumps it belongs to the face, not here.
 #pragma once
 
+#include "Export.h"
+
 #include <cstdint>
 
 #include "CHostPort.h"
 
-struct LS_ForcedDestination {
+struct LS_EXPORT LS_ForcedDestination {
   enum Type : uint32_t {
     // The two host-ports give the destination.
     MANUAL = 0,

@@ -4,9 +4,11 @@
 // invalid-value text.
 #pragma once
 
+#include "Export.h"
+
 #include <cstdint>
 
-struct LS_IdentityFace {
+struct LS_EXPORT LS_IdentityFace {
   enum Type : uint32_t {
     AUTHENTICATION_OUTBOUND = 0,
     AUTHENTICATION_INBOUND = 1,

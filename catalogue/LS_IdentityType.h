@@ -3,9 +3,11 @@
 // gives the platform's invalid-value text.
 #pragma once
 
+#include "Export.h"
+
 #include <cstdint>
 
-struct LS_IdentityType {
+struct LS_EXPORT LS_IdentityType {
   enum Type : uint32_t {
     IDENTITY = 0,
     IDENTITY_GROUP = 1,

@@ -3,9 +3,11 @@
 // platform's invalid-value text.
 #pragma once
 
+#include "Export.h"
+
 #include <cstdint>
 
-struct LS_Imperative {
+struct LS_EXPORT LS_Imperative {
   enum Type : uint32_t {
     AUTHORITATIVE = 0,
     BACKUP = 1,

@@ -10,6 +10,8 @@
 // the classes that implement them, not here.
 #pragma once
 
+#include "Export.h"
+
 #include <cstdint>
 
 #include "UUID.h"
@@ -19,7 +21,7 @@
   static UUID const& CID_PROXY();         \
   static UUID const& CID_STUB()
 
-struct LS_IAuthenticationIdentifiers {
+struct LS_EXPORT LS_IAuthenticationIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -30,7 +32,7 @@ struct LS_IAuthenticationIdentifiers {
   };
 };
 
-struct LS_IAuthenticationConfigIdentifiers {
+struct LS_EXPORT LS_IAuthenticationConfigIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -47,7 +49,7 @@ struct LS_IAuthenticationConfigIdentifiers {
   };
 };
 
-struct LS_IAuthenticationServiceIdentifiers {
+struct LS_EXPORT LS_IAuthenticationServiceIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -71,7 +73,7 @@ struct LS_IAuthenticationServiceIdentifiers {
   };
 };
 
-struct LS_ICallIdentifiers {
+struct LS_EXPORT LS_ICallIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -83,7 +85,7 @@ struct LS_ICallIdentifiers {
   };
 };
 
-struct LS_ICallConfigIdentifiers {
+struct LS_EXPORT LS_ICallConfigIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -101,7 +103,7 @@ struct LS_ICallConfigIdentifiers {
   };
 };
 
-struct LS_IContainerIdentifiers {
+struct LS_EXPORT LS_IContainerIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -118,7 +120,7 @@ struct LS_IContainerIdentifiers {
   };
 };
 
-struct LS_IContainerObserverIdentifiers {
+struct LS_EXPORT LS_IContainerObserverIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -130,7 +132,7 @@ struct LS_IContainerObserverIdentifiers {
   };
 };
 
-struct LS_IElementIdentifiers {
+struct LS_EXPORT LS_IElementIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -149,7 +151,7 @@ struct LS_IElementIdentifiers {
   };
 };
 
-struct LS_IIdentityIdentifiers {
+struct LS_EXPORT LS_IIdentityIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -177,7 +179,7 @@ struct LS_IIdentityIdentifiers {
   };
 };
 
-struct LS_IIdentityConfigIdentifiers {
+struct LS_EXPORT LS_IIdentityConfigIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -220,7 +222,7 @@ struct LS_IIdentityConfigIdentifiers {
   };
 };
 
-struct LS_IInboundIdentifiers {
+struct LS_EXPORT LS_IInboundIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -231,7 +233,7 @@ struct LS_IInboundIdentifiers {
   };
 };
 
-struct LS_IInboundConfigIdentifiers {
+struct LS_EXPORT LS_IInboundConfigIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -245,7 +247,7 @@ struct LS_IInboundConfigIdentifiers {
   };
 };
 
-struct LS_ILocationServiceIdentifiers {
+struct LS_EXPORT LS_ILocationServiceIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -264,7 +266,7 @@ struct LS_ILocationServiceIdentifiers {
   };
 };
 
-struct LS_ILocationServiceSubjectIdentifiers {
+struct LS_EXPORT LS_ILocationServiceSubjectIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -275,7 +277,7 @@ struct LS_ILocationServiceSubjectIdentifiers {
   };
 };
 
-struct LS_ILocationServiceConfigIdentifiers {
+struct LS_EXPORT LS_ILocationServiceConfigIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -300,7 +302,7 @@ struct LS_ILocationServiceConfigIdentifiers {
   };
 };
 
-struct LS_IMasterAuthenticationServiceIdentifiers {
+struct LS_EXPORT LS_IMasterAuthenticationServiceIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -313,7 +315,7 @@ struct LS_IMasterAuthenticationServiceIdentifiers {
   };
 };
 
-struct LS_IMasterLocationServiceIdentifiers {
+struct LS_EXPORT LS_IMasterLocationServiceIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -326,7 +328,7 @@ struct LS_IMasterLocationServiceIdentifiers {
   };
 };
 
-struct LS_IMasterLocationServiceSubjectIdentifiers {
+struct LS_EXPORT LS_IMasterLocationServiceSubjectIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -337,7 +339,7 @@ struct LS_IMasterLocationServiceSubjectIdentifiers {
   };
 };
 
-struct LS_IMwiSubscriptionIdentifiers {
+struct LS_EXPORT LS_IMwiSubscriptionIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -356,7 +358,7 @@ struct LS_IMwiSubscriptionIdentifiers {
   };
 };
 
-struct LS_IMwiSubscriptionSubjectIdentifiers {
+struct LS_EXPORT LS_IMwiSubscriptionSubjectIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -367,7 +369,7 @@ struct LS_IMwiSubscriptionSubjectIdentifiers {
   };
 };
 
-struct LS_IMwiSubscriptionConfigIdentifiers {
+struct LS_EXPORT LS_IMwiSubscriptionConfigIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -394,7 +396,7 @@ struct LS_IMwiSubscriptionConfigIdentifiers {
   };
 };
 
-struct LS_IOutboundIdentifiers {
+struct LS_EXPORT LS_IOutboundIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -416,7 +418,7 @@ struct LS_IOutboundIdentifiers {
   };
 };
 
-struct LS_IOutboundConfigIdentifiers {
+struct LS_EXPORT LS_IOutboundConfigIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -457,7 +459,7 @@ struct LS_IOutboundConfigIdentifiers {
   };
 };
 
-struct LS_IRegistrationInboundIdentifiers {
+struct LS_EXPORT LS_IRegistrationInboundIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -472,7 +474,7 @@ struct LS_IRegistrationInboundIdentifiers {
   };
 };
 
-struct LS_IRegistrationInboundSubjectIdentifiers {
+struct LS_EXPORT LS_IRegistrationInboundSubjectIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -483,7 +485,7 @@ struct LS_IRegistrationInboundSubjectIdentifiers {
   };
 };
 
-struct LS_IRegistrationInboundConfigIdentifiers {
+struct LS_EXPORT LS_IRegistrationInboundConfigIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -499,7 +501,7 @@ struct LS_IRegistrationInboundConfigIdentifiers {
   };
 };
 
-struct LS_IRegistrationOutboundIdentifiers {
+struct LS_EXPORT LS_IRegistrationOutboundIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -527,7 +529,7 @@ struct LS_IRegistrationOutboundIdentifiers {
   };
 };
 
-struct LS_IRegistrationOutboundSubjectIdentifiers {
+struct LS_EXPORT LS_IRegistrationOutboundSubjectIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {
@@ -538,7 +540,7 @@ struct LS_IRegistrationOutboundSubjectIdentifiers {
   };
 };
 
-struct LS_IRegistrationOutboundConfigIdentifiers {
+struct LS_EXPORT LS_IRegistrationOutboundConfigIdentifiers {
   LS_INTERFACE_IDENTIFIER_ACCESSORS;
   struct MID {
     enum Type : uint32_t {

@@ -3,9 +3,11 @@
 // the platform's invalid-value text.
 #pragma once
 
+#include "Export.h"
+
 #include <cstdint>
 
-struct LS_KeepAliveMethod {
+struct LS_EXPORT LS_KeepAliveMethod {
   enum Type : uint32_t {
     NONE = 0,
     CRLF = 1,

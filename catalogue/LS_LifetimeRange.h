@@ -4,8 +4,10 @@
 // belong to the face, not here.
 #pragma once
 
+#include "Export.h"
+
 // The fields are kept as configured, whatever their order of size.
-struct LS_LifetimeRange {
+struct LS_EXPORT LS_LifetimeRange {
   unsigned int minimum = 0;
   unsigned int maximum = 0;
   // Granted when the request asks for no lifetime.

@@ -4,15 +4,17 @@
 // gaps inside a group of hundreds) have no name.
 #pragma once
 
+#include "Export.h"
+
 #include <cstddef>
 
-struct LS_MethodName {
+struct LS_EXPORT LS_MethodName {
   unsigned int id;
   char const* name;
 };
 
 // The name of id in table, or null when the table has no such row.
-char const* LS_findMethodName(LS_MethodName const* table, size_t rows, unsigned int id);
+LS_EXPORT char const* LS_findMethodName(LS_MethodName const* table, size_t rows, unsigned int id);
 
 template <size_t Rows>
 char const* LS_findMethodName(LS_MethodName const (&table)[Rows], unsigned int id) {

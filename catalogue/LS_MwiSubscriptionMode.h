@@ -3,9 +3,11 @@
 // invalid-value text.
 #pragma once
 
+#include "Export.h"
+
 #include <cstdint>
 
-struct LS_MwiSubscriptionMode {
+struct LS_EXPORT LS_MwiSubscriptionMode {
   enum Type : uint32_t {
     NONE = 0,
     EXPLICIT = 1,

@@ -3,9 +3,11 @@
 // invalid-value text.
 #pragma once
 
+#include "Export.h"
+
 #include <cstdint>
 
-struct LS_NatTraversalMethod {
+struct LS_EXPORT LS_NatTraversalMethod {
   enum Type : uint32_t {
     NONE = 0,
     NORTEL = 1,

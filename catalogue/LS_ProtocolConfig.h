@@ -4,9 +4,11 @@
 // print; any value outside the table gives the platform's invalid-value text.
 #pragma once
 
+#include "Export.h"
+
 #include <cstdint>
 
-struct LS_ProtocolConfig {
+struct LS_EXPORT LS_ProtocolConfig {
   enum Type : uint32_t {
     PREFERRED_NONE = 0,
     PREFERRED_UDP_TCP_TLS = 1,

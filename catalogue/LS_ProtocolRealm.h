@@ -3,10 +3,12 @@
 // authentication lookups, not here.
 #pragma once
 
+#include "Export.h"
+
 #include "LS_AuthenticationProtocol.h"
 #include "String.h"
 
-struct LS_ProtocolRealm {
+struct LS_EXPORT LS_ProtocolRealm {
   LS_AuthenticationProtocol::Type protocol = LS_AuthenticationProtocol::HTTP;
   String realm;
 };

@@ -3,9 +3,11 @@
 // face, not here.
 #pragma once
 
+#include "Export.h"
+
 #include "CHostPort.h"
 
-struct LS_Proxy {
+struct LS_EXPORT LS_Proxy {
   LS_Proxy() = default;
   LS_Proxy(CHostPort const& address, CHostPort const& tlsAddress, bool strictRoute)
       : address(address), tlsAddress(tlsAddress), strictRoute(strictRoute) {}

@@ -3,9 +3,11 @@
 // invalid-value text.
 #pragma once
 
+#include "Export.h"
+
 #include <cstdint>
 
-struct LS_RegistrationMode {
+struct LS_EXPORT LS_RegistrationMode {
   enum Type : uint32_t {
     NONE = 0,
     AUTO = 1,

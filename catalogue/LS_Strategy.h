@@ -4,9 +4,11 @@
 // invalid-value text.
 #pragma once
 
+#include "Export.h"
+
 #include <cstdint>
 
-struct LS_Strategy {
+struct LS_EXPORT LS_Strategy {
   enum Type : uint32_t {
     LOCAL_ONLY = 0,
     BASE_ONLY = 1,

@@ -3,9 +3,11 @@
 // gives the platform's invalid-value text.
 #pragma once
 
+#include "Export.h"
+
 #include <cstdint>
 
-struct LS_UriScheme {
+struct LS_EXPORT LS_UriScheme {
   enum Type : uint32_t {
     SIP = 0,
     SIPS = 1,

@@ -3,9 +3,11 @@
 // table gives the platform's invalid-value text.
 #pragma once
 
+#include "Export.h"
+
 #include <cstdint>
 
-struct LS_User {
+struct LS_EXPORT LS_User {
   enum Type : uint32_t {
     UNDEFINED = 0,
     PHONE = 1,

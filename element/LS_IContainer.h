@@ -9,6 +9,8 @@
 // are containers; their values are the children.
 #pragma once
 
+#include "Export.h"
+
 #include <memory>
 
 #include "IUnknown.h"
@@ -21,7 +23,7 @@
 #include "String.h"
 #include "Vector.h"
 
-class LS_IContainer : public LS_Interface<LS_IContainerIdentifiers> {
+class LS_EXPORT LS_IContainer : public LS_Interface<LS_IContainerIdentifiers> {
  public:
   // A child named name was added, removed or changed in the subject.
   class EvElement : public ObserverEvent<LS_IContainer> {

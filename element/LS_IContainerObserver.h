@@ -3,6 +3,8 @@
 // naming the child.
 #pragma once
 
+#include "Export.h"
+
 #include "IUnknown.h"
 #include "LS_Interface.h"
 #include "LS_InterfaceIdentifiers.h"
@@ -10,7 +12,7 @@
 
 class LS_IContainer;
 
-class LS_IContainerObserver : public LS_Interface<LS_IContainerObserverIdentifiers> {
+class LS_EXPORT LS_IContainerObserver : public LS_Interface<LS_IContainerObserverIdentifiers> {
  public:
   virtual void onElementAdd(ObserverEvent<LS_IContainer>& event) = 0;
   virtual void onElementRemove(ObserverEvent<LS_IContainer>& event) = 0;

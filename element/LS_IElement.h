@@ -6,12 +6,14 @@
 // it inherits. Containers, data values and append lists are elements.
 #pragma once
 
+#include "Export.h"
+
 #include "IUnknown.h"
 #include "LS_IElementObserver.h"
 #include "LS_Interface.h"
 #include "LS_InterfaceIdentifiers.h"
 
-class LS_IElement : public LS_Interface<LS_IElementIdentifiers> {
+class LS_EXPORT LS_IElement : public LS_Interface<LS_IElementIdentifiers> {
  public:
   virtual void addElementObserver(LS_IElementObserver* observer, unsigned int priority) = 0;
   virtual void removeElementObserver(LS_IElementObserver* observer) = 0;

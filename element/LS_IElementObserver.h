@@ -3,11 +3,13 @@
 // IUnknown: elements borrow their observers and never count them.
 #pragma once
 
+#include "Export.h"
+
 #include "ObserverEvent.h"
 
 class LS_IElement;
 
-class LS_IElementObserver {
+class LS_EXPORT LS_IElementObserver {
  public:
   virtual void onChange(ObserverEvent<LS_IElement>& event) = 0;
   virtual void onDestroying(ObserverEvent<LS_IElement>& event) = 0;

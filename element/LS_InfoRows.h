@@ -5,10 +5,12 @@
 // shows, and in what order, belongs to the object.
 #pragma once
 
+#include "Export.h"
+
 #include "InfoContainer.h"
 #include "String.h"
 
-class LS_InfoRows {
+class LS_EXPORT LS_InfoRows {
  public:
   LS_InfoRows(InfoContainer& info, unsigned int maxLevel, unsigned int maxDetail, unsigned int detail)
       : m_info(info), m_maxLevel(maxLevel), m_maxDetail(maxDetail), m_detail(detail) {}

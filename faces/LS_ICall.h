@@ -3,11 +3,13 @@
 // how calls use it belongs outside this component.
 #pragma once
 
+#include "Export.h"
+
 #include "LS_Interface.h"
 #include "LS_InterfaceIdentifiers.h"
 #include "String.h"
 
-class LS_ICall : public LS_Interface<LS_ICallIdentifiers> {
+class LS_EXPORT LS_ICall : public LS_Interface<LS_ICallIdentifiers> {
  public:
   // The empty text when no name is set here or up the chain of bases.
   virtual String getVoipProfile() const = 0;

@@ -3,12 +3,14 @@
 // stored on this face. The profiles themselves live outside this component.
 #pragma once
 
+#include "Export.h"
+
 #include "LS_Interface.h"
 #include "LS_InterfaceIdentifiers.h"
 #include "String.h"
 #include "XCode.h"
 
-class LS_ICallConfig : public LS_Interface<LS_ICallConfigIdentifiers> {
+class LS_EXPORT LS_ICallConfig : public LS_Interface<LS_ICallConfigIdentifiers> {
  public:
   // Each getter fails, leaving profile untouched, when this face holds no
   // name of its own; an empty name is stored like any other. A remover lets

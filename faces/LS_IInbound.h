@@ -4,13 +4,15 @@
 // the rules belongs to the SIP side, not here.
 #pragma once
 
+#include "Export.h"
+
 #include "IpAddress.h"
 #include "LS_FilterType.h"
 #include "LS_Interface.h"
 #include "LS_InterfaceIdentifiers.h"
 #include "XCode.h"
 
-class LS_IInbound : public LS_Interface<LS_IInboundIdentifiers> {
+class LS_EXPORT LS_IInbound : public LS_Interface<LS_IInboundIdentifiers> {
  public:
   // 0 when there is no list here or up the chain of bases.
   virtual unsigned int getNumberOfFilterRules() const = 0;

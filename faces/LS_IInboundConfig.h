@@ -4,13 +4,15 @@
 // read through LS_IInbound.
 #pragma once
 
+#include "Export.h"
+
 #include "IpAddress.h"
 #include "LS_FilterType.h"
 #include "LS_Interface.h"
 #include "LS_InterfaceIdentifiers.h"
 #include "XCode.h"
 
-class LS_IInboundConfig : public LS_Interface<LS_IInboundConfigIdentifiers> {
+class LS_EXPORT LS_IInboundConfig : public LS_Interface<LS_IInboundConfigIdentifiers> {
  public:
   // 0 when the face has no list of its own.
   virtual unsigned int getNumberOfConfigFilterRules() const = 0;

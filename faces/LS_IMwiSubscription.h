@@ -7,13 +7,15 @@
 // notifier addresses). Configuration goes through LS_IMwiSubscriptionConfig.
 #pragma once
 
+#include "Export.h"
+
 #include "CHostPort.h"
 #include "LS_Interface.h"
 #include "LS_InterfaceIdentifiers.h"
 #include "LS_MwiSubscriptionMode.h"
 #include "XCode.h"
 
-class LS_IMwiSubscription : public LS_Interface<LS_IMwiSubscriptionIdentifiers> {
+class LS_EXPORT LS_IMwiSubscription : public LS_Interface<LS_IMwiSubscriptionIdentifiers> {
  public:
   // The configured pair, inherited included; the dynamic notifier is not
   // consulted.

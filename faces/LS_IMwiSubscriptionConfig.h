@@ -9,13 +9,15 @@
 // LS_IMwiSubscription. Setters and removers cannot fail.
 #pragma once
 
+#include "Export.h"
+
 #include "CHostPort.h"
 #include "LS_Interface.h"
 #include "LS_InterfaceIdentifiers.h"
 #include "LS_MwiSubscriptionMode.h"
 #include "XCode.h"
 
-class LS_IMwiSubscriptionConfig : public LS_Interface<LS_IMwiSubscriptionConfigIdentifiers> {
+class LS_EXPORT LS_IMwiSubscriptionConfig : public LS_Interface<LS_IMwiSubscriptionConfigIdentifiers> {
  public:
   // Fails unless this face holds both addresses; notifier may be filled
   // already when only the TLS address is missing.

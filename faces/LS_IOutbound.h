@@ -8,6 +8,8 @@
 // LS_IOutboundConfig.
 #pragma once
 
+#include "Export.h"
+
 #include "CHostPort.h"
 #include "LS_ForcedDestination.h"
 #include "LS_Interface.h"
@@ -15,7 +17,7 @@
 #include "LS_ProtocolConfig.h"
 #include "XCode.h"
 
-class LS_IOutbound : public LS_Interface<LS_IOutboundIdentifiers> {
+class LS_EXPORT LS_IOutbound : public LS_Interface<LS_IOutboundIdentifiers> {
  public:
   // The dynamic proxy takes the place of the first configured proxy: index 0
   // yields it when there is one, indices from 1 the configured entries at

@@ -7,6 +7,8 @@
 // run time, are read through LS_IOutbound. Setters and removers cannot fail.
 #pragma once
 
+#include "Export.h"
+
 #include "CHostPort.h"
 #include "LS_ForcedDestination.h"
 #include "LS_Interface.h"
@@ -14,7 +16,7 @@
 #include "LS_ProtocolConfig.h"
 #include "XCode.h"
 
-class LS_IOutboundConfig : public LS_Interface<LS_IOutboundConfigIdentifiers> {
+class LS_EXPORT LS_IOutboundConfig : public LS_Interface<LS_IOutboundConfigIdentifiers> {
  public:
   // Proxies, indexed from 0. Without a list of its own the face reports
   // failure and a count of 0, even when it inherits proxies.

@@ -6,6 +6,8 @@
 // identity do not come from this interface.
 #pragma once
 
+#include "Export.h"
+
 #include "CHostPort.h"
 #include "CNameAddr.h"
 #include "LS_Interface.h"
@@ -13,7 +15,7 @@
 #include "String.h"
 #include "XCode.h"
 
-class LS_IRegistrationInbound : public LS_Interface<LS_IRegistrationInboundIdentifiers> {
+class LS_EXPORT LS_IRegistrationInbound : public LS_Interface<LS_IRegistrationInboundIdentifiers> {
  public:
   // 0, 4294967295 and 3600 when no range is configured here or up the chain.
   virtual void getLifetimeRange(unsigned int& minimum,

@@ -5,13 +5,15 @@
 // read through LS_IRegistrationInbound.
 #pragma once
 
+#include "Export.h"
+
 #include "CNameAddr.h"
 #include "LS_Interface.h"
 #include "LS_InterfaceIdentifiers.h"
 #include "String.h"
 #include "XCode.h"
 
-class LS_IRegistrationInboundConfig : public LS_Interface<LS_IRegistrationInboundConfigIdentifiers> {
+class LS_EXPORT LS_IRegistrationInboundConfig : public LS_Interface<LS_IRegistrationInboundConfigIdentifiers> {
  public:
   // Without an own range: failure, and the outputs become 0, 4294967295 and
   // 3600.

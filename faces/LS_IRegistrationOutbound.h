@@ -10,6 +10,8 @@
 // Configuration goes through LS_IRegistrationOutboundConfig.
 #pragma once
 
+#include "Export.h"
+
 #include "CHostPort.h"
 #include "LS_Interface.h"
 #include "LS_InterfaceIdentifiers.h"
@@ -19,7 +21,7 @@
 #include "LS_UriScheme.h"
 #include "XCode.h"
 
-class LS_IRegistrationOutbound : public LS_Interface<LS_IRegistrationOutboundIdentifiers> {
+class LS_EXPORT LS_IRegistrationOutbound : public LS_Interface<LS_IRegistrationOutboundIdentifiers> {
  public:
   // The configured pair, inherited included; the dynamic registrar is not
   // consulted.

@@ -10,6 +10,8 @@
 // LS_IRegistrationOutbound. Setters and removers cannot fail.
 #pragma once
 
+#include "Export.h"
+
 #include "CHostPort.h"
 #include "LS_Interface.h"
 #include "LS_InterfaceIdentifiers.h"
@@ -19,7 +21,7 @@
 #include "LS_UriScheme.h"
 #include "XCode.h"
 
-class LS_IRegistrationOutboundConfig : public LS_Interface<LS_IRegistrationOutboundConfigIdentifiers> {
+class LS_EXPORT LS_IRegistrationOutboundConfig : public LS_Interface<LS_IRegistrationOutboundConfigIdentifiers> {
  public:
   // Fails unless this face holds both addresses; registrar may be filled
   // already when only the TLS address is missing.

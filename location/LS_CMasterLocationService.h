@@ -19,6 +19,8 @@
 // Finding the service responsible for a host belongs to the lookups.
 #pragma once
 
+#include "Export.h"
+
 #include "CDriver.h"
 #include "CInherit.h"
 #include "IInfo.h"
@@ -28,7 +30,7 @@
 #include "ObserverContainer.h"
 #include "StringHashTable.h"
 
-class LS_CMasterLocationService : public CInherit<LS_CMasterLocationService,
+class LS_EXPORT LS_CMasterLocationService : public CInherit<LS_CMasterLocationService,
                                                   CDriver,
                                                   LS_IMasterLocationService,
                                                   LS_IMasterLocationServiceSubject,

@@ -6,6 +6,8 @@
 // LS_IIdentityConfig, the notifications to the three face subjects.
 #pragma once
 
+#include "Export.h"
+
 #include "IUnknown.h"
 #include "LS_IdentityFace.h"
 #include "LS_IdentityType.h"
@@ -16,7 +18,7 @@
 #include "String.h"
 #include "XCode.h"
 
-class LS_IIdentity : public LS_Interface<LS_IIdentityIdentifiers> {
+class LS_EXPORT LS_IIdentity : public LS_Interface<LS_IIdentityIdentifiers> {
  public:
   virtual String getName() const = 0;
   // Failure, and base null, when the identity has no base identity.

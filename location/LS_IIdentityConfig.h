@@ -9,6 +9,8 @@
 // belongs to the location service.
 #pragma once
 
+#include "Export.h"
+
 #include "IUnknown.h"
 #include "LS_IdentityFace.h"
 #include "LS_IdentityType.h"
@@ -21,7 +23,7 @@
 
 class LS_ILocationServiceConfig;
 
-class LS_IIdentityConfig : public LS_Interface<LS_IIdentityConfigIdentifiers> {
+class LS_EXPORT LS_IIdentityConfig : public LS_Interface<LS_IIdentityConfigIdentifiers> {
  public:
   virtual String getConfigName() const = 0;
   // Renames the identity only: the location service keeps listing it under

@@ -5,6 +5,8 @@
 // belongs to LS_ILocationServiceConfig.
 #pragma once
 
+#include "Export.h"
+
 #include "CHostPort.h"
 #include "IUnknown.h"
 #include "LS_Imperative.h"
@@ -15,7 +17,7 @@
 #include "Vector.h"
 #include "XCode.h"
 
-class LS_ILocationService : public LS_Interface<LS_ILocationServiceIdentifiers> {
+class LS_EXPORT LS_ILocationService : public LS_Interface<LS_ILocationServiceIdentifiers> {
  public:
   virtual String getName() const = 0;
   virtual LS_Imperative::Type getImperative() const = 0;

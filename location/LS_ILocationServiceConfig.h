@@ -9,6 +9,8 @@
 // owning location services to the master.
 #pragma once
 
+#include "Export.h"
+
 #include "CHostPort.h"
 #include "IUnknown.h"
 #include "LS_IdentityType.h"
@@ -20,7 +22,7 @@
 #include "Vector.h"
 #include "XCode.h"
 
-class LS_ILocationServiceConfig : public LS_Interface<LS_ILocationServiceConfigIdentifiers> {
+class LS_EXPORT LS_ILocationServiceConfig : public LS_Interface<LS_ILocationServiceConfigIdentifiers> {
  public:
   virtual String getConfigName() const = 0;
   virtual void setConfigName(String const& name) = 0;

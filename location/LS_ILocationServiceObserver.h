@@ -4,11 +4,13 @@
 // them.
 #pragma once
 
+#include "Export.h"
+
 #include "ObserverEvent.h"
 
 class LS_ILocationService;
 
-class LS_ILocationServiceObserver {
+class LS_EXPORT LS_ILocationServiceObserver {
  public:
   // Each event is an LS_ILocationServiceSubject::EvIdentity. A configured
   // identity that takes over a dynamic one is not added again.

@@ -2,6 +2,8 @@
 // identities coming and going. The event names the identity concerned.
 #pragma once
 
+#include "Export.h"
+
 #include <memory>
 
 #include "LS_IIdentity.h"
@@ -12,7 +14,7 @@
 #include "ObserverEvent.h"
 #include "RefPtr.h"
 
-class LS_ILocationServiceSubject : public LS_Interface<LS_ILocationServiceSubjectIdentifiers> {
+class LS_EXPORT LS_ILocationServiceSubject : public LS_Interface<LS_ILocationServiceSubjectIdentifiers> {
  public:
   // Holds the identity by a counted reference, so that a removed identity
   // lives at least until every observer has seen it.

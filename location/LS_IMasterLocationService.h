@@ -4,6 +4,8 @@
 // belongs to the lookups.
 #pragma once
 
+#include "Export.h"
+
 #include "IUnknown.h"
 #include "LS_Interface.h"
 #include "LS_InterfaceIdentifiers.h"
@@ -12,7 +14,7 @@
 #include "Vector.h"
 #include "XCode.h"
 
-class LS_IMasterLocationService : public LS_Interface<LS_IMasterLocationServiceIdentifiers> {
+class LS_EXPORT LS_IMasterLocationService : public LS_Interface<LS_IMasterLocationServiceIdentifiers> {
  public:
   virtual XCode getLocationServiceIf(String const& name, UUID const& iid, void** out) = 0;
   // Creates the service when the name is new, then as getLocationServiceIf.

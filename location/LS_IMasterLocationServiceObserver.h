@@ -3,11 +3,13 @@
 // IUnknown: the master borrows its observers and never counts them.
 #pragma once
 
+#include "Export.h"
+
 #include "ObserverEvent.h"
 
 class LS_IMasterLocationService;
 
-class LS_IMasterLocationServiceObserver {
+class LS_EXPORT LS_IMasterLocationServiceObserver {
  public:
   // Each event is an LS_IMasterLocationServiceSubject::EvLocationService.
   virtual void onLocationServiceAdded(ObserverEvent<LS_IMasterLocationService>& event) = 0;

@@ -3,6 +3,8 @@
 // location service concerned.
 #pragma once
 
+#include "Export.h"
+
 #include <memory>
 
 #include "LS_ILocationService.h"
@@ -13,7 +15,7 @@
 #include "ObserverEvent.h"
 #include "RefPtr.h"
 
-class LS_IMasterLocationServiceSubject : public LS_Interface<LS_IMasterLocationServiceSubjectIdentifiers> {
+class LS_EXPORT LS_IMasterLocationServiceSubject : public LS_Interface<LS_IMasterLocationServiceSubjectIdentifiers> {
  public:
   // Holds the location service by a counted reference, so that a removed
   // service lives at least until every observer has seen it.

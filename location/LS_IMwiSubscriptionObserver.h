@@ -3,11 +3,13 @@
 // IUnknown: the identity borrows its observers and never counts them.
 #pragma once
 
+#include "Export.h"
+
 #include "ObserverEvent.h"
 
 class LS_IMwiSubscription;
 
-class LS_IMwiSubscriptionObserver {
+class LS_EXPORT LS_IMwiSubscriptionObserver {
  public:
   // The identity's subscription settings, own or inherited, may have
   // changed; event is an LS_IMwiSubscriptionSubject::EvIdentity.

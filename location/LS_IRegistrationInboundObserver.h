@@ -3,11 +3,13 @@
 // IUnknown: the identity borrows its observers and never counts them.
 #pragma once
 
+#include "Export.h"
+
 #include "ObserverEvent.h"
 
 class LS_IRegistrationInbound;
 
-class LS_IRegistrationInboundObserver {
+class LS_EXPORT LS_IRegistrationInboundObserver {
  public:
   // Each event is an LS_IRegistrationInboundSubject::EvIdentity. A change
   // of the settings or contacts, own or inherited:

@@ -3,11 +3,13 @@
 // IUnknown: the identity borrows its observers and never counts them.
 #pragma once
 
+#include "Export.h"
+
 #include "ObserverEvent.h"
 
 class LS_IRegistrationOutbound;
 
-class LS_IRegistrationOutboundObserver {
+class LS_EXPORT LS_IRegistrationOutboundObserver {
  public:
   // The identity's outbound-registration settings, own or inherited, may
   // have changed; event is an LS_IRegistrationOutboundSubject::EvIdentity.

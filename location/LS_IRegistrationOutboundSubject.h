@@ -5,6 +5,8 @@
 // the identity.
 #pragma once
 
+#include "Export.h"
+
 #include <memory>
 
 #include "LS_IIdentity.h"
@@ -15,7 +17,7 @@
 #include "ObserverEvent.h"
 #include "RefPtr.h"
 
-class LS_IRegistrationOutboundSubject : public LS_Interface<LS_IRegistrationOutboundSubjectIdentifiers> {
+class LS_EXPORT LS_IRegistrationOutboundSubject : public LS_Interface<LS_IRegistrationOutboundSubjectIdentifiers> {
  public:
   // Holds the identity by a counted reference, so an observer may drop
   // every other reference to it while the event is being delivered.

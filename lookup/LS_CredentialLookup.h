@@ -16,6 +16,8 @@
 // failure leave the question's outputs empty.
 #pragma once
 
+#include "Export.h"
+
 #include "CHostPort.h"
 #include "CNameAddr.h"
 #include "LS_Authenticate.h"
@@ -35,7 +37,7 @@
 // The credentials of userName in the service, else its "DEFAULT" ones (then
 // out.userName is "DEFAULT"). out is written only on success, so a failed
 // lookup does not leave a service in it without a password.
-XCode LS_getCredentials(String& error,
+LS_EXPORT XCode LS_getCredentials(String& error,
                         LS_Credentials& out,
                         String const& authenticationService,
                         String const& userName,
@@ -43,25 +45,25 @@ XCode LS_getCredentials(String& error,
 
 // Appends the face's readable entries, base entries first; a null face
 // appends nothing.
-void LS_getIdentityAuthenticates(Vector<LS_Authenticate>& out, LS_IAuthentication* face);
+LS_EXPORT void LS_getIdentityAuthenticates(Vector<LS_Authenticate>& out, LS_IAuthentication* face);
 // Appends the identity's outbound entries (type 0), inbound entries (type 1)
 // or, for any other value, both in that order. An identity without such a
 // face, own or inherited, appends nothing and succeeds.
-XCode LS_getIdentityAuthenticates(String& error,
+LS_EXPORT XCode LS_getIdentityAuthenticates(String& error,
                                   Vector<LS_Authenticate>& out,
                                   LS_IIdentity* identity,
                                   LS_AuthenticationType::Type type);
-XCode LS_getIdentityOutboundAuthenticates(String& error, Vector<LS_Authenticate>& out, LS_IIdentity* identity);
+LS_EXPORT XCode LS_getIdentityOutboundAuthenticates(String& error, Vector<LS_Authenticate>& out, LS_IIdentity* identity);
 
 // The realms of the services that the inbound entries resolve to, each
 // with its service's protocol, in entry and realm order, without repeating
 // a pair. Entries that resolve to nothing are skipped (their message stays
 // in error) and the result is still success.
-XCode LS_getInboundAuthenticationChallenge(String& error,
+LS_EXPORT XCode LS_getInboundAuthenticationChallenge(String& error,
                                            Vector<LS_ProtocolRealm>& out,
                                            LS_IIdentity* identity,
                                            LS_IMasterAuthenticationService* authenticationMaster);
-XCode LS_getInboundAuthenticationChallenge(String& error,
+LS_EXPORT XCode LS_getInboundAuthenticationChallenge(String& error,
                                            Vector<LS_ProtocolRealm>& out,
                                            CNameAddr const& nameAddr,
                                            bool useDefault,
@@ -69,7 +71,7 @@ XCode LS_getInboundAuthenticationChallenge(String& error,
                                            LS_Imperative::Type imperative,
                                            LS_IMasterLocationService* master,
                                            LS_IMasterAuthenticationService* authenticationMaster);
-XCode LS_getInboundAuthenticationChallenge(String& error,
+LS_EXPORT XCode LS_getInboundAuthenticationChallenge(String& error,
                                            Vector<LS_ProtocolRealm>& out,
                                            CNameAddr const& nameAddr,
                                            Vector<String> const& names,
@@ -82,7 +84,7 @@ XCode LS_getInboundAuthenticationChallenge(String& error,
 // The passwords of the inbound entries whose service answers (protocol,
 // realm): those held under userName, and "DEFAULT" ones when userName is
 // the user of nameAddr's URI. Duplicates stay. Finding none is success.
-XCode LS_getInboundAuthenticationResponse(String& error,
+LS_EXPORT XCode LS_getInboundAuthenticationResponse(String& error,
                                           Vector<String>& passwords,
                                           LS_IIdentity* identity,
                                           CNameAddr const& nameAddr,
@@ -90,7 +92,7 @@ XCode LS_getInboundAuthenticationResponse(String& error,
                                           String const& realm,
                                           String const& userName,
                                           LS_IMasterAuthenticationService* authenticationMaster);
-XCode LS_getInboundAuthenticationResponse(String& error,
+LS_EXPORT XCode LS_getInboundAuthenticationResponse(String& error,
                                           Vector<String>& passwords,
                                           CNameAddr const& nameAddr,
                                           LS_AuthenticationProtocol::Type protocol,
@@ -101,7 +103,7 @@ XCode LS_getInboundAuthenticationResponse(String& error,
                                           LS_Imperative::Type imperative,
                                           LS_IMasterLocationService* master,
                                           LS_IMasterAuthenticationService* authenticationMaster);
-XCode LS_getInboundAuthenticationResponse(String& error,
+LS_EXPORT XCode LS_getInboundAuthenticationResponse(String& error,
                                           Vector<String>& passwords,
                                           CNameAddr const& nameAddr,
                                           LS_AuthenticationProtocol::Type protocol,
@@ -118,7 +120,7 @@ XCode LS_getInboundAuthenticationResponse(String& error,
 // answers (protocol, realm), unless a later entry's service lists the realm
 // itself: such an exact match wins and ends the search. Credentials held
 // under "DEFAULT" present the user of nameAddr's URI as user name.
-XCode LS_getOutboundAuthenticationCredentials(String& error,
+LS_EXPORT XCode LS_getOutboundAuthenticationCredentials(String& error,
                                               String& userName,
                                               String& password,
                                               LS_IIdentity* identity,
@@ -126,7 +128,7 @@ XCode LS_getOutboundAuthenticationCredentials(String& error,
                                               LS_AuthenticationProtocol::Type protocol,
                                               String const& realm,
                                               LS_IMasterAuthenticationService* authenticationMaster);
-XCode LS_getOutboundAuthenticationCredentials(String& error,
+LS_EXPORT XCode LS_getOutboundAuthenticationCredentials(String& error,
                                               String& userName,
                                               String& password,
                                               CNameAddr const& nameAddr,
@@ -137,7 +139,7 @@ XCode LS_getOutboundAuthenticationCredentials(String& error,
                                               LS_Imperative::Type imperative,
                                               LS_IMasterLocationService* master,
                                               LS_IMasterAuthenticationService* authenticationMaster);
-XCode LS_getOutboundAuthenticationCredentials(String& error,
+LS_EXPORT XCode LS_getOutboundAuthenticationCredentials(String& error,
                                               String& userName,
                                               String& password,
                                               CNameAddr const& nameAddr,

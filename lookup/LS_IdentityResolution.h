@@ -17,6 +17,8 @@
 // "GW" pass the domain test and fail the own-host test.
 #pragma once
 
+#include "Export.h"
+
 #include "CHostPort.h"
 #include "CNameAddr.h"
 #include "LS_IIdentity.h"
@@ -39,7 +41,7 @@
 // value is no host-port (a global-number context such as "+49"). Without a
 // URI: failure, error untouched; any other scheme: failure with
 // "CANNOT PROCESS UNKNOWN URI; MUST BE A SIP, SIPS OR TEL URI".
-XCode LS_splitNameAddr(String& error, String& user, CHostPort& host, CNameAddr const& nameAddr);
+LS_EXPORT XCode LS_splitNameAddr(String& error, String& user, CHostPort& host, CNameAddr const& nameAddr);
 
 // The identity of user inside locationService: the identity of that name,
 // else the first identity (configured ones, then dynamic ones) that is
@@ -47,7 +49,7 @@ XCode LS_splitNameAddr(String& error, String& user, CHostPort& host, CNameAddr c
 // identity "DEFAULT". Only identities of type "Identity" answer a user and
 // only an "Identity-Group" answers as "DEFAULT". out is written only on
 // success; a null service fails.
-XCode LS_getIdentityOrAliasIf(RefPtr<LS_ILocationService> locationService,
+LS_EXPORT XCode LS_getIdentityOrAliasIf(RefPtr<LS_ILocationService> locationService,
                               String const& user,
                               bool useDefault,
                               RefPtr<LS_IIdentity>& out);
@@ -62,7 +64,7 @@ XCode LS_getIdentityOrAliasIf(RefPtr<LS_ILocationService> locationService,
 // every service. A name that is no location service is skipped, leaving
 // "LOCATION-SERVICE '%s' DOES NOT EXIST" in error. out is written only on
 // success.
-XCode LS_getIdentity(String& error,
+LS_EXPORT XCode LS_getIdentity(String& error,
                      RefPtr<LS_IIdentity>& out,
                      CNameAddr const& nameAddr,
                      Vector<String> const& names,
@@ -71,7 +73,7 @@ XCode LS_getIdentity(String& error,
                      LS_Imperative::Type imperative,
                      LS_IMasterLocationService* master);
 // The same over all location services of the master, in creation order.
-XCode LS_getIdentity(String& error,
+LS_EXPORT XCode LS_getIdentity(String& error,
                      RefPtr<LS_IIdentity>& out,
                      CNameAddr const& nameAddr,
                      bool useDefault,
@@ -83,4 +85,4 @@ XCode LS_getIdentity(String& error,
 // empty nor contains "*" anywhere, port included. Fails, leaving out alone,
 // for a null identity, one without location service, or when no domain
 // qualifies. The exported name is spelled as the SIP stack links to it.
-XCode LS_getFristPlainDomanin(CHostPort& out, LS_IIdentity* identity);
+LS_EXPORT XCode LS_getFristPlainDomanin(CHostPort& out, LS_IIdentity* identity);

@@ -12,6 +12,8 @@
 // that outlives the call except the references handed back.
 #pragma once
 
+#include "Export.h"
+
 #include "CHostPort.h"
 #include "LS_IAuthenticationService.h"
 #include "LS_ILocationService.h"
@@ -23,14 +25,14 @@
 #include "Vector.h"
 #include "XCode.h"
 
-XCode LS_getMasterLocationService(String& error, RefPtr<LS_IMasterLocationService>& out);
-XCode LS_getMasterAuthenticationService(String& error, RefPtr<LS_IMasterAuthenticationService>& out);
+LS_EXPORT XCode LS_getMasterLocationService(String& error, RefPtr<LS_IMasterLocationService>& out);
+LS_EXPORT XCode LS_getMasterAuthenticationService(String& error, RefPtr<LS_IMasterAuthenticationService>& out);
 
-XCode LS_getLocationService(String& error,
+LS_EXPORT XCode LS_getLocationService(String& error,
                             RefPtr<LS_ILocationService>& out,
                             String const& name,
                             LS_IMasterLocationService* master);
-XCode LS_getAuthenticationService(String& error,
+LS_EXPORT XCode LS_getAuthenticationService(String& error,
                                   RefPtr<LS_IAuthenticationService>& out,
                                   String const& name,
                                   LS_IMasterAuthenticationService* master);
@@ -42,7 +44,7 @@ XCode LS_getAuthenticationService(String& error,
 // domains and localHostPorts together, as in the first pass. Services less
 // authoritative than imperative take part in the second pass only. A name
 // that does not resolve is skipped without a message.
-XCode LS_getLocationService(String& error,
+LS_EXPORT XCode LS_getLocationService(String& error,
                             RefPtr<LS_ILocationService>& out,
                             CHostPort const& host,
                             Vector<String> const& names,
@@ -50,7 +52,7 @@ XCode LS_getLocationService(String& error,
                             LS_Imperative::Type imperative,
                             LS_IMasterLocationService* master);
 // The same among all location services of the master, in creation order.
-XCode LS_getLocationService(String& error,
+LS_EXPORT XCode LS_getLocationService(String& error,
                             RefPtr<LS_ILocationService>& out,
                             CHostPort const& host,
                             Vector<CHostPort> const& localHostPorts,

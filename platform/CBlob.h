@@ -3,9 +3,11 @@
 // and no encoding or text handling belongs here.
 #pragma once
 
+#include "Export.h"
+
 #include <vector>
 
-class CBlob {
+class LS_EXPORT CBlob {
  public:
   CBlob() = default;
 

@@ -8,10 +8,12 @@
 // lock, as for every CObject, is borrowed and may be null.
 #pragma once
 
+#include "Export.h"
+
 #include "CInherit.h"
 #include "IDriver.h"
 
-class CDriver : public CInherit<CDriver, CObject, IDriver> {
+class LS_EXPORT CDriver : public CInherit<CDriver, CObject, IDriver> {
  public:
   CDriver(UUID const& did, String const& name, Lock* lock);
 

@@ -10,6 +10,8 @@
 // drivers may be registered and looked up from any thread.
 #pragma once
 
+#include "Export.h"
+
 #include "CInherit.h"
 #include "IDriver.h"
 #include "IDriverRepository.h"
@@ -17,7 +19,7 @@
 #include "RefPtr.h"
 #include "StringHashTable.h"
 
-class CDriverRepository : public CInherit<CDriverRepository, CObject, IDriverRepository> {
+class LS_EXPORT CDriverRepository : public CInherit<CDriverRepository, CObject, IDriverRepository> {
  public:
   CDriverRepository();
   ~CDriverRepository() override;

@@ -4,6 +4,8 @@
 // for dumps belong to the catalogue.
 #pragma once
 
+#include "Export.h"
+
 #include <cstddef>
 
 #include "CString.h"
@@ -15,7 +17,7 @@
 // the host text ignoring ASCII case, since SIP compares hosts without regard
 // to case: a request for "Example.COM" reaches the domain "example.com". The
 // host is still kept and printed as written.
-class CHostPort {
+class LS_EXPORT CHostPort {
  public:
   // The port value that is not printed. The stand-in has no separate "use
   // the SIP default port" state: a port that was not given is exactly the

@@ -5,6 +5,8 @@
 // header that carries the address and are not accepted here.
 #pragma once
 
+#include "Export.h"
+
 #include <cstddef>
 
 #include "CBlob.h"
@@ -21,7 +23,7 @@
 // the binding. No SIP URI comparison rules (case of the host, order of
 // parameters) are applied, so a URI equals exactly the text it was
 // registered with.
-class CNameAddr {
+class LS_EXPORT CNameAddr {
  public:
   // Values of GetUriKind().
   enum : unsigned int {

@@ -7,11 +7,13 @@
 // CObject answers queryInterface for IUnknown only; CInherit adds the rest.
 #pragma once
 
+#include "Export.h"
+
 #include <atomic>
 
 #include "IUnknown.h"
 
-class CObject : public IUnknown {
+class LS_EXPORT CObject : public IUnknown {
  public:
   explicit CObject(Lock* lock = nullptr) : m_lock(lock) {}
   virtual ~CObject() = default;

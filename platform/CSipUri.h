@@ -4,12 +4,14 @@
 // URIs and building them belong elsewhere (CNameAddr keeps the URI text).
 #pragma once
 
+#include "Export.h"
+
 #include <cstddef>
 
 #include "CHostPort.h"
 #include "CString.h"
 
-class CSipUri {
+class LS_EXPORT CSipUri {
  public:
   CSipUri() = default;
 

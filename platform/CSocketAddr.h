@@ -3,9 +3,11 @@
 // addresses only; name resolution and socket handling do not belong here.
 #pragma once
 
+#include "Export.h"
+
 #include "CString.h"
 
-class CSocketAddr {
+class LS_EXPORT CSocketAddr {
  public:
   // Values of GetKind().
   enum : unsigned int {

@@ -6,10 +6,12 @@
 // library's String and any other text processing belong to the callers.
 #pragma once
 
+#include "Export.h"
+
 #include <cstddef>
 #include <string>
 
-class CString {
+class LS_EXPORT CString {
  public:
   CString() = default;
   // A null pointer gives the empty text.

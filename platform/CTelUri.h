@@ -4,11 +4,13 @@
 // country code) does not belong here.
 #pragma once
 
+#include "Export.h"
+
 #include <cstddef>
 
 #include "CString.h"
 
-class CTelUri {
+class LS_EXPORT CTelUri {
  public:
   CTelUri() = default;
 

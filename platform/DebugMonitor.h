@@ -10,11 +10,13 @@
 // switches it off; the sink is swapped under the monitor's mutex.
 #pragma once
 
+#include "Export.h"
+
 #include <atomic>
 #include <functional>
 #include <mutex>
 
-class DebugMonitor {
+class LS_EXPORT DebugMonitor {
  public:
   using Sink = std::function<void(char const* line)>;
   static constexpr unsigned int kChannels = 64;

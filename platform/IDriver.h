@@ -4,13 +4,15 @@
 // to CDriver.
 #pragma once
 
+#include "Export.h"
+
 #include "IUnknown.h"
 #include "String.h"
 #include "UUID.h"
 
 class IDriverRepository;
 
-class IDriver : public IUnknown {
+class LS_EXPORT IDriver : public IUnknown {
  public:
   static UUID const& IID();
 

@@ -4,12 +4,14 @@
 // through SYSTEM::DRIVER_REPOSITORY().
 #pragma once
 
+#include "Export.h"
+
 #include "IUnknown.h"
 #include "String.h"
 #include "UUID.h"
 #include "XCode.h"
 
-class IDriverRepository : public IUnknown {
+class LS_EXPORT IDriverRepository : public IUnknown {
  public:
   static UUID const& IID();
 

@@ -2,12 +2,14 @@
 // The lines and their rendering belong to InfoContainer.
 #pragma once
 
+#include "Export.h"
+
 #include "IUnknown.h"
 #include "InfoContainer.h"
 #include "String.h"
 #include "UUID.h"
 
-class IInfo : public IUnknown {
+class LS_EXPORT IInfo : public IUnknown {
  public:
   static UUID const& IID();
 

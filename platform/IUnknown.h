@@ -5,6 +5,8 @@
 // released, never deleted through an interface pointer.
 #pragma once
 
+#include "Export.h"
+
 #include "Lock.h"
 #include "RefPtr.h"
 #include "UUID.h"
@@ -13,8 +15,8 @@
 class IUnknown;
 
 // Identifier of IUnknown, and the class identifier that names no class.
-UUID const& IID_Unknown();
-UUID const& CID_Unknown();
+LS_EXPORT UUID const& IID_Unknown();
+LS_EXPORT UUID const& CID_Unknown();
 
 // Runs call(T::IID(), &raw) and lets out adopt whatever the callee stored in
 // raw: the callee hands an interface out with a reference already added, or
@@ -28,7 +30,7 @@ XCode adoptInterface(RefPtr<T>& out, Call&& call) {
   return result;
 }
 
-class IUnknown {
+class LS_EXPORT IUnknown {
  public:
   static UUID const& IID() { return IID_Unknown(); }
 

@@ -5,12 +5,14 @@
 // not here.
 #pragma once
 
+#include "Export.h"
+
 #include <cstddef>
 
 #include "String.h"
 #include "Vector.h"
 
-class InfoContainer {
+class LS_EXPORT InfoContainer {
  public:
   struct Line {
     unsigned int level;

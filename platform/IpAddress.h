@@ -3,13 +3,15 @@
 // Matching peers against rules belongs to the SIP side, not here.
 #pragma once
 
+#include "Export.h"
+
 #include "String.h"
 
 // A value type in the utility library's style. The net mask must be of the
 // address's family and contiguous (ones, then zeros): a filter rule stands
 // for a subnet, and a mask with holes is almost always a typing error that
 // would silently admit or block unrelated peers.
-class IpAddress {
+class LS_EXPORT IpAddress {
  public:
   // Empty: any address.
   IpAddress() = default;

@@ -3,9 +3,11 @@
 // system have none (a null Lock*), and LockedPtr then locks nothing.
 #pragma once
 
+#include "Export.h"
+
 #include <mutex>
 
-class Lock {
+class LS_EXPORT Lock {
  public:
   void lock() { m_mutex.lock(); }
   void unlock() { m_mutex.unlock(); }

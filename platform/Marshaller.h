@@ -4,7 +4,9 @@
 // belong here.
 #pragma once
 
-class Marshaller {
+#include "Export.h"
+
+class LS_EXPORT Marshaller {
  public:
   Marshaller() = default;
   Marshaller(Marshaller const&) = default;

@@ -10,6 +10,8 @@
 // backreferences or lookaround does not compile.
 #pragma once
 
+#include "Export.h"
+
 #include <atomic>
 #include <memory>
 
@@ -17,7 +19,7 @@
 #include "String.h"
 #include "XCode.h"
 
-class RegEx {
+class LS_EXPORT RegEx {
  public:
   // A compiled expression. Created by COMPILE_EXPRESSION with a count of 1,
   // adopted by the RefPtr it returns; dies at its last release. Immutable

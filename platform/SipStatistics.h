@@ -3,12 +3,14 @@
 // counters of the stack and any reporting of them do not belong here.
 #pragma once
 
+#include "Export.h"
+
 #include <atomic>
 
 // One object per process, s_sipStatistics. The counter is atomic because
 // several threads register and unregister contacts at once; each call is
 // one indivisible step, and nothing orders it against other memory.
-class SipStatistics {
+class LS_EXPORT SipStatistics {
  public:
   constexpr SipStatistics() = default;
   SipStatistics(SipStatistics const&) = delete;
@@ -25,4 +27,4 @@ class SipStatistics {
 
 // Constant-initialised, so it is usable from other objects' static
 // initialisation and destruction.
-extern SipStatistics s_sipStatistics;
+extern LS_EXPORT SipStatistics s_sipStatistics;

@@ -4,10 +4,12 @@
 // Character-set conversions and case folding do not belong here.
 #pragma once
 
+#include "Export.h"
+
 #include <cstddef>
 #include <string>
 
-class String {
+class LS_EXPORT String {
  public:
   // The shared empty text, for operations that hand out a reference.
   static String const s_empty;

@@ -8,14 +8,16 @@
 // the repository before, and removes it after, anything can look drivers up.
 #pragma once
 
+#include "Export.h"
+
 #include "IDriverRepository.h"
 
 namespace SYSTEM {
 
 // The installed repository, or null when none is.
-IDriverRepository* DRIVER_REPOSITORY();
+LS_EXPORT IDriverRepository* DRIVER_REPOSITORY();
 // Installs repository in place of the current one, which is released; null
 // removes it.
-void SET_DRIVER_REPOSITORY(IDriverRepository* repository);
+LS_EXPORT void SET_DRIVER_REPOSITORY(IDriverRepository* repository);
 
 }  // namespace SYSTEM

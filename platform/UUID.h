@@ -7,7 +7,9 @@
 // bytes alone; the name is commentary and is shared, not copied, by copies.
 #pragma once
 
-class UUID {
+#include "Export.h"
+
+class LS_EXPORT UUID {
  public:
   // The nil identifier (all zero), with an empty name.
   UUID() = default;

@@ -2,9 +2,11 @@
 // a message for people; code decides on isSuccess()/isFailure() only.
 #pragma once
 
+#include "Export.h"
+
 #include "String.h"
 
-class XCode {
+class LS_EXPORT XCode {
  public:
   // Success.
   XCode() = default;
