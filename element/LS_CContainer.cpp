@@ -5,19 +5,10 @@
 
 namespace {
 
-// Moves the entry of name out of table into element; false when absent.
-bool take(StringHashTable<RefPtr<LS_IElement>>& table, String const& name, RefPtr<LS_IElement>& element) {
-  RefPtr<LS_IElement>* const found = table.get(name);
-  if (!found)
-    return false;
-  element = *found;
-  table.remove(name);
-  return true;
-}
 
-void appendNames(StringHashTable<RefPtr<LS_IElement>> const& table, Vector<String>& names) {
+void appendNames(LS_ElementTable const& table, Vector<String>& names) {
   for (auto const& entry : table)
-    names.add(entry.key);
+    names.add(entry.key());
 }
 
 // The child the base container shows under name (local or its own shadow).
@@ -94,14 +85,16 @@ void LS_CContainer::getElements(LS_Strategy::Type strategy, Vector<String>& name
 void LS_CContainer::addElement(String const& name, LS_IElement* element) {
   LS_DEBUG("LS_CElement(%p)::addElement(%s, %p)\n", logAddress(), name.c_str(), LS_ptr(element));
   RefPtr<LS_IElement> shadow;
-  if (take(m_shadowElements, name, shadow)) {
+  LS_ElementName shared;
+  bool const replacesShadow = m_shadowElements.take(name, shadow, &shared);
+  if (replacesShadow) {
     // The new child takes the shadow's place in the inheritance chain.
     RefPtr<LS_IElement> inherited;
     if (LockedPtr<LS_IElement>(shadow)->getBase(inherited).isSuccess())
       LockedPtr<LS_IElement>(element)->setBase(inherited.get());
     LockedPtr<LS_IElement>(shadow)->removeElementObserver(asElementObserver());
   }
-  m_localElements.add(name, element);
+  m_localElements.add(replacesShadow ? std::move(shared) : LS_ElementName(name), element);
   LockedPtr<LS_IElement>(element)->addElementObserver(asElementObserver(), 0);
   notifyElementAdd(name);
 }
@@ -109,13 +102,14 @@ void LS_CContainer::addElement(String const& name, LS_IElement* element) {
 void LS_CContainer::removeElement(String const& name) {
   LS_DEBUG("LS_CElement(%p)::removeElement(%s)\n", logAddress(), name.c_str());
   RefPtr<LS_IElement> child;
-  if (!take(m_localElements, name, child))
+  LS_ElementName shared;
+  if (!m_localElements.take(name, child, &shared))
     return;
   RefPtr<LS_IElement> inherited;
   if (LockedPtr<LS_IElement>(child)->getBase(inherited).isSuccess()) {
     // Still inherited: back to a shadow that reads through to its base. The
     // reset announces the change; nothing is removed.
-    m_shadowElements.add(name, child);
+    m_shadowElements.add(std::move(shared), child.get());
     LockedPtr<LS_IElement>(child)->reset();
     return;
   }
@@ -179,10 +173,11 @@ void LS_CContainer::follow(RefPtr<LS_IContainer> const& base) {
     else
       destroyShadowElement(name);
   }
+  m_shadowElements.reserve(m_shadowElements.size() + baseNames.size());
   for (String const& name : baseNames) {
     RefPtr<LS_IElement> const inherited = childOf(base, name);
     if (inherited && !m_localElements.contains(name) && !m_shadowElements.contains(name))
-      createShadowElement(name, inherited.get());
+      createShadowElement(name, inherited.get(), base.get());
   }
 }
 
@@ -206,7 +201,7 @@ void LS_CContainer::onChange(ObserverEvent<LS_IElement>& event) {
   for (ElementTable const* table : {&m_localElements, &m_shadowElements}) {
     for (auto const& entry : *table) {
       if (entry.value.get() == event.getSubject())
-        changed.add(entry.key);
+        changed.add(entry.key());
     }
   }
   for (String const& name : changed)
@@ -232,7 +227,7 @@ void LS_CContainer::onElementAdd(ObserverEvent<LS_IContainer>& event) {
     LockedPtr<LS_IElement>(*shadow)->setBase(inherited.get());
     return;
   }
-  createShadowElement(added->name, inherited.get());
+  createShadowElement(added->name, inherited.get(), event.getSubject());
 }
 
 void LS_CContainer::onElementRemove(ObserverEvent<LS_IContainer>& event) {
@@ -275,7 +270,18 @@ void LS_CContainer::onElementAdd(String const&) {}
 void LS_CContainer::onElementRemove(String const&) {}
 void LS_CContainer::onElementChange(String const&) {}
 
-XCode LS_CContainer::createShadowElement(String const& name, LS_IElement* baseElement) {
+LS_ElementName LS_CContainer::sharedNameOf(LS_IContainer* base, String const& name) {
+  auto const* const container = dynamic_cast<LS_CContainer const*>(base);
+  if (!container)
+    return LS_ElementName(name);
+  for (ElementTable const* table : {&container->m_localElements, &container->m_shadowElements}) {
+    if (LS_ElementName const* found = table->nameOf(name))
+      return *found;
+  }
+  return LS_ElementName(name);
+}
+
+XCode LS_CContainer::createShadowElement(String const& name, LS_IElement* baseElement, LS_IContainer* base) {
   LS_DEBUG("LS_CElement(%p)::createShadowElement(%s, %p)\n", logAddress(), name.c_str(), LS_ptr(baseElement));
   if (m_shadowElements.contains(name))
     return XCode::failure();
@@ -284,7 +290,7 @@ XCode LS_CContainer::createShadowElement(String const& name, LS_IElement* baseEl
   if (result.isFailure() || !shadow)
     return XCode::failure();
   LockedPtr<LS_IElement>(shadow)->setBase(baseElement);
-  m_shadowElements.add(name, shadow);
+  m_shadowElements.add(sharedNameOf(base, name), shadow.get());
   LockedPtr<LS_IElement>(shadow)->addElementObserver(asElementObserver(), 0);
   notifyElementAdd(name);
   return XCode::success();
@@ -293,7 +299,7 @@ XCode LS_CContainer::createShadowElement(String const& name, LS_IElement* baseEl
 void LS_CContainer::destroyShadowElement(String const& name) {
   LS_DEBUG("LS_CElement(%p)::destroyShadowElement(%s)\n", logAddress(), name.c_str());
   RefPtr<LS_IElement> shadow;
-  if (!take(m_shadowElements, name, shadow))
+  if (!m_shadowElements.take(name, shadow))
     return;
   LockedPtr<LS_IElement>(shadow)->removeElementObserver(asElementObserver());
   notifyElementRemove(name, shadow.get());

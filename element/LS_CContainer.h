@@ -16,6 +16,15 @@
 // dropped, so an override in the middle of a chain would never reach the
 // bottom.
 //
+// Decision: shadows are made when their name appears in the base, not when
+// first asked for. Making one is observable even when nobody asks for it:
+// its creation is announced to the container's observers and hooks (an
+// identity turns that into registration events), it logs its creation and
+// registrations with its own address, and each change of its base reaches
+// the container through it, with log lines that name it. A shadow made
+// later would have to replay all of that, so the memory is saved in what a
+// shadow carries instead (see LS_ElementTable and ObserverContainer).
+//
 // Ownership: the container dies with its last reference and releases its
 // children then, telling nobody. Subclasses (identity, faces) react to child
 // events through the three hooks, which run before the container's own
@@ -26,9 +35,9 @@
 
 #include "LS_CData.h"
 #include "LS_CElement.h"
+#include "LS_ElementTable.h"
 #include "LS_IContainer.h"
 #include "LS_IContainerObserver.h"
-#include "StringHashTable.h"
 
 class LS_CContainer : public CInherit<LS_CContainer, LS_CElement, LS_IContainer, LS_IContainerObserver> {
  public:
@@ -117,10 +126,13 @@ class LS_CContainer : public CInherit<LS_CContainer, LS_CElement, LS_IContainer,
   }
 
  private:
-  using ElementTable = StringHashTable<RefPtr<LS_IElement>>;
+  using ElementTable = LS_ElementTable;
 
-  // Fails, changing nothing, when name already has a shadow.
-  XCode createShadowElement(String const& name, LS_IElement* baseElement);
+  // Fails, changing nothing, when name already has a shadow. The shadow is
+  // filed under the name object of base's entry when base is a container of
+  // this kind, so that every member of a group shares the group's names.
+  XCode createShadowElement(String const& name, LS_IElement* baseElement, LS_IContainer* base);
+  static LS_ElementName sharedNameOf(LS_IContainer* base, String const& name);
   void destroyShadowElement(String const& name);
   void follow(RefPtr<LS_IContainer> const& base);
   void forgetBase();

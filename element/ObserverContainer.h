@@ -6,29 +6,57 @@
 // included, while a broadcast runs. An entry unregistered then is only marked
 // (count 0, delegate dropped) and skipped; it is unlinked by the housekeeping
 // that ends the outermost broadcast. Outside broadcasts it is unlinked at
-// once. An entry registered during a broadcast
-// is linked at once and is reached if it lies ahead of the current one.
+// once. An entry registered during a broadcast is linked at once and is
+// reached if it lies ahead of the current one.
+//
+// Layout: the entries lie in one array in the reverse of notification order,
+// so that the registration the library always makes (priority 0, notified
+// first) is an append, and a broadcast walks the array from its end. Every
+// running broadcast keeps its cursor in a frame on its own stack, chained
+// from the array's header; an entry inserted below a cursor moves that
+// cursor up with the entries it displaced, which is what keeps an insertion
+// ahead of the current entry reachable. The subject itself holds one
+// word: null while nobody is registered, and the observer itself while the
+// only registration is a bare observer of priority 0, which is what nearly
+// every element carries (its container watching it). Such a list has no
+// array at all; a broadcast spreads it into an array of one on its own stack
+// and folds it back when it ends, so that handlers meet the same array as
+// anywhere else, and a registration made meanwhile moves the array to the
+// heap as any growth does.
 //
 // Cost: a group's value is watched by every member that inherits it, so one
 // subject may carry tens of thousands of observers. Registering and
 // unregistering must not walk such a list. Once a list grows past
-// kIndexedFrom entries it keeps an index: live entries by observer, and the
-// first entry of each priority; shorter lists are walked, which costs less
-// than hashing and keeps the many subjects with one or two observers small.
-// A delegate whose notifications were stopped no longer names the observer
-// it was indexed under; the rare calls that must find one (registering it
-// again, or unregistering a null observer) walk the list. Housekeeping visits
-// only the entries waiting to be unlinked.
+// kIndexedFrom entries it keeps an index of its live bare observers by
+// observer; shorter lists are walked, which costs less than hashing and
+// keeps the many subjects with one or two observers small. A long list does
+// not close the gap an unregistered entry leaves at once: the entry stays as
+// a tombstone, and the array is compacted (and the index rebuilt) once
+// tombstones make up half of it, so that every operation stays constant in
+// amortised time. That holds for registrations of the lowest priority yet
+// registered (the library's are all 0): one of a higher priority goes below
+// them in the array and moves them up, a cost that grows with the list.
+//
+// Memory: the library registers bare observers (addObserver(O*, priority)),
+// and the delegate it would make for each of them is reachable by nobody
+// but this container: nobody can stop it or register it again. Such an
+// entry therefore holds the observer itself, which notifies exactly as its
+// private delegate would, and saves the delegate's allocation on each of the
+// millions of registrations a large gateway holds. Delegates registered by
+// a caller are kept as such, counted, and stay out of the index: a stopped
+// delegate no longer names its observer, so the rare lists holding any
+// (tests of the delegate contract) are walked when an observer is looked
+// up.
 //
 // Threading: not synchronised; one thread at a time, under the owner's lock.
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
-#include <map>
+#include <cstring>
 #include <memory>
-#include <vector>
+#include <new>
 
-#include "List.h"
 #include "ObserverDelegate.h"
 #include "ObserverIndex.h"
 #include "RefPtr.h"
@@ -46,7 +74,13 @@ class ObserverContainer {
   ObserverContainer(ObserverContainer const&) = delete;
   ObserverContainer& operator=(ObserverContainer const&) = delete;
   // Observers are not told: a subject that goes away announces it first.
-  ~ObserverContainer() = default;
+  ~ObserverContainer() {
+    if (!m_word || single())
+      return;
+    for (Entry& entry : *block())
+      entry.drop();
+    release(block());
+  }
 
   // Registers delegate, taking a reference on it. Registering the very same
   // delegate again only counts the registration up. A null delegate would
@@ -55,211 +89,388 @@ class ObserverContainer {
     doHousekeeping();
     if (!delegate)
       return;
-    Position const registered = entryHolding(delegate);
-    if (registered != m_entries.end()) {
+    if (Entry* const registered = entryHolding(delegate)) {
       ++registered->count;
       return;
     }
-    link(delegate, priority, flag);
+    delegate->addRef();
+    link(Entry::ofDelegate(delegate), priority, flag);
   }
 
-  // The registration every subject of the library offers: a new delegate
-  // for observer, owned by this container alone.
+  // The registration every subject of the library offers: observer, notified
+  // as a delegate of its own owned by this container alone would notify it.
   void addObserver(O* observer, unsigned int priority) {
+    if (!observer) {
+      // Notifies nobody, yet counts as a registration that
+      // removeObserver(nullptr) undoes: only a delegate can stand for it.
+      RefPtr<Delegate> const nobody = adoptRef(new Delegate(nullptr));
+      addObserver(nobody.get(), priority, true);
+      return;
+    }
+    static_assert(alignof(O) >= 4, "the low two bits of an observer's address are free");
     doHousekeeping();
-    RefPtr<Delegate> const delegate = adoptRef(new Delegate(observer));
-    link(delegate.get(), priority, true);  // a new delegate holds no entry yet
+    if (!m_word && priority == 0) {
+      m_word = Entry::ofObserver(observer) | kSingle;
+      return;
+    }
+    link(Entry::ofObserver(observer), priority, true);
   }
 
   // Undoes one registration of observer, the first in notification order;
-  // unknown observers are ignored. The delegate is released, not stopped.
+  // unknown observers are ignored. A delegate is released, not stopped.
   void removeObserver(O* observer) {
-    Position const registration = firstRegistrationOf(observer);
-    if (registration != m_entries.end() && --registration->count <= 0)
+    if (single()) {
+      // No broadcast runs on a single registration (see broadcastEvent).
+      if (single() == observer)
+        m_word = 0;
+      return;
+    }
+    Entry* const registration = firstRegistrationOf(observer);
+    if (registration && --registration->count <= 0)
       retire(registration);
     doHousekeeping();
   }
 
   // Hands each live observer its own clone of event.
   void broadcastEvent(ObserverEvent<S> const& event, Handler handler) {
-    ++m_busy;
-    for (Wrapper& wrapper : m_entries) {
-      if (wrapper.count <= 0 || !wrapper.delegate)
+    if (!m_word)
+      return;
+    // A single registration is spread into an array of one on this stack
+    // for the broadcast, so that handlers meet the array they always meet,
+    // and folded back afterwards.
+    OnStack local;
+    if (O* const observer = single()) {
+      local.header = Block{nullptr, nullptr, 1, 1 | kOnStack};
+      local.entry = Entry{Entry::ofObserver(observer), 0, 1, true};
+      setBlock(&local.header);
+    }
+    Broadcast frame{block()->size, block()->broadcasts};
+    block()->broadcasts = &frame;
+    while (frame.cursor > 0) {
+      --frame.cursor;
+      // Handlers may move the array: read it afresh for every entry.
+      Entry const entry = block()->at(frame.cursor);
+      if (entry.count <= 0 || !entry.target)
         continue;
       std::unique_ptr<ObserverEvent<S>> const copy = event.clone();
       if (!copy)
         continue;
+      if (!entry.isDelegate()) {
+        (entry.observer()->*handler)(*copy);
+        continue;
+      }
       // The handler may unregister this very entry; the delegate must
       // outlive its own call.
-      RefPtr<Delegate> const delegate = wrapper.delegate;
+      RefPtr<Delegate> const delegate = entry.delegate();
       delegate->notifyEvent(handler, *copy);
     }
-    --m_busy;
+    block()->broadcasts = frame.outer;
+    if (block() == &local.header) {
+      // Nothing could be added without moving the array to the heap, so the
+      // entry is still the single observer, alive or unregistered.
+      m_word = local.entry.count > 0 ? local.entry.target | kSingle : 0;
+      return;
+    }
     doHousekeeping();
   }
 
   // Unlinks the entries marked dead, unless a broadcast is running.
   void doHousekeeping() {
-    if (m_busy || m_retired == 0)
+    if (!m_word || single() || block()->broadcasts)
       return;
-    m_retired = 0;
-    if (!m_index) {
-      // Short: sweeping it costs no more than keeping a list of the dead.
-      for (Position position = m_entries.begin(); position != m_entries.end();)
-        position = position->count > 0 ? std::next(position) : unlink(position);
+    Long* const extra = block()->extra;
+    if (!extra) {
+      if (holdsDeadEntries())
+        compact();
       return;
     }
-    // Unlinking the last entry drops the index, and with it this list.
-    std::vector<Position> retired;
-    retired.swap(m_index->retired);
-    for (Position const position : retired)
-      unlink(position);
+    if (extra->pending == 0)
+      return;
+    extra->pending = 0;
+    if (extra->tombstones * 2 >= block()->size)
+      compact();
   }
 
   // Registrations still linked, dead ones awaiting housekeeping included.
-  unsigned int getSize() const { return static_cast<unsigned int>(m_entries.size()); }
+  unsigned int getSize() const {
+    if (!m_word)
+      return 0;
+    if (single())
+      return 1;
+    Long const* const extra = block()->extra;
+    return block()->size - (extra ? extra->tombstones - extra->pending : 0);
+  }
 
  private:
-  struct Wrapper {
-    RefPtr<Delegate> delegate;  // null once unregistered
+  struct Entry {
+    // A registered delegate, holding a counted reference (low bit set), or a
+    // bare observer; 0 once unregistered.
+    std::uintptr_t target;
     unsigned int priority;
-    bool flag;  // stored as registered; nothing in the library reads it
-    int count;  // registrations of this delegate; 0 marks the entry dead
-    // The observer the entry is indexed under: the delegate's at
-    // registration, which a stopped delegate no longer names.
-    O* observer;
-    // Among equal priorities, higher serials come first; given only while
-    // the list keeps an index, which alone compares entries this way.
-    std::uint64_t serial;
-  };
-  using Position = typename List<Wrapper>::iterator;
+    int count : 31;  // registrations of this entry; 0 marks it dead
+    bool flag : 1;  // stored as registered; nothing in the library reads it
 
-  struct Index {
-    explicit Index(size_t expected) : live(expected) {}
-    ObserverIndex<O, Position> live;  // by Wrapper::observer
-    std::map<unsigned int, Position> firstOfPriority;  // dead entries included
-    std::vector<Position> retired;  // during a broadcast, still linked
-    std::uint64_t nextSerial = 0;
+    static std::uintptr_t ofDelegate(Delegate* delegate) {
+      return reinterpret_cast<std::uintptr_t>(delegate) | 1u;
+    }
+    static std::uintptr_t ofObserver(O* observer) { return reinterpret_cast<std::uintptr_t>(observer); }
+
+    bool isDelegate() const { return (target & 1u) != 0; }
+    Delegate* delegate() const {
+      return isDelegate() ? reinterpret_cast<Delegate*>(target & ~std::uintptr_t{1}) : nullptr;
+    }
+    // A bare observer (null for a delegate entry).
+    O* observer() const { return isDelegate() ? nullptr : reinterpret_cast<O*>(target); }
+    // Whom the entry notifies now: a stopped delegate notifies nobody.
+    O* notified() const { return isDelegate() ? delegate()->getObserver() : observer(); }
+    // Ends the entry's hold on its delegate.
+    void drop() {
+      if (Delegate* const held = delegate())
+        held->release();
+      target = 0;
+    }
   };
 
-  static bool comesBefore(Wrapper const& left, Wrapper const& right) {
-    if (left.priority != right.priority)
-      return left.priority < right.priority;
-    return left.serial > right.serial;
+  // A running broadcast: the position of the entry being notified.
+  struct Broadcast {
+    unsigned int cursor;
+    Broadcast* outer;
+  };
+
+  // What only a long list keeps. A short one holds dead entries only until
+  // the next housekeeping, so it needs no count of them.
+  struct Long {
+    explicit Long(size_t expected) : index(expected) {}
+    ObserverIndex<O> index;  // live bare observers by observer
+    size_t liveDelegates = 0;  // while any, observers are found by walking
+    unsigned int tombstones = 0;  // dead entries still in the array
+    unsigned int pending = 0;  // of those, retired since the last housekeeping
+  };
+
+  // The header of the entry array, which follows it in the same allocation.
+  struct Block {
+    Broadcast* broadcasts;  // innermost running broadcast, or null
+    Long* extra;  // owned; while the list has more than kIndexedFrom entries
+    unsigned int size;
+    unsigned int capacity;
+
+    Entry* entries() { return reinterpret_cast<Entry*>(this + 1); }
+    Entry& at(unsigned int position) { return entries()[position]; }
+    Entry* begin() { return entries(); }
+    Entry* end() { return entries() + size; }
+  };
+  static_assert(sizeof(Block) % alignof(Entry) == 0, "entries follow the header");
+
+  static constexpr std::uintptr_t kSingle = 2;
+  // Marks the capacity of an array that lives on a broadcast's stack.
+  static constexpr unsigned int kOnStack = 1u << 31;
+
+  struct OnStack {
+    Block header;
+    Entry entry;
+  };
+  static_assert(sizeof(Block) % alignof(Entry) == 0 && offsetof(OnStack, entry) == sizeof(Block),
+                "the entry follows the header as in an array");
+
+  O* single() const { return (m_word & kSingle) ? reinterpret_cast<O*>(m_word & ~kSingle) : nullptr; }
+  Block* block() const { return reinterpret_cast<Block*>(m_word); }
+  void setBlock(Block* block) { m_word = reinterpret_cast<std::uintptr_t>(block); }
+
+  // Turns a single registration into an array of one.
+  void spread() {
+    O* const observer = single();
+    if (!observer)
+      return;
+    Block* const spread = allocate(2);
+    spread->at(0) = Entry{Entry::ofObserver(observer), 0, 1, true};
+    spread->size = 1;
+    setBlock(spread);
   }
 
-  // The live entry of delegate, or end().
-  Position entryHolding(Delegate* delegate) {
-    O* const observer = delegate->getObserver();
-    if (!m_index || !observer)
-      return walkFor([delegate](Wrapper const& wrapper) { return wrapper.delegate.get() == delegate; });
-    Position found = m_entries.end();
-    m_index->live.forEach(observer, [&found, delegate](Position candidate) {
-      if (candidate->delegate.get() == delegate)
-        found = candidate;
-    });
-    return found;
+  static Block* allocate(unsigned int capacity) {
+    void* const memory = ::operator new(sizeof(Block) + capacity * sizeof(Entry));
+    Block* const block = new (memory) Block{nullptr, nullptr, 0, capacity};
+    return block;
+  }
+  static void release(Block* block) {
+    delete block->extra;
+    ::operator delete(block);
   }
 
-  // The live entry whose delegate still notifies observer and that comes
-  // first in notification order, or end().
-  Position firstRegistrationOf(O* observer) {
-    auto const notifies = [observer](Wrapper const& wrapper) {
-      return wrapper.delegate && wrapper.delegate->getObserver() == observer;
-    };
-    if (!m_index || !observer)
-      return walkFor(notifies);
-    Position first = m_entries.end();
-    m_index->live.forEach(observer, [&](Position candidate) {
-      if (notifies(*candidate) && (first == m_entries.end() || comesBefore(*candidate, *first)))
-        first = candidate;
+  // The observer the index files the entry at a position under.
+  auto keyOf() const {
+    Block* const array = block();
+    return [array](unsigned int position) { return array->at(position).observer(); };
+  }
+
+  unsigned int positionOf(Entry const* entry) const { return static_cast<unsigned int>(entry - block()->entries()); }
+
+  // The live entry of delegate, or null.
+  Entry* entryHolding(Delegate* delegate) {
+    if (!m_word || single())
+      return nullptr;
+    std::uintptr_t const target = Entry::ofDelegate(delegate);
+    for (Entry& entry : *block()) {
+      if (entry.target == target)
+        return &entry;
+    }
+    return nullptr;
+  }
+
+  // The live entry that notifies observer and comes first in notification
+  // order (the last in the array), or null.
+  Entry* firstRegistrationOf(O* observer) {
+    if (!block())
+      return nullptr;
+    auto const notifies = [observer](Entry const& entry) { return entry.target && entry.notified() == observer; };
+    Long* const extra = block()->extra;
+    if (!extra || !observer || extra->liveDelegates) {
+      for (unsigned int position = block()->size; position > 0; --position) {
+        if (notifies(block()->at(position - 1)))
+          return &block()->at(position - 1);
+      }
+      return nullptr;
+    }
+    Entry* first = nullptr;
+    extra->index.forEach(observer, keyOf(), [&](unsigned int position) {
+      Entry& candidate = block()->at(position);
+      if (notifies(candidate) && (!first || first < &candidate))
+        first = &candidate;
     });
     return first;
   }
 
-  template <class Predicate>
-  Position walkFor(Predicate const& matches) {
-    for (Position position = m_entries.begin(); position != m_entries.end(); ++position) {
-      if (matches(*position))
-        return position;
+  // In the array, after every entry of priority or higher (they are notified
+  // before it), in front of the first of a lower priority.
+  unsigned int insertionPoint(unsigned int priority) const {
+    unsigned int low = 0;
+    unsigned int high = block()->size;
+    while (low < high) {
+      unsigned int const middle = low + (high - low) / 2;
+      if (block()->at(middle).priority >= priority)
+        low = middle + 1;
+      else
+        high = middle;
     }
-    return m_entries.end();
+    return low;
   }
 
-  // In front of the first entry of priority or higher, or at the end.
-  Position insertionPoint(unsigned int priority) {
-    if (m_index) {
-      auto const group = m_index->firstOfPriority.lower_bound(priority);
-      return group == m_index->firstOfPriority.end() ? m_entries.end() : group->second;
+  void link(std::uintptr_t target, unsigned int priority, bool flag) {
+    spread();
+    if (!block())
+      setBlock(allocate(1));
+    else if (block()->size == (block()->capacity & ~kOnStack))
+      grow();
+    unsigned int const position = insertionPoint(priority);
+    Entry* const at = &block()->at(position);
+    std::memmove(static_cast<void*>(at + 1), at, (block()->size - position) * sizeof(Entry));
+    *at = Entry{target, priority, 1, flag};
+    ++block()->size;
+    for (Broadcast* running = block()->broadcasts; running; running = running->outer) {
+      if (position <= running->cursor)
+        ++running->cursor;
     }
-    return walkFor([priority](Wrapper const& wrapper) { return wrapper.priority >= priority; });
-  }
-
-  void link(Delegate* delegate, unsigned int priority, bool flag) {
-    Wrapper wrapper{RefPtr<Delegate>(delegate), priority, flag, 1, delegate->getObserver(),
-                    m_index ? m_index->nextSerial++ : 0};
-    Position const position = m_entries.insert(insertionPoint(priority), std::move(wrapper));
-    if (!m_index) {
-      if (m_entries.size() > kIndexedFrom)
-        buildIndex();
+    Long* const extra = block()->extra;
+    if (!extra) {
+      if (block()->size > kIndexedFrom)
+        becomeLong();
       return;
     }
-    m_index->firstOfPriority[priority] = position;
-    if (position->observer)
-      m_index->live.add(position->observer, position);
+    if (at->isDelegate())
+      ++extra->liveDelegates;
+    if (position + 1 != block()->size)
+      extra->index.shiftFrom(position);
+    if (at->observer())
+      extra->index.add(at->observer(), position, keyOf());
   }
 
-  void buildIndex() {
-    m_index = std::make_unique<Index>(m_entries.size());
-    // Serials that fall along the list: newest first within a priority.
-    m_index->nextSerial = m_entries.size() + 1;
-    std::uint64_t serial = m_entries.size();
-    for (Position position = m_entries.begin(); position != m_entries.end(); ++position) {
-      position->serial = serial--;
-      m_index->firstOfPriority.emplace(position->priority, position);  // keeps the first of each
-      if (position->count <= 0)
-        m_index->retired.push_back(position);
-      else if (position->observer)
-        m_index->live.add(position->observer, position);
+  // Doubles the array; the header, running broadcasts' chain included, moves
+  // with it.
+  void grow() {
+    bool const onStack = (block()->capacity & kOnStack) != 0;
+    Block* const larger = allocate((block()->capacity & ~kOnStack) * 2);
+    unsigned int const capacity = larger->capacity;
+    std::memcpy(static_cast<void*>(larger), block(), sizeof(Block) + block()->size * sizeof(Entry));
+    larger->capacity = capacity;
+    if (!onStack)
+      ::operator delete(block());
+    setBlock(larger);
+  }
+
+  void becomeLong() {
+    block()->extra = new Long(block()->size);
+    for (Entry const& entry : *block()) {
+      if (entry.count <= 0)
+        ++block()->extra->tombstones;
+      else if (entry.isDelegate())
+        ++block()->extra->liveDelegates;
+    }
+    block()->extra->pending = block()->extra->tombstones;
+    reindex();
+  }
+
+  // Files every live bare observer of a long list anew.
+  void reindex() {
+    Long* const extra = block()->extra;
+    extra->index = ObserverIndex<O>(block()->size - extra->tombstones);
+    for (unsigned int position = 0; position < block()->size; ++position) {
+      Entry const& entry = block()->at(position);
+      if (entry.count > 0 && entry.observer())
+        extra->index.add(entry.observer(), position, keyOf());
     }
   }
 
-  // Ends the entry whose last registration was undone: unlinked at once, or
-  // marked and left to the housekeeping that ends the outermost broadcast.
-  void retire(Position position) {
-    position->count = 0;
-    position->delegate = nullptr;
-    if (m_index && position->observer)
-      m_index->live.remove(position->observer, position);
-    if (m_busy) {
-      ++m_retired;
-      if (m_index)
-        m_index->retired.push_back(position);
+  bool holdsDeadEntries() {
+    for (Entry const& entry : *block()) {
+      if (entry.count <= 0)
+        return true;
+    }
+    return false;
+  }
+
+  // Ends the entry whose last registration was undone. It stays in the
+  // array as a tombstone until housekeeping: at once outside broadcasts for
+  // a short list, when tombstones fill half of a long one.
+  void retire(Entry* entry) {
+    entry->count = 0;
+    if (Long* const extra = block()->extra) {
+      if (entry->isDelegate())
+        --extra->liveDelegates;
+      else if (entry->observer())
+        extra->index.remove(entry->observer(), positionOf(entry), keyOf());
+      ++extra->tombstones;
+      ++extra->pending;
+    }
+    entry->drop();
+  }
+
+  // Closes every gap; frees the array once nothing is left in it.
+  void compact() {
+    Entry* kept = block()->begin();
+    for (Entry const& entry : *block()) {
+      if (entry.count > 0)
+        *kept++ = entry;
+    }
+    block()->size = static_cast<unsigned int>(kept - block()->begin());
+    if (block()->size == 0) {
+      release(block());
+      m_word = 0;
       return;
     }
-    unlink(position);
-  }
-
-  // Returns the position after the unlinked one.
-  Position unlink(Position position) {
-    if (m_index) {
-      auto const group = m_index->firstOfPriority.find(position->priority);
-      if (group != m_index->firstOfPriority.end() && group->second == position) {
-        Position const next = std::next(position);
-        if (next != m_entries.end() && next->priority == position->priority)
-          group->second = next;
-        else
-          m_index->firstOfPriority.erase(group);
-      }
+    Long* const extra = block()->extra;
+    if (!extra)
+      return;
+    extra->tombstones = 0;
+    if (block()->size > kIndexedFrom) {
+      reindex();
+      return;
     }
-    Position const next = m_entries.remove(position);
-    if (m_entries.isEmpty())
-      m_index.reset();
-    return next;
+    delete extra;
+    block()->extra = nullptr;
   }
 
-  List<Wrapper> m_entries;
-  unsigned int m_busy = 0;  // nesting depth of running broadcasts
-  unsigned int m_retired = 0;  // entries retired during a broadcast, still linked
-  std::unique_ptr<Index> m_index;  // built past kIndexedFrom entries, dropped when empty
+  // Null, a Block, or a single bare observer registered with priority 0
+  // tagged with kSingle: the one registration nearly every element has (its
+  // container's, or its derived element's), kept without an array.
+  std::uintptr_t m_word = 0;
 };

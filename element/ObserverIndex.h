@@ -1,13 +1,15 @@
-// ObserverIndex<O, Position>: the registrations of a long observer list by
-// observer, so that ObserverContainer finds them without walking the list.
+// ObserverIndex<O>: the registrations of a long observer list by observer,
+// so that ObserverContainer finds them without walking the list.
 //
-// An open-addressing table of (observer, position) slots with linear probing
-// and backward-shift deletion. A group's value may carry a hundred thousand
+// An open-addressing table of entry positions with linear probing and
+// backward-shift deletion. A group's value may carry a hundred thousand
 // observers; a lookup here touches one slot run, and growing moves one flat
 // array, where a node-based hash table would chase a scattered node per entry
-// on every insertion, lookup and rehash. An observer may be present several
-// times (one slot per registration). A null observer marks an empty slot and
-// is never indexed.
+// on every insertion, lookup and rehash. A slot holds only a position in the
+// container's entry array: the observer filed there is read from the entry
+// itself (through the keyOf function every operation is given), which keeps
+// a slot at four bytes. An observer may be present several times (one slot
+// per registration); a null observer is never indexed.
 //
 // Threading: none; it belongs to one ObserverContainer.
 #pragma once
@@ -16,7 +18,7 @@
 #include <cstdint>
 #include <vector>
 
-template <class O, class Position>
+template <class O>
 class ObserverIndex {
  public:
   explicit ObserverIndex(size_t expected) {
@@ -26,42 +28,53 @@ class ObserverIndex {
     resize(capacity);
   }
 
-  void add(O* observer, Position position) {
+  // keyOf(position) yields the observer of the entry at position; it must
+  // answer for every position filed, this one included.
+  template <class KeyOf>
+  void add(O* observer, std::uint32_t position, KeyOf const& keyOf) {
     if (!roomy(m_count + 1, m_slots.size()))
-      regrow(m_slots.size() * 2);
+      regrow(m_slots.size() * 2, keyOf);
     size_t slot = home(observer);
-    while (m_slots[slot].observer)
+    while (m_slots[slot] != kEmpty)
       slot = next(slot);
-    m_slots[slot] = Slot{observer, position};
+    m_slots[slot] = position + 1;
     ++m_count;
   }
 
   // Removes the slot of this observer and position, if there is one.
-  void remove(O* observer, Position position) {
-    for (size_t slot = home(observer); m_slots[slot].observer; slot = next(slot)) {
-      if (m_slots[slot].observer == observer && m_slots[slot].position == position) {
-        erase(slot);
+  template <class KeyOf>
+  void remove(O* observer, std::uint32_t position, KeyOf const& keyOf) {
+    for (size_t slot = home(observer); m_slots[slot] != kEmpty; slot = next(slot)) {
+      if (m_slots[slot] == position + 1) {
+        erase(slot, keyOf);
         return;
       }
     }
   }
 
+  // Follows an insertion into the entry array at position: every entry
+  // filed at that position or later has moved up by one. Keys are unchanged,
+  // so nothing is rehashed.
+  void shiftFrom(std::uint32_t position) {
+    for (std::uint32_t& slot : m_slots) {
+      if (slot != kEmpty && slot - 1 >= position)
+        ++slot;
+    }
+  }
+
   // Calls visit(position) for every registration of observer, in no
   // particular order.
-  template <class Visit>
-  void forEach(O* observer, Visit const& visit) const {
-    for (size_t slot = home(observer); m_slots[slot].observer; slot = next(slot)) {
-      if (m_slots[slot].observer == observer)
-        visit(m_slots[slot].position);
+  template <class KeyOf, class Visit>
+  void forEach(O* observer, KeyOf const& keyOf, Visit const& visit) const {
+    for (size_t slot = home(observer); m_slots[slot] != kEmpty; slot = next(slot)) {
+      std::uint32_t const position = m_slots[slot] - 1;
+      if (keyOf(position) == observer)
+        visit(position);
     }
   }
 
  private:
-  struct Slot {
-    O* observer = nullptr;  // null: empty
-    Position position{};
-  };
-
+  static constexpr std::uint32_t kEmpty = 0;  // slots hold position + 1
   static constexpr size_t kInitialCapacity = 32;  // a power of two
 
   // At most three quarters full, so that probe runs stay short.
@@ -78,10 +91,11 @@ class ObserverIndex {
 
   // Empties slot and moves later members of its probe run back, so that no
   // run is ever broken by a hole.
-  void erase(size_t slot) {
+  template <class KeyOf>
+  void erase(size_t slot, KeyOf const& keyOf) {
     size_t hole = slot;
-    for (size_t later = next(hole); m_slots[later].observer; later = next(later)) {
-      size_t const wanted = home(m_slots[later].observer);
+    for (size_t later = next(hole); m_slots[later] != kEmpty; later = next(later)) {
+      size_t const wanted = home(keyOf(m_slots[later] - 1));
       // Movable when its home does not lie in the circular range (hole, later].
       bool const homeAfterHole = hole <= later ? (hole < wanted && wanted <= later) : (hole < wanted || wanted <= later);
       if (homeAfterHole)
@@ -89,29 +103,30 @@ class ObserverIndex {
       m_slots[hole] = m_slots[later];
       hole = later;
     }
-    m_slots[hole] = Slot{};
+    m_slots[hole] = kEmpty;
     --m_count;
   }
 
   void resize(size_t capacity) {
-    m_slots.assign(capacity, Slot{});
+    m_slots.assign(capacity, kEmpty);
     m_shift = 64;
     for (size_t slots = capacity; slots > 1; slots /= 2)
       --m_shift;
   }
 
-  void regrow(size_t capacity) {
-    std::vector<Slot> old;
+  template <class KeyOf>
+  void regrow(size_t capacity, KeyOf const& keyOf) {
+    std::vector<std::uint32_t> old;
     old.swap(m_slots);
     resize(capacity);
     m_count = 0;
-    for (Slot const& slot : old) {
-      if (slot.observer)
-        add(slot.observer, slot.position);
+    for (std::uint32_t const slot : old) {
+      if (slot != kEmpty)
+        add(keyOf(slot - 1), slot - 1, keyOf);
     }
   }
 
-  std::vector<Slot> m_slots;  // a power of two of them
+  std::vector<std::uint32_t> m_slots;  // a power of two of them
   unsigned int m_shift = 64;  // 64 - log2(capacity): keeps the hash's top bits
   size_t m_count = 0;
 };

@@ -204,6 +204,31 @@ TEST_F(ContainerChainTest, TearingDownAChainInAnyOrderLeavesNothingBehind) {
   bottom = nullptr;  // the sanitizer build reports any leak or dangling observer
 }
 
+// Enough children that the tables find names through their index, and
+// edits that move entries between and out of the tables.
+TEST_F(ContainerChainTest, ManyChildrenAreFoundByNameAndListedInOrderAfterEdits) {
+  constexpr int kChildren = 40;
+  auto const name = [](int i) { return String().format("child-%d", i); };
+  for (int i = 0; i < kChildren; ++i)
+    LS_setDataElement<String>(top.get(), name(i), name(i));
+  for (int i = 0; i < kChildren; i += 3)
+    LS_setDataElement<String>(middle.get(), name(i), "middle");
+  for (int i = 1; i < kChildren; i += 4)
+    top->removeElement(name(i));
+
+  Vector<String> expectedMiddleShadows;
+  for (int i = 0; i < kChildren; ++i) {
+    bool const removed = i % 4 == 1;
+    bool const overridden = i % 3 == 0;
+    if (!removed && !overridden)
+      expectedMiddleShadows.add(name(i));
+    String const expected = overridden ? String("middle") : removed ? String("<none>") : name(i);
+    EXPECT_EQ(valueOf(bottom.get(), name(i).c_str(), LS_Strategy::LOCAL_OR_BASE), expected) << i;
+    EXPECT_EQ(middle->containsElement(name(i), LS_Strategy::LOCAL_ONLY), overridden) << i;
+  }
+  EXPECT_EQ(namesOf(middle.get(), LS_Strategy::BASE_ONLY), expectedMiddleShadows);
+}
+
 TEST(ContainerChildrenTest, ChangeElementTouchesOnlyLocalChildren) {
   Journal journal;
   RefPtr<TestContainer> base = makeContainer();
