@@ -2,6 +2,7 @@
 
 #include <utility>
 
+#include "LS_CAliasIndex.h"
 #include "LS_ClassIdentifiers.h"
 #include "LS_Debug.h"
 #include "LS_ElementClassTable.h"
@@ -183,7 +184,13 @@ void LS_CIdentity::onElementRemove(String const& name) {
   onElementChange(name);
 }
 
+// Every change of the aliases in effect, own or anywhere up the base chain,
+// arrives here as an addition, removal or change of the "alias" child.
 void LS_CIdentity::onElementChange(String const& name) {
+  if (name == keys().alias) {
+    aliasIndexChanged();
+    return;
+  }
   if (name == GET_ELEMENT_NAME(LS_IdentityFace::REGISTRATION_OUTBOUND)) {
     notifyRegistrationOutboundChange();
     return;
@@ -204,6 +211,7 @@ String LS_CIdentity::getConfigName() const {
 
 void LS_CIdentity::setConfigName(String const& name) {
   m_name = name;
+  aliasIndexChanged();
 }
 
 XCode LS_CIdentity::getConfigBaseIdentity(RefPtr<LS_IIdentityConfig>& base) {
@@ -221,6 +229,7 @@ LS_IdentityType::Type LS_CIdentity::getConfigIdentityType() const {
 
 void LS_CIdentity::setConfigIdentityType(LS_IdentityType::Type type) {
   m_type = type;
+  aliasIndexChanged();
 }
 
 XCode LS_CIdentity::getConfigLocationServiceIf(UUID const& iid, void** out) {
@@ -284,6 +293,11 @@ XCode LS_CIdentity::ownAliasCreated(LS_Alias*& alias) {
 
 void LS_CIdentity::notifyAliasChange() {
   changeElement(keys().alias);
+}
+
+void LS_CIdentity::aliasIndexChanged() {
+  if (m_aliasIndex)
+    m_aliasIndex->identityChanged(this);
 }
 
 XCode LS_CIdentity::getNumberOfConfigAliasNames(unsigned int& count) const {

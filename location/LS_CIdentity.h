@@ -42,6 +42,8 @@
 #include "LS_IRegistrationOutboundSubject.h"
 #include "ObserverContainer.h"
 
+class LS_CAliasIndex;
+
 class LS_CIdentity : public CInherit<LS_CIdentity,
                                      LS_CContainer,
                                      LS_IIdentityConfig,
@@ -160,14 +162,23 @@ class LS_CIdentity : public CInherit<LS_CIdentity,
                          unsigned int detail,
                          String const& prefix) const override;
 
- private:
-  // The alias record in effect (own, else inherited), or null.
+  // The alias record in effect (own, else inherited), or null. Valid while
+  // the identity and its base chain stay unchanged.
   LS_Alias const* aliasInEffect() const;
+
+  // The alias index of the location service that lists this identity, or
+  // null while none does. The index sets and clears it; the identity tells
+  // it of every change of its name, its type or its aliases in effect.
+  void setAliasIndex(LS_CAliasIndex* index) { m_aliasIndex = index; }
+
+ private:
   // The identity's own alias record, or null.
   LS_Alias const* ownAlias() const;
   // The own alias record, made empty first when the identity has none.
   XCode ownAliasCreated(LS_Alias*& alias);
   void notifyAliasChange();
+  // Tells the alias index, when a service lists the identity.
+  void aliasIndexChanged();
   void dumpFaces(InfoContainer& info,
                  unsigned int maxLevel,
                  unsigned int level,
@@ -181,4 +192,5 @@ class LS_CIdentity : public CInherit<LS_CIdentity,
       m_registrationOutboundObservers;
   ObserverContainer<LS_IRegistrationInbound, LS_IRegistrationInboundObserver> m_registrationInboundObservers;
   ObserverContainer<LS_IMwiSubscription, LS_IMwiSubscriptionObserver> m_mwiSubscriptionObservers;
+  LS_CAliasIndex* m_aliasIndex = nullptr;  // borrowed; see setAliasIndex
 };

@@ -33,6 +33,11 @@ Vector<RefPtr<LS_IIdentity>> snapshot(StringHashTable<RefPtr<LS_IIdentity>> cons
   return identities;
 }
 
+// Every identity in either table was made here as an LS_CIdentity.
+LS_CIdentity* implementationOf(RefPtr<LS_IIdentity> const& identity) {
+  return dynamic_cast<LS_CIdentity*>(identity.get());
+}
+
 XCode failWithNull(XCode const& result, void** out) {
   if (out)
     *out = nullptr;
@@ -291,6 +296,7 @@ XCode LS_CLocationService::takeOverDynamicIdentity(String const& name,
   identity = *m_dynamicIdentities.get(name);
   m_dynamicIdentities.remove(name);
   m_configuredIdentities.add(name, identity);
+  m_aliasIndex.moveToConfigured(implementationOf(identity));
   RefPtr<LS_IIdentityConfig> config;
   XCode const result = configOfNamed(identity, name, config);
   if (result.isFailure())
@@ -332,6 +338,7 @@ XCode LS_CLocationService::createConfiguredIdentity(String const& name,
     return result;
   identity = created;
   m_configuredIdentities.add(name, identity);
+  m_aliasIndex.addConfigured(created.get());
   notifyIdentityAdded(identity.get());
   return XCode::success();
 }
@@ -390,8 +397,13 @@ XCode LS_CLocationService::dynamicIdentity(String const& name, RefPtr<LS_IIdenti
   }
   identity = created;
   m_dynamicIdentities.add(name, identity);
+  m_aliasIndex.addDynamic(created.get());
   notifyIdentityAdded(identity.get());
   return XCode::success();
+}
+
+RefPtr<LS_IIdentity> LS_CLocationService::getFirstResponsibleIdentity(String const& user) {
+  return RefPtr<LS_IIdentity>(m_aliasIndex.firstResponsible(user));
 }
 
 void LS_CLocationService::removeConfigIdentity(String const& name) {
@@ -411,6 +423,7 @@ void LS_CLocationService::removeIdentity(IdentityTable& table, String const& nam
     return;
   RefPtr<LS_IIdentity> const identity = *found;
   table.remove(name);
+  m_aliasIndex.remove(implementationOf(identity));
   RefPtr<LS_IIdentityConfig> config;
   if (LockedPtr<LS_IIdentity>(identity)->queryIf(config).isSuccess())
     LockedPtr<LS_IIdentityConfig>(config)->setConfigBaseIdentity(nullptr);

@@ -17,6 +17,11 @@
 // identity table works on a copy, and the service holds itself across its
 // broadcasts.
 //
+// The alias index lists the identities of both tables, in the order
+// getIdentities gives, and answers which one is responsible for a user
+// without asking each; the service tells it of every table change, and each
+// listed identity of every change of its name, type or aliases in effect.
+//
 // Log lines print this service's address and, for identities, the
 // LS_IIdentity pointer the table holds.
 //
@@ -28,6 +33,7 @@
 #include "CHostPort.h"
 #include "CInherit.h"
 #include "IInfo.h"
+#include "LS_CAliasIndex.h"
 #include "LS_IIdentity.h"
 #include "LS_IIdentityConfig.h"
 #include "LS_ILocationService.h"
@@ -83,6 +89,11 @@ class LS_CLocationService : public CInherit<LS_CLocationService,
   XCode createDynamicIdentityIf(String const& name, UUID const& iid, void** out) override;
   void removeDynamicIdentity(String const& name) override;
   void getIdentities(Vector<String>& names) const override;
+
+  // The first identity, in the order of getIdentities, of type Identity
+  // whose isResponsible(user) is true; null when none is. Answered from the
+  // alias index, without asking each identity.
+  RefPtr<LS_IIdentity> getFirstResponsibleIdentity(String const& user);
 
   // LS_ILocationServiceSubject
   void addLocationServiceObserver(LS_ILocationServiceObserver* observer, unsigned int priority) override;
@@ -143,5 +154,8 @@ class LS_CLocationService : public CInherit<LS_CLocationService,
   Vector<CHostPort> m_domains;  // index 0 is the master domain; no two equal
   IdentityTable m_configuredIdentities{32};
   IdentityTable m_dynamicIdentities{32};
+  // Lists the identities of both tables; declared after them, so that it
+  // lets them go while they are still held.
+  LS_CAliasIndex m_aliasIndex;
   ObserverContainer<LS_ILocationService, LS_ILocationServiceObserver> m_observers;
 };

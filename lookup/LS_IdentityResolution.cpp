@@ -1,6 +1,7 @@
 #include "LS_IdentityResolution.h"
 
 #include "LS_AddressText.h"
+#include "LS_CLocationService.h"
 #include "LS_ServiceResolution.h"
 #include "LockedPtr.h"
 #include "StringTokenizer.h"
@@ -38,7 +39,10 @@ RefPtr<LS_IIdentity> directIdentity(LS_ILocationService* service, String const& 
   return identity;
 }
 
-RefPtr<LS_IIdentity> firstResponsibleIdentity(LS_ILocationService* service, String const& user) {
+// Asks every identity in turn: the answer for a service that keeps no alias
+// index (one reached through a proxy, say), and the reference the index is
+// tested against.
+RefPtr<LS_IIdentity> firstResponsibleByScan(LS_ILocationService* service, String const& user) {
   Vector<String> names;
   LockedPtr<LS_ILocationService>(service)->getIdentities(names);
   for (String const& name : names) {
@@ -53,6 +57,12 @@ RefPtr<LS_IIdentity> firstResponsibleIdentity(LS_ILocationService* service, Stri
       return identity;
   }
   return nullptr;
+}
+
+RefPtr<LS_IIdentity> firstResponsibleIdentity(LS_ILocationService* service, String const& user) {
+  if (auto* const indexed = dynamic_cast<LS_CLocationService*>(service))
+    return LockedPtr<LS_CLocationService>(indexed)->getFirstResponsibleIdentity(user);
+  return firstResponsibleByScan(service, user);
 }
 
 RefPtr<LS_IIdentity> defaultGroup(LS_ILocationService* service) {

@@ -9,7 +9,8 @@
 // As every lookup, they take no lock of their own (each call on an object
 // goes through its LockedPtr for that one call), never clear the error
 // text, and allocate nothing that outlives the call except the references
-// handed back.
+// handed back and what a location service's alias index keeps when it
+// catches up with the changes made since its previous lookup.
 //
 // Host texts are compared without regard to ASCII case everywhere here
 // ("local-host", the own-host test, the domains), as SIP compares hosts and
@@ -46,7 +47,9 @@ LS_EXPORT XCode LS_splitNameAddr(String& error, String& user, CHostPort& host, C
 // The identity of user inside locationService: the identity of that name,
 // else the first identity (configured ones, then dynamic ones) that is
 // responsible for user by name or alias, else, when useDefault is set, the
-// identity "DEFAULT". Only identities of type "Identity" answer a user and
+// identity "DEFAULT". A service of this library answers the alias step from
+// its alias index; any other implementation of the interface has every
+// identity asked in turn. Only identities of type "Identity" answer a user and
 // only an "Identity-Group" answers as "DEFAULT". out is written only on
 // success; a null service fails.
 LS_EXPORT XCode LS_getIdentityOrAliasIf(RefPtr<LS_ILocationService> locationService,
