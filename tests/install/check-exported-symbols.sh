@@ -59,7 +59,10 @@ allowed=$(declared all "${own[@]}"; [ ${#others[@]} -eq 0 ] || declared all "${o
 # Exported symbols as (first component, last component) of their qualified
 # name: "typeinfo for LS_IIdentity" gives LS_IIdentity twice,
 # "SYSTEM::DRIVER_REPOSITORY()" gives SYSTEM and DRIVER_REPOSITORY.
+# Symbols a sanitizer build adds for its own bookkeeping are not the
+# library's.
 symbols=$("${NM:-nm}" -D --defined-only -C "$library" | cut -d' ' -f3- |
+  grep -Ev '^(__odr_asan|__asan|__ubsan|__tsan|__sanitizer)' |
   sed -E 's/^(typeinfo name for|typeinfo for|vtable for|VTT for|non-virtual thunk to|virtual thunk to|guard variable for) //' |
   sed -E ':strip; s/<[^<>]*>//; t strip' |
   sed -E 's/\(.*//; s/^.* ([^ ]+)$/\1/' |

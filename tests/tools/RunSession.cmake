@@ -1,7 +1,8 @@
 # Runs one console session and compares what it printed with what is kept
 # beside the script, object addresses aside. Arguments: CONSOLE, SESSION (the script, or
 # sessions/default for the embedded session), ACTUAL_DIR (where the output
-# of a failing run is left for inspection).
+# of a failing run is left for inspection), and EMULATOR, the command that
+# runs the console when it was cross-compiled (empty otherwise).
 get_filename_component(directory ${SESSION} DIRECTORY)
 get_filename_component(name ${SESSION} NAME_WE)
 
@@ -15,7 +16,7 @@ if(EXISTS ${SESSION})
   list(APPEND arguments ${script})
 endif()
 
-execute_process(COMMAND ${CONSOLE} ${arguments}
+execute_process(COMMAND ${EMULATOR} ${CONSOLE} ${arguments}
                 WORKING_DIRECTORY ${directory}
                 OUTPUT_VARIABLE actual_out
                 ERROR_VARIABLE actual_err
