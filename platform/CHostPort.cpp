@@ -55,6 +55,14 @@ CHostPort& CHostPort::operator=(CString const& text) {
 }
 
 bool CHostPort::Parse(char const* text, size_t length) {
+  return parse(text, length, false);
+}
+
+bool CHostPort::ParseUriHostPort(char const* text, size_t length) {
+  return parse(text, length, true);
+}
+
+bool CHostPort::parse(char const* text, size_t length, bool uriHost) {
   if (!text || length == 0) {
     Reset();
     return false;
@@ -72,6 +80,8 @@ bool CHostPort::Parse(char const* text, size_t length) {
     bool valid = hostEnd > 0;
     for (size_t i = 0; valid && i < hostEnd; ++i)
       valid = isHostNameCharacter(static_cast<unsigned char>(text[i]));
+    if (valid && uriHost)
+      valid = SipGrammar::isHostName(text, hostEnd) || SipGrammar::isIpv4Address(text, hostEnd);
     if (!valid) {
       Reset();
       return false;

@@ -12,11 +12,26 @@
 
 // A value type; copies are independent. Host texts of IPv6 references keep
 // their brackets ("[::1]"), so "%s:%u" of host and port is again a valid
-// host-port. Hosts may contain "*" so that wildcard domains such as
-// "*.example.com" can be configured. Equality is that of the port and of
-// the host text ignoring ASCII case, since SIP compares hosts without regard
-// to case: a request for "Example.COM" reaches the domain "example.com". The
-// host is still kept and printed as written.
+// host-port.
+//
+// Two host grammars, one per source of text. Configuration writes domains
+// as patterns, so Parse and assignment from CString accept a wildcard
+// ("*.example.com") and any run of letters, digits and "-._*". A URI from
+// the network names one host, so ParseUriHostPort, which CSipUri uses,
+// accepts only a host name of dot-separated labels (letters, digits and
+// inner hyphens; the last label starts with a letter; one trailing dot
+// allowed), an IPv4 address (four decimal parts of one to three digits,
+// each at most 255) or a bracketed IPv6 reference; CTelUri holds the
+// phone context, which the lookups turn into a host, to the same host-name
+// rule. Where the two meet, in domain matching by equality, a request can
+// therefore never name a wildcard domain literally: "*" is configuration's,
+// never a host. Every host that ParseUriHostPort accepts, Parse accepts
+// with the same value.
+//
+// Equality is that of the port and of the host text ignoring ASCII case,
+// since SIP compares hosts without regard to case: a request for
+// "Example.COM" reaches the domain "example.com". The host is still kept
+// and printed as written.
 class LS_EXPORT CHostPort {
  public:
   // The port value that is not printed. The stand-in has no separate "use
@@ -40,6 +55,9 @@ class LS_EXPORT CHostPort {
   // the value is Reset() and false returned.
   bool Parse(char const* text, size_t length);
 
+  // As Parse, but the host must follow the URI host grammar above.
+  bool ParseUriHostPort(char const* text, size_t length);
+
   void Reset();
 
   CString const& GetHost() const { return m_host; }
@@ -52,6 +70,8 @@ class LS_EXPORT CHostPort {
   friend bool operator!=(CHostPort const& a, CHostPort const& b) { return !(a == b); }
 
  private:
+  bool parse(char const* text, size_t length, bool uriHost);
+
   CString m_host;
   unsigned short m_port = 0;
 };

@@ -101,7 +101,7 @@ bool CSipUri::assign(char const* text, size_t length) {
     ++hostEnd;
   size_t const headers = SipGrammar::find(text, hostEnd, length, '?');
   CHostPort hostPort;
-  if (!hostPort.Parse(text + hostBegin, hostEnd - hostBegin))
+  if (!hostPort.ParseUriHostPort(text + hostBegin, hostEnd - hostBegin))
     return false;
   if (!isParameterList(text + hostEnd, headers - hostEnd) || !isHeaderList(text + headers, length - headers))
     return false;

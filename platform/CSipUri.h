@@ -15,8 +15,11 @@ class LS_EXPORT CSipUri {
  public:
   CSipUri() = default;
 
-  // Parses a whole URI, scheme included ("sip:" or "sips:", any case). On
-  // malformed text the value is reset and false returned.
+  // Parses a whole URI, scheme included ("sip:" or "sips:", any case). The
+  // host follows the strict URI grammar of CHostPort::ParseUriHostPort: a
+  // wildcard or a malformed name from the network is malformed text, not a
+  // host to match against configured domains. On malformed text the value
+  // is reset and false returned.
   bool Parse(char const* text, size_t length);
 
   // True for a "sips:" URI.

@@ -23,6 +23,12 @@ bool isNumber(char const* text, size_t length) {
   return sawDigit;
 }
 
+bool isPhoneContext(char const* text, size_t length) {
+  if (length > 0 && text[0] == '+')
+    return isNumber(text, length);
+  return SipGrammar::isHostName(text, length);
+}
+
 bool isParameterNameCharacter(unsigned char c) {
   return SipGrammar::isAlphaNum(c) || c == '-';
 }
@@ -62,7 +68,7 @@ bool CTelUri::assign(char const* text, size_t length) {
         !SipGrammar::isEscapedRun(text + equals + 1, end - equals - 1, SipGrammar::isParameterCharacter))
       return false;
     if (SipGrammar::equalsIgnoreCase(text + begin, equals - begin, "phone-context")) {
-      if (hasPhoneContext || equals == end)
+      if (hasPhoneContext || equals == end || !isPhoneContext(text + equals + 1, end - equals - 1))
         return false;
       hasPhoneContext = true;
       phoneContextBegin = equals + 1;

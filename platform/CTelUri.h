@@ -18,8 +18,11 @@ class LS_EXPORT CTelUri {
   // either global ("+" and digits) or local (hex digits, "*", "#"), each
   // with the visual separators "-.()" anywhere and at least one digit.
   // A parameter is ";name[=value]" with a non-empty value when "=" is given;
-  // "phone-context" (any case) must carry a value and may appear once. On
-  // malformed text the value is reset and false returned.
+  // "phone-context" (any case) may appear once and must carry a host name
+  // (SipGrammar::isHostName) or a global number. The context becomes the
+  // host that selects a location service, so it obeys the same rule as a
+  // SIP URI's host: no wildcard from the network. On malformed text the
+  // value is reset and false returned.
   bool Parse(char const* text, size_t length);
 
   // The number as written, visual separators included.

@@ -79,6 +79,15 @@ bool isEscapedRun(char const* text, size_t length, Predicate allowed) {
 // lower-case literal word.
 bool equalsIgnoreCase(char const* text, size_t length, char const* word);
 
+// A host name as a URI from the network may carry it: "example.com",
+// "gw-1.example.com."; no wildcard, no empty label, no label that starts
+// or ends with '-', and a last label that starts with a letter.
+bool isHostName(char const* text, size_t length);
+
+// A dotted-quad IPv4 address of one to three digits per part, each part
+// at most 255.
+bool isIpv4Address(char const* text, size_t length);
+
 // Position of the first byte equal to c in [from, length), or length.
 size_t find(char const* text, size_t from, size_t length, char c);
 

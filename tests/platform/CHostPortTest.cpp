@@ -65,6 +65,41 @@ INSTANTIATE_TEST_SUITE_P(NulBytes,
                                            std::string("[::1\0]", 6),
                                            std::string("host:50\00060", 10)));
 
+// Configuration may write what a URI from the network may not; whatever
+// both accept, they read as the same value.
+struct HostGrammarCase {
+  char const* text;
+  bool configured;
+  bool uri;
+};
+
+class CHostPortGrammar : public ::testing::TestWithParam<HostGrammarCase> {};
+
+TEST_P(CHostPortGrammar, UriHostsAreTheStrictSubsetOfConfiguredOnes) {
+  std::string const text = GetParam().text;
+  CHostPort configured;
+  CHostPort uri(CString("previous"), 1);
+  EXPECT_EQ(GetParam().configured, configured.Parse(text.data(), text.size()));
+  EXPECT_EQ(GetParam().uri, uri.ParseUriHostPort(text.data(), text.size()));
+  EXPECT_EQ(GetParam().uri ? configured : CHostPort(), uri);
+}
+
+INSTANTIATE_TEST_SUITE_P(Table,
+                         CHostPortGrammar,
+                         ::testing::Values(HostGrammarCase{"gw-1.Example.com.:5060", true, true},
+                                           HostGrammarCase{"a", true, true},
+                                           HostGrammarCase{"010.0.0.255", true, true},
+                                           HostGrammarCase{"[2001:db8::1]:5061", true, true},
+                                           HostGrammarCase{"*.example.com", true, false},
+                                           HostGrammarCase{"sip_gw.local", true, false},
+                                           HostGrammarCase{"a..example.com", true, false},
+                                           HostGrammarCase{"-a.example.com", true, false},
+                                           HostGrammarCase{"a-.example.com", true, false},
+                                           HostGrammarCase{"example.123", true, false},
+                                           HostGrammarCase{"10.0.0.256", true, false},
+                                           HostGrammarCase{"10.0.0", true, false},
+                                           HostGrammarCase{"0001.0.0.1", true, false}));
+
 TEST(CHostPort, AcceptsA64KiBHost) {
   std::string const text(64 * 1024, 'a');
   CHostPort hostPort;

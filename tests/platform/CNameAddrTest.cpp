@@ -103,13 +103,14 @@ INSTANTIATE_TEST_SUITE_P(SipUri,
                          ::testing::ValuesIn(std::vector<std::string>(
                              {"sip:", "sip:@h", "sip:a@", "sip:a@b@h", "sip:a b@h", "sip:%6@h", "sip:%zz@h",
                               "sip:a@h:99999", "sip:a@[::1", "sip:a@[zz::1]", "sip:a@h;=x",
-                              "sip:a@h;x=", "sip:a@h?novalue", "sip:a@h\r\n"})));
+                              "sip:a@h;x=", "sip:a@h?novalue", "sip:a@h\r\n", "sip:a@*.example.com"})));
 
 INSTANTIATE_TEST_SUITE_P(TelAndOtherUris,
                          CNameAddrMalformed,
                          ::testing::ValuesIn(std::vector<std::string>(
                              {"tel:", "tel:+", "tel:+49a", "tel:12 34", "tel:1234;phone-context=",
                               "tel:1234;phone-context", "tel:1234;phone-context=a;phone-context=b",
+                              "tel:1234;phone-context=*.example.com", "tel:1234;phone-context=+",
                               "mailto:", "mailto:a b", "<mailto:<a>>"})));
 
 INSTANTIATE_TEST_SUITE_P(NulBytesAndLength,
