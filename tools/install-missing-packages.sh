@@ -20,5 +20,12 @@ if [ "$(id -u)" != 0 ]; then
 fi
 echo "Installing ${missing[*]}" >&2
 export DEBIAN_FRONTEND=noninteractive
-$sudo apt-get update
+# A mirror caught mid-sync fails an update now and then; try again.
+for attempt in 1 2 3; do
+  if $sudo apt-get update; then
+    break
+  fi
+  [ $attempt = 3 ] && exit 1
+  sleep 20
+done
 $sudo apt-get install -y --no-install-recommends "${missing[@]}"
