@@ -20,12 +20,13 @@ if [ "$(id -u)" != 0 ]; then
 fi
 echo "Installing ${missing[*]}" >&2
 export DEBIAN_FRONTEND=noninteractive
-# A mirror caught mid-sync fails an update now and then; try again.
+# A mirror caught mid-sync fails an update of one index now and then: try
+# again, then go on with the lists there are; the install itself must work.
 for attempt in 1 2 3; do
   if $sudo apt-get update; then
     break
   fi
-  [ $attempt = 3 ] && exit 1
-  sleep 20
+  echo "package-list update failed (attempt $attempt)" >&2
+  sleep 5
 done
 $sudo apt-get install -y --no-install-recommends "${missing[@]}"
