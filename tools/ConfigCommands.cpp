@@ -48,7 +48,8 @@ V valueOf(Args const& arguments, char const* name) {
 // applies to the first interface the named object implements.
 class Settings {
  public:
-  using Resolve = std::function<bool(Session&, Args const&, bool set)>;
+  // Applies the line to one interface; false when the object lacks it.
+  using Apply = std::function<bool(Session&, Args const&, bool set)>;
 
   Settings(std::string prefix, std::string owner) : m_prefix(std::move(prefix)), m_owner(std::move(owner)) {}
 
@@ -81,7 +82,7 @@ class Settings {
         std::string const pattern = start + (setting ? " set <" + entry.placeholder + ">" : " remove");
         std::string const owner = m_owner;
         table.add(pattern, entry.operations, [entry, setting, owner](Session& session, Args const& arguments) {
-          for (Resolve const& apply : entry.appliers)
+          for (Apply const& apply : entry.appliers)
             if (apply(session, arguments, setting))
               return;
           throw CommandError(arguments.column(owner.c_str()),
@@ -96,7 +97,7 @@ class Settings {
     std::string setting;
     std::string placeholder;
     std::string operations;
-    std::vector<Resolve> appliers;
+    std::vector<Apply> appliers;
   };
 
   Entry& entryFor(char const* setting, char const* placeholder) {

@@ -1,24 +1,49 @@
 #!/usr/bin/env bash
 # Installs those of the Debian packages named on the command line that the
 # machine lacks, through sudo when not run as root. Installs nothing, and
-# needs no network, when every package is there already.
+# needs no network, when every package is there already. A package of
+# another architecture ("libre2-dev:armhf") adds that architecture first.
+#
+# usage: install-missing-packages.sh [--refresh] PACKAGE...
+# With --refresh the package lists are updated and every package named is
+# installed as on a new machine, whether or not it is there.
 set -euo pipefail
 
-missing=()
-for package in "$@"; do
-  if ! dpkg-query -W -f='${Status}' "$package" 2>/dev/null | grep -q 'install ok installed'; then
-    missing+=("$package")
-  fi
-done
-if [ ${#missing[@]} -eq 0 ]; then
-  exit 0
+refresh=false
+if [ "${1:-}" = --refresh ]; then
+  refresh=true
+  shift
 fi
-
 sudo=""
 if [ "$(id -u)" != 0 ]; then
   sudo=sudo
 fi
-echo "Installing ${missing[*]}" >&2
+
+for package in "$@"; do
+  case $package in
+    *:*)
+      architecture=${package##*:}
+      if ! dpkg --print-foreign-architectures | grep -qx "$architecture"; then
+        $sudo dpkg --add-architecture "$architecture"
+      fi
+      ;;
+  esac
+done
+
+wanted=("$@")
+if [ $refresh = false ]; then
+  wanted=()
+  for package in "$@"; do
+    if ! dpkg-query -W -f='${Status}' "$package" 2>/dev/null | grep -q 'install ok installed'; then
+      wanted+=("$package")
+    fi
+  done
+fi
+if [ ${#wanted[@]} -eq 0 ]; then
+  exit 0
+fi
+
+echo "Installing ${wanted[*]}" >&2
 export DEBIAN_FRONTEND=noninteractive
 # A mirror caught mid-sync fails an update of one index now and then: try
 # again, then go on with the lists there are; the install itself must work.
@@ -29,4 +54,4 @@ for attempt in 1 2 3; do
   echo "package-list update failed (attempt $attempt)" >&2
   sleep 5
 done
-$sudo apt-get install -y --no-install-recommends "${missing[@]}"
+$sudo apt-get install -y --no-install-recommends "${wanted[@]}"
