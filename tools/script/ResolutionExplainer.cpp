@@ -80,7 +80,7 @@ RefPtr<LS_IIdentity> ResolutionExplainer::identityIn(LS_ILocationService* servic
 }
 
 RefPtr<LS_IIdentity> ResolutionExplainer::explain(CNameAddr const& nameAddr) {
-  ConsoleSession::StackSettings const& stack = m_session.stack();
+  ScriptSession::StackSettings const& stack = m_session.stack();
   String error;
   String user;
   CHostPort host;

@@ -11,11 +11,11 @@
 #include <ostream>
 
 #include "CNameAddr.h"
-#include "ConsoleSession.h"
+#include "ScriptSession.h"
 
 class ResolutionExplainer {
  public:
-  ResolutionExplainer(ConsoleSession& session, std::ostream& out) : m_session(session), m_out(out) {}
+  ResolutionExplainer(ScriptSession& session, std::ostream& out) : m_session(session), m_out(out) {}
 
   // The identity found, or null.
   RefPtr<LS_IIdentity> explain(CNameAddr const& nameAddr);
@@ -27,6 +27,6 @@ class ResolutionExplainer {
   static std::string aliasMatch(LS_IIdentity* identity, String const& user);
   RefPtr<LS_ILocationService> serviceNamed(String const& name);
 
-  ConsoleSession& m_session;
+  ScriptSession& m_session;
   std::ostream& m_out;
 };

@@ -14,11 +14,11 @@
 #include <string>
 
 #include "CommandTable.h"
-#include "ConsoleSession.h"
+#include "ScriptSession.h"
 
 class ScriptRunner {
  public:
-  ScriptRunner(ConsoleSession& session, CommandTable const& table, std::ostream& out, std::ostream& errors)
+  ScriptRunner(ScriptSession& session, CommandTable const& table, std::ostream& out, std::ostream& errors)
       : m_session(session), m_table(table), m_out(out), m_errors(errors) {}
 
   void keepGoing(bool keepGoing) { m_keepGoing = keepGoing; }
@@ -30,7 +30,7 @@ class ScriptRunner {
   bool anyLineFailed() const { return m_anyLineFailed; }
 
  private:
-  ConsoleSession& m_session;
+  ScriptSession& m_session;
   CommandTable const& m_table;
   std::ostream& m_out;
   std::ostream& m_errors;

@@ -1,11 +1,11 @@
 #include "ModelWatcher.h"
 
-#include "ConsoleSession.h"
 #include "LS_ILocationServiceSubject.h"
 #include "LS_IMasterLocationServiceSubject.h"
 #include "LS_IMwiSubscriptionSubject.h"
 #include "LS_IRegistrationInboundSubject.h"
 #include "LS_IRegistrationOutboundSubject.h"
+#include "ScriptSession.h"
 
 namespace {
 
@@ -16,7 +16,7 @@ std::string identityOf(ObserverEvent<Face>& event) {
   auto const* concerned = dynamic_cast<typename Subject::EvIdentity*>(&event);
   if (!concerned || !concerned->identity)
     return "?";
-  return ConsoleSession::pathOf(concerned->identity.get());
+  return ScriptSession::pathOf(concerned->identity.get());
 }
 
 }  // namespace

@@ -1,5 +1,5 @@
-// FaceNames: the words the console uses for an identity's seven faces, in
-// the order of LS_IdentityFace's values. They are the faces' element names,
+// FaceNames: the words the script language uses for an identity's seven faces,
+// in the order of LS_IdentityFace's values. They are the faces' element names,
 // which people already see in logs; the enumeration's own texts hold blanks
 // ("Outbound Registration") and would need quoting on every line.
 #pragma once

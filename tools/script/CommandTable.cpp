@@ -5,6 +5,7 @@
 #include <cstring>
 #include <set>
 
+#include "FaceNames.h"
 #include "LS_AuthenticationProtocol.h"
 #include "LS_FilterType.h"
 #include "LS_ForcedDestination.h"
@@ -17,7 +18,6 @@
 #include "LS_RegistrationMode.h"
 #include "LS_UriScheme.h"
 #include "LS_User.h"
-#include "FaceNames.h"
 
 namespace {
 
@@ -267,7 +267,7 @@ bool CommandTable::match(Command const& command,
   return true;
 }
 
-void CommandTable::run(ConsoleSession& session, ScriptLine const& line) const {
+void CommandTable::run(ScriptSession& session, ScriptLine const& line) const {
   if (line.words().empty())
     return;
   // The furthest any command fitted, and everything that would have fitted

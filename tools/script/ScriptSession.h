@@ -1,9 +1,10 @@
-// ConsoleSession: what the console stands in for, held together for one
-// run: the driver host (both masters, built and registered in an installed
-// driver repository), the configuration layer's way to name objects, and the
-// SIP stack's settings for the questions it asks (which location services to
-// ask, the gateway's own host-ports, the imperative, the "DEFAULT" fallback).
-// Commands reach the model only through the library's public interfaces.
+// ScriptSession: what a host program of the script language (the console, the
+// SIP front-end) stands in for, held together for one run: the driver host
+// (both masters, built and registered in an installed driver repository), the
+// configuration layer's way to name objects, and the SIP stack's settings for
+// the questions it asks (which location services to ask, the gateway's own
+// host-ports, the imperative, the "DEFAULT" fallback). Commands reach the
+// model only through the library's public interfaces.
 //
 // Everything a command prints goes to output(); the script runner decides
 // when to show it. The session dies before the process leaves main: it
@@ -32,7 +33,7 @@
 
 class ModelWatcher;
 
-class ConsoleSession {
+class ScriptSession {
  public:
   // What the SIP stack passes to every lookup.
   struct StackSettings {
@@ -44,10 +45,10 @@ class ConsoleSession {
     bool useDefault = true;
   };
 
-  ConsoleSession();
-  ~ConsoleSession();
-  ConsoleSession(ConsoleSession const&) = delete;
-  ConsoleSession& operator=(ConsoleSession const&) = delete;
+  ScriptSession();
+  ~ScriptSession();
+  ScriptSession(ScriptSession const&) = delete;
+  ScriptSession& operator=(ScriptSession const&) = delete;
 
   std::ostringstream& output() { return m_output; }
   // What was printed since the last call.
@@ -90,7 +91,7 @@ class ConsoleSession {
   // The identity's own face, configured or dynamic; throws when it has none.
   RefPtr<IUnknown> ownFace(Arguments const& arguments) const;
 
-  // "service/identity", as the console names identities in what it prints.
+  // "service/identity", as the host programs name identities in what they print.
   static std::string pathOf(LS_IIdentity const* identity);
 
  private:

@@ -1,4 +1,4 @@
-#include "ConsoleSession.h"
+#include "ScriptSession.h"
 
 #include "DebugMonitor.h"
 #include "FaceNames.h"
@@ -12,7 +12,7 @@ constexpr unsigned int kLibraryMonitor = 57;
 
 }  // namespace
 
-ConsoleSession::ConsoleSession()
+ScriptSession::ScriptSession()
     : m_repository(adoptRef(new CDriverRepository)),
       m_locationMaster(adoptRef(new LS_CMasterLocationService)),
       m_authenticationMaster(adoptRef(new LS_CMasterAuthenticationService)),
@@ -24,19 +24,19 @@ ConsoleSession::ConsoleSession()
   SYSTEM::SET_DRIVER_REPOSITORY(m_repository.get());
 }
 
-ConsoleSession::~ConsoleSession() {
+ScriptSession::~ScriptSession() {
   showDebugLines(false);
   m_watcher.reset();
   SYSTEM::SET_DRIVER_REPOSITORY(nullptr);
 }
 
-std::string ConsoleSession::takeOutput() {
+std::string ScriptSession::takeOutput() {
   std::string const text = m_output.str();
   m_output.str(std::string());
   return text;
 }
 
-void ConsoleSession::showDebugLines(bool show) {
+void ScriptSession::showDebugLines(bool show) {
   if (!show) {
     DebugMonitor::disable(kLibraryMonitor);
     return;
@@ -51,22 +51,22 @@ void ConsoleSession::showDebugLines(bool show) {
 }
 
 template <class T>
-RefPtr<T> ConsoleSession::serviceAs(Arguments const& arguments) const {
+RefPtr<T> ScriptSession::serviceAs(Arguments const& arguments) const {
   RefPtr<T> found;
   if (LS_getLocationServiceIf(m_locationMaster.get(), arguments.text("service").c_str(), found).isFailure())
     throw CommandError(arguments.column("service"), "no location service \"" + arguments.text("service") + "\"");
   return found;
 }
 
-RefPtr<LS_ILocationServiceConfig> ConsoleSession::serviceConfig(Arguments const& arguments) const {
+RefPtr<LS_ILocationServiceConfig> ScriptSession::serviceConfig(Arguments const& arguments) const {
   return serviceAs<LS_ILocationServiceConfig>(arguments);
 }
 
-RefPtr<LS_ILocationService> ConsoleSession::service(Arguments const& arguments) const {
+RefPtr<LS_ILocationService> ScriptSession::service(Arguments const& arguments) const {
   return serviceAs<LS_ILocationService>(arguments);
 }
 
-RefPtr<LS_IIdentityConfig> ConsoleSession::identityConfig(Arguments const& arguments) const {
+RefPtr<LS_IIdentityConfig> ScriptSession::identityConfig(Arguments const& arguments) const {
   RefPtr<LS_IIdentityConfig> found;
   if (LS_getConfigIdentityIf(serviceConfig(arguments).get(), arguments.text("identity").c_str(), found).isFailure())
     throw CommandError(arguments.column("identity"), "no configured identity \"" + arguments.text("identity") +
@@ -75,7 +75,7 @@ RefPtr<LS_IIdentityConfig> ConsoleSession::identityConfig(Arguments const& argum
   return found;
 }
 
-RefPtr<LS_IIdentity> ConsoleSession::identity(Arguments const& arguments) const {
+RefPtr<LS_IIdentity> ScriptSession::identity(Arguments const& arguments) const {
   RefPtr<LS_IIdentity> found;
   if (LS_getIdentityIf(service(arguments).get(), arguments.text("identity").c_str(), found).isFailure())
     throw CommandError(arguments.column("identity"), "no identity \"" + arguments.text("identity") +
@@ -84,7 +84,7 @@ RefPtr<LS_IIdentity> ConsoleSession::identity(Arguments const& arguments) const 
   return found;
 }
 
-RefPtr<LS_IAuthenticationService> ConsoleSession::authenticationService(Arguments const& arguments) const {
+RefPtr<LS_IAuthenticationService> ScriptSession::authenticationService(Arguments const& arguments) const {
   RefPtr<LS_IAuthenticationService> found;
   std::string const& name = arguments.text("authentication-service");
   if (LS_getAuthenticationServiceIf(m_authenticationMaster.get(), name.c_str(), found).isFailure())
@@ -92,7 +92,7 @@ RefPtr<LS_IAuthenticationService> ConsoleSession::authenticationService(Argument
   return found;
 }
 
-RefPtr<IUnknown> ConsoleSession::ownFace(Arguments const& arguments) const {
+RefPtr<IUnknown> ScriptSession::ownFace(Arguments const& arguments) const {
   RefPtr<LS_IIdentityConfig> const identity = identityConfig(arguments);
   RefPtr<IUnknown> face;
   LS_IdentityFace::Type const type = arguments.choice<LS_IdentityFace>("face");
@@ -106,7 +106,7 @@ RefPtr<IUnknown> ConsoleSession::ownFace(Arguments const& arguments) const {
   return face;
 }
 
-std::string ConsoleSession::pathOf(LS_IIdentity const* identity) {
+std::string ScriptSession::pathOf(LS_IIdentity const* identity) {
   RefPtr<LS_ILocationService> service;
   adoptInterface(service, [&](UUID const& iid, void** raw) { return identity->getLocationServiceIf(iid, raw); });
   return (service ? service->getName().str() : std::string("?")) + "/" + identity->getName().str();

@@ -3,7 +3,6 @@
 #include <functional>
 #include <type_traits>
 
-#include "ConsoleSession.h"
 #include "FaceNames.h"
 #include "LS_IAuthenticationConfig.h"
 #include "LS_ICallConfig.h"
@@ -13,10 +12,11 @@
 #include "LS_IRegistrationInboundConfig.h"
 #include "LS_IRegistrationOutboundConfig.h"
 #include "RegEx.h"
+#include "ScriptSession.h"
 
 namespace {
 
-using Session = ConsoleSession;
+using Session = ScriptSession;
 using Args = Arguments;
 
 // The longest base chain the location service accepts above a new identity.

@@ -1,6 +1,5 @@
 #include "StackCommands.h"
 
-#include "ConsoleSession.h"
 #include "FaceNames.h"
 #include "LS_AddressText.h"
 #include "LS_CredentialLookup.h"
@@ -12,11 +11,12 @@
 #include "LS_IdentityResolution.h"
 #include "LS_ServiceResolution.h"
 #include "ResolutionExplainer.h"
+#include "ScriptSession.h"
 #include "SipStatistics.h"
 
 namespace {
 
-using Session = ConsoleSession;
+using Session = ScriptSession;
 using Args = Arguments;
 
 std::string quoted(String const& text) {

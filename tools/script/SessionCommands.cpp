@@ -1,13 +1,13 @@
 #include "SessionCommands.h"
 
-#include "ConsoleSession.h"
 #include "IInfo.h"
 #include "InfoContainer.h"
 #include "ModelWatcher.h"
+#include "ScriptSession.h"
 
 namespace {
 
-using Session = ConsoleSession;
+using Session = ScriptSession;
 using Args = Arguments;
 
 // Deep enough for any object of the model, and every detail.

@@ -1,9 +1,9 @@
-// ModelWatcher: the console's observer of the whole location model. While
-// watching it is registered with the master location service, every
-// location service and every identity (configured and dynamic), follows the
-// services and identities that are added, and prints one line per event
-// into the session's output as the event happens, so that a change on a
-// group shows up once for every identity derived from it.
+// ModelWatcher: the host program's observer of the whole location model. While
+// watching it is registered with the master location service, every location
+// service and every identity (configured and dynamic), follows the services
+// and identities that are added, and prints one line per event into the
+// session's output as the event happens, so that a change on a group shows up
+// once for every identity derived from it.
 //
 // Owned by the session. It holds a counted reference to every subject it is
 // registered with and unregisters from all of them when watching stops or
@@ -22,7 +22,7 @@
 #include "LS_IRegistrationOutboundObserver.h"
 #include "RefPtr.h"
 
-class ConsoleSession;
+class ScriptSession;
 
 class ModelWatcher : public LS_IMasterLocationServiceObserver,
                      public LS_ILocationServiceObserver,
@@ -30,7 +30,7 @@ class ModelWatcher : public LS_IMasterLocationServiceObserver,
                      public LS_IRegistrationInboundObserver,
                      public LS_IMwiSubscriptionObserver {
  public:
-  explicit ModelWatcher(ConsoleSession& session) : m_session(session) {}
+  explicit ModelWatcher(ScriptSession& session) : m_session(session) {}
   ~ModelWatcher();
   ModelWatcher(ModelWatcher const&) = delete;
   ModelWatcher& operator=(ModelWatcher const&) = delete;
@@ -58,7 +58,7 @@ class ModelWatcher : public LS_IMasterLocationServiceObserver,
   void observeIdentity(LS_IIdentity* identity, bool observe);
   void print(std::string const& line);
 
-  ConsoleSession& m_session;
+  ScriptSession& m_session;
   bool m_watching = false;
   std::vector<RefPtr<LS_ILocationService>> m_services;
   std::vector<RefPtr<LS_IIdentity>> m_identities;

@@ -1,9 +1,9 @@
-// ScriptLine: one line of a console script cut into words, each with the
-// column it starts at, so that every complaint about the line can point at
-// the word it is about. Words are separated by blanks and tabs; a word in
-// double quotes may hold blanks, and inside quotes \" and \\ stand for " and
-// \. A "#" that begins a word starts a comment running to the end of the
-// line. What the words mean belongs to the command table.
+// ScriptLine: one line of a script cut into words, each with the column it
+// starts at, so that every complaint about the line can point at the word it
+// is about. Words are separated by blanks and tabs; a word in double quotes
+// may hold blanks, and inside quotes \" and \\ stand for " and \. A "#" that
+// begins a word starts a comment running to the end of the line. What the
+// words mean belongs to the command table.
 #pragma once
 
 #include <stdexcept>

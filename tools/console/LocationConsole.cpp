@@ -13,12 +13,10 @@
 #include <vector>
 
 #include "CommandTable.h"
-#include "ConfigCommands.h"
-#include "ConsoleSession.h"
 #include "DefaultSession.h"
+#include "ScriptLanguage.h"
 #include "ScriptRunner.h"
-#include "SessionCommands.h"
-#include "StackCommands.h"
+#include "ScriptSession.h"
 
 namespace {
 
@@ -38,16 +36,6 @@ char const kUsage[] =
     "Exit status: 0, 1 when a line could not be applied, 2 for a usage error\n"
     "or a script that cannot be read.\n";
 
-void buildTable(CommandTable& table) {
-  addConfigCommands(table);
-  addStackCommands(table);
-  addSessionCommands(table);
-  table.add("help [<topic>]", "the command reference, or the commands that begin with topic",
-            [&table](ConsoleSession& session, Arguments const& arguments) {
-              session.output() << table.reference(arguments.has("topic") ? arguments.text("topic") : "");
-            });
-}
-
 }  // namespace
 
 int main(int argc, char** argv) {
@@ -55,7 +43,7 @@ int main(int argc, char** argv) {
   bool keepGoing = false;
   std::vector<std::string> scripts;
   CommandTable table;
-  buildTable(table);
+  addScriptCommands(table);
   for (int i = 1; i < argc; ++i) {
     std::string const argument = argv[i];
     if (argument == "--debug") {
@@ -76,7 +64,7 @@ int main(int argc, char** argv) {
     }
   }
 
-  ConsoleSession session;
+  ScriptSession session;
   session.showDebugLines(debug);
   ScriptRunner runner(session, table, std::cout, std::cerr);
   runner.keepGoing(keepGoing);

@@ -1,6 +1,6 @@
-// CommandTable: the console's command language. Each command is a pattern
-// of words with a handler; a line runs the first command whose pattern it
-// matches in full. A pattern is written the way the reference shows it:
+// CommandTable: the script language of the host programs. Each command is a
+// pattern of words with a handler; a line runs the first command whose pattern
+// it matches in full. A pattern is written the way the reference shows it:
 //
 //   location-service <service> domain insert <index> <domain>
 //
@@ -28,7 +28,7 @@
 #include "IpAddress.h"
 #include "ScriptLine.h"
 
-class ConsoleSession;
+class ScriptSession;
 
 // The values of one matched line, by the names their pattern gives them.
 class Arguments {
@@ -72,7 +72,7 @@ class Arguments {
 
 class CommandTable {
  public:
-  using Handler = std::function<void(ConsoleSession&, Arguments const&)>;
+  using Handler = std::function<void(ScriptSession&, Arguments const&)>;
 
   // pattern as described above; summary is one line for the reference.
   void add(std::string const& pattern, std::string const& summary, Handler handler);
@@ -80,7 +80,7 @@ class CommandTable {
   // Runs the command the line names. Throws CommandError, naming the word
   // where no pattern fits and what would have fitted there, or passes on the
   // handler's CommandError.
-  void run(ConsoleSession& session, ScriptLine const& line) const;
+  void run(ScriptSession& session, ScriptLine const& line) const;
 
   // The reference: every pattern whose first word is topic (all when topic
   // is empty), with its summary, in table order.
