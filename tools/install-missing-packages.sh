@@ -54,4 +54,25 @@ for attempt in 1 2 3; do
   echo "package-list update failed (attempt $attempt)" >&2
   sleep 5
 done
-$sudo apt-get install -y --no-install-recommends "${wanted[@]}"
+# A library that is Multi-Arch: same must be at one version in every
+# architecture. When another architecture's index lags behind the native
+# one's (its security mirror failing to update, say), the install fails on
+# that library: install it then in both architectures at the version the
+# other architecture has, and try once more.
+log=$(mktemp)
+trap 'rm -f "$log"' EXIT
+if $sudo apt-get install -y --no-install-recommends "${wanted[@]}" 2>&1 | tee "$log"; then
+  exit 0
+fi
+aligned=()
+for library in $(sed -n 's/.* Depends: \([^ :]*\):\([^ ]*\) .*/\1:\2/p' "$log" | sort -u); do
+  version=$(apt-cache policy "$library" | sed -n 's/^ *Candidate: //p')
+  if [ -n "$version" ] && [ "$version" != "(none)" ]; then
+    aligned+=("${library%%:*}=$version" "$library=$version")
+  fi
+done
+if [ ${#aligned[@]} -eq 0 ]; then
+  exit 1
+fi
+echo "Aligning ${aligned[*]}" >&2
+$sudo apt-get install -y --no-install-recommends --allow-downgrades "${aligned[@]}" "${wanted[@]}"
