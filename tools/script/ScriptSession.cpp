@@ -1,7 +1,10 @@
 #include "ScriptSession.h"
 
+#include <iostream>
+
 #include "DebugMonitor.h"
 #include "FaceNames.h"
+#include "LS_IdentityResolution.h"
 #include "ModelWatcher.h"
 #include "SystemRepository.h"
 
@@ -48,6 +51,12 @@ void ScriptSession::showDebugLines(bool show) {
       text += '\n';
     m_output << "debug: " << text;
   });
+}
+
+void ScriptSession::flushDebugLines() {
+  if (m_output.tellp() == 0)
+    return;
+  std::cerr << takeOutput() << std::flush;
 }
 
 template <class T>
@@ -104,6 +113,16 @@ RefPtr<IUnknown> ScriptSession::ownFace(Arguments const& arguments) const {
                                                      arguments.text("identity") + " face " +
                                                      faceNames()[type] + " create");
   return face;
+}
+
+RefPtr<LS_IIdentity> ScriptSession::resolve(String& error, CNameAddr const& nameAddr) const {
+  RefPtr<LS_IIdentity> found;
+  if (m_stack.services.isEmpty())
+    LS_getIdentity(error, found, nameAddr, m_stack.useDefault, m_stack.localHostPorts, m_stack.imperative, nullptr);
+  else
+    LS_getIdentity(error, found, nameAddr, m_stack.services, m_stack.useDefault, m_stack.localHostPorts,
+                   m_stack.imperative, nullptr);
+  return found;
 }
 
 std::string ScriptSession::pathOf(LS_IIdentity const* identity) {

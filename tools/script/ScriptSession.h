@@ -60,6 +60,9 @@ class ScriptSession {
   ModelWatcher& watcher() { return *m_watcher; }
   // Shows the debug monitor's lines in the output, or stops showing them.
   void showDebugLines(bool show);
+  // For a host program that serves rather than runs a script: writes the
+  // debug lines gathered so far to standard error.
+  void flushDebugLines();
 
   // The objects a command names, by the argument names the patterns use
   // ("service", "identity", "face", "authentication-service"). Each throws a
@@ -90,6 +93,10 @@ class ScriptSession {
 
   // The identity's own face, configured or dynamic; throws when it has none.
   RefPtr<IUnknown> ownFace(Arguments const& arguments) const;
+
+  // LS_getIdentity with the stack settings: the identity nameAddr denotes,
+  // or null, with the lookup's message in error.
+  RefPtr<LS_IIdentity> resolve(String& error, CNameAddr const& nameAddr) const;
 
   // "service/identity", as the host programs name identities in what they print.
   static std::string pathOf(LS_IIdentity const* identity);

@@ -204,18 +204,6 @@ void addRunTimeCommands(CommandTable& table) {
             });
 }
 
-// LS_getIdentity with the stack settings.
-RefPtr<LS_IIdentity> resolve(Session& session, String& error, CNameAddr const& nameAddr) {
-  Session::StackSettings const& stack = session.stack();
-  RefPtr<LS_IIdentity> found;
-  if (stack.services.isEmpty())
-    LS_getIdentity(error, found, nameAddr, stack.useDefault, stack.localHostPorts, stack.imperative, nullptr);
-  else
-    LS_getIdentity(error, found, nameAddr, stack.services, stack.useDefault, stack.localHostPorts, stack.imperative,
-                   nullptr);
-  return found;
-}
-
 std::string identityText(LS_IIdentity const* identity) {
   return identity ? "identity " + Session::pathOf(identity) : "no identity";
 }
@@ -243,7 +231,7 @@ void addQuestionCommands(CommandTable& table) {
   table.add("resolve <name-addr>", "LS_getIdentity: the identity a request's name-addr denotes",
             [](Session& session, Args const& arguments) {
               String error;
-              RefPtr<LS_IIdentity> const found = resolve(session, error, arguments.nameAddr("name-addr"));
+              RefPtr<LS_IIdentity> const found = session.resolve(error, arguments.nameAddr("name-addr"));
               session.output() << identityText(found.get()) << "\n";
               printError(session, error);
             });
@@ -253,7 +241,7 @@ void addQuestionCommands(CommandTable& table) {
               RefPtr<LS_IIdentity> const explained = ResolutionExplainer(session, session.output()).explain(nameAddr);
               session.output() << "  result: " << identityText(explained.get()) << "\n";
               String error;
-              RefPtr<LS_IIdentity> const found = resolve(session, error, nameAddr);
+              RefPtr<LS_IIdentity> const found = session.resolve(error, nameAddr);
               if (found != explained)
                 session.output() << "  but the library answers " << identityText(found.get()) << "\n";
             });

@@ -1,0 +1,45 @@
+// Exchange: one request being answered. It carries what the answer needs (the
+// stack, the request, the session whose library answers, the log and the
+// clock) and what the log line says about the lookup, and sends the final
+// answer through a server transaction of the stack, which absorbs
+// retransmissions of the request and retransmits the answer itself. Each
+// exchange answers exactly once; the log line leaves with the answer.
+#pragma once
+
+#include <string>
+
+#include "LS_IIdentity.h"
+#include "Libre.h"
+#include "LibraryClock.h"
+#include "RefPtr.h"
+#include "RequestLog.h"
+#include "ScriptSession.h"
+
+class Exchange {
+ public:
+  Exchange(sip& stack, sip_msg const& request, ScriptSession& session, RequestLog& log, LibraryClock& clock)
+      : m_stack(stack), m_request(request), m_session(session), m_log(log), m_clock(clock) {}
+  Exchange(Exchange const&) = delete;
+  Exchange& operator=(Exchange const&) = delete;
+
+  sip_msg const& request() const { return m_request; }
+  ScriptSession& session() const { return m_session; }
+  LibraryClock& clock() const { return m_clock; }
+
+  // The identity that uri (a request URI or a To address, as received)
+  // denotes, recorded for the log line; nameAddr receives the parsed URI. Null when there is none, and then
+  // already answered: 400 for no name-addr, 416 for a scheme the library
+  // refuses, else 404.
+  RefPtr<LS_IIdentity> resolveOrAnswer(pl const& uri, CNameAddr& nameAddr);
+
+  // headers: complete header lines, each ending in CRLF.
+  void answer(uint16_t code, char const* reason, std::string const& headers = std::string());
+
+ private:
+  sip& m_stack;
+  sip_msg const& m_request;
+  ScriptSession& m_session;
+  RequestLog& m_log;
+  LibraryClock& m_clock;
+  std::string m_result = "-";
+};

@@ -1,0 +1,135 @@
+// location-gateway: the location-service library answering real SIP traffic
+// on libre. It reads its configuration from scripts in the console's
+// language, then serves as registrar (digest-authenticated REGISTER) and
+// redirect server (302 to where a subscriber is registered) on one UDP (and
+// TCP) address, and registers its trunks with their registrars, until
+// SIGINT or SIGTERM. It uses the library's public interfaces only.
+//
+// libre is chosen as the stack: Debian packages it for every architecture
+// the gateway runs on, it is small, runs everything on one event loop (which
+// the library, not internally synchronised, needs), and brings server and
+// client transactions, registration client and digest helpers.
+
+#include <cstring>
+#include <fstream>
+#include <iostream>
+#include <string>
+#include <vector>
+
+#include "CommandTable.h"
+#include "Libre.h"
+#include "LibraryClock.h"
+#include "ScriptLanguage.h"
+#include "ScriptRunner.h"
+#include "ScriptSession.h"
+#include "SipFrontEnd.h"
+
+namespace {
+
+char const kUsage[] =
+    "usage: location-gateway [--listen ADDR:PORT] [--debug] [--statistics] SCRIPT...\n"
+    "\n"
+    "Configures the library from the scripts (the console's language), then\n"
+    "answers SIP requests on ADDR:PORT (default 127.0.0.1:5060, UDP and TCP;\n"
+    "port 0 takes a free one) until SIGINT or SIGTERM. One line per request\n"
+    "answered on standard output: method, request URI, identity or the\n"
+    "library's error text, response code.\n"
+    "\n"
+    "  --debug       show the library's debug lines\n"
+    "  --statistics  at exit, the requests answered and the CPU time spent\n"
+    "                in the library's calls\n"
+    "\n"
+    "Exit status: 0 after a signal, 1 when a script line fails or the\n"
+    "address cannot be bound, 2 for a usage error or an unreadable script.\n";
+
+void onSignal(int) {
+  re_cancel();
+}
+
+struct Options {
+  std::string listen = "127.0.0.1:5060";
+  bool debug = false;
+  bool statistics = false;
+  std::vector<std::string> scripts;
+};
+
+// Options from the command line; false after printing the usage.
+bool parse(int argc, char** argv, Options& options) {
+  for (int i = 1; i < argc; ++i) {
+    std::string const argument = argv[i];
+    if (argument == "--listen" && i + 1 < argc)
+      options.listen = argv[++i];
+    else if (argument == "--debug")
+      options.debug = true;
+    else if (argument == "--statistics")
+      options.statistics = true;
+    else if (argument.size() > 1 && argument[0] == '-')
+      return false;
+    else
+      options.scripts.push_back(argument);
+  }
+  return !options.scripts.empty();
+}
+
+// 0 when every script ran, else the exit status.
+int runScripts(ScriptSession& session, std::vector<std::string> const& scripts) {
+  CommandTable table;
+  addScriptCommands(table);
+  ScriptRunner runner(session, table, std::cout, std::cerr);
+  for (std::string const& name : scripts) {
+    std::ifstream file(name);
+    if (!file) {
+      std::cerr << "location-gateway: cannot read " << name << ": " << std::strerror(errno) << "\n";
+      return 2;
+    }
+    if (!runner.run(file, name, false))
+      return 1;
+  }
+  std::cout.flush();
+  return 0;
+}
+
+int serve(ScriptSession& session, Options const& options) {
+  LibraryClock clock(options.statistics);
+  int status = 0;
+  {
+    SipFrontEnd frontEnd(session, clock);
+    std::string bound;
+    std::string error;
+    if (!frontEnd.start(options.listen, bound, error)) {
+      std::cerr << "location-gateway: " << error << "\n";
+      return 1;
+    }
+    std::cerr << "location-gateway: listening on udp:" << bound << std::endl;
+    re_main(onSignal);
+    frontEnd.shutDown();
+    if (options.statistics)
+      std::cerr << "location-gateway: " << frontEnd.requests() << " requests, " << clock.summary() << std::endl;
+  }
+  return status;
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+  Options options;
+  if (!parse(argc, argv, options)) {
+    std::cerr << kUsage;
+    return 2;
+  }
+  int status = 0;
+  {
+    ScriptSession session;
+    session.showDebugLines(options.debug);
+    status = runScripts(session, options.scripts);
+    if (status == 0) {
+      if (libre_init() != 0) {
+        std::cerr << "location-gateway: the SIP stack cannot start\n";
+        return 1;
+      }
+      status = serve(session, options);
+      libre_close();
+    }
+  }
+  return status;
+}

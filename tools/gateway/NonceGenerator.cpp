@@ -1,0 +1,72 @@
+#include "NonceGenerator.h"
+
+#include <cstdio>
+
+namespace {
+
+constexpr size_t kTimeDigits = 16;
+constexpr size_t kSignatureDigits = 40;
+
+std::string hex(uint8_t const* bytes, size_t length) {
+  static char const digits[] = "0123456789abcdef";
+  std::string text;
+  text.reserve(2 * length);
+  for (size_t i = 0; i < length; ++i) {
+    text += digits[bytes[i] >> 4];
+    text += digits[bytes[i] & 0xf];
+  }
+  return text;
+}
+
+// The value of exactly kTimeDigits lower-case hex digits, else false.
+bool parseTime(char const* text, uint64_t& value) {
+  value = 0;
+  for (size_t i = 0; i < kTimeDigits; ++i) {
+    char const c = text[i];
+    unsigned int digit;
+    if (c >= '0' && c <= '9')
+      digit = static_cast<unsigned int>(c - '0');
+    else if (c >= 'a' && c <= 'f')
+      digit = static_cast<unsigned int>(c - 'a' + 10);
+    else
+      return false;
+    value = (value << 4) | digit;
+  }
+  return true;
+}
+
+}  // namespace
+
+NonceGenerator::NonceGenerator() {
+  rand_bytes(m_key.data(), m_key.size());
+}
+
+std::string NonceGenerator::signature(uint64_t madeMs, pl const& realm) const {
+  char time[kTimeDigits + 1];
+  std::snprintf(time, sizeof time, "%016llx", static_cast<unsigned long long>(madeMs));
+  std::string data(time);
+  data += ':';
+  data.append(realm.p, realm.l);
+  uint8_t mac[20];
+  hmac_sha1(m_key.data(), m_key.size(), reinterpret_cast<uint8_t const*>(data.data()), data.size(), mac, sizeof mac);
+  return time + hex(mac, sizeof mac);
+}
+
+std::string NonceGenerator::make(pl const& realm, uint64_t nowMs) const {
+  return signature(nowMs, realm);
+}
+
+NonceGenerator::Check NonceGenerator::check(pl const& nonce, pl const& realm, uint64_t nowMs) const {
+  uint64_t madeMs = 0;
+  if (nonce.l != kTimeDigits + kSignatureDigits || !parseTime(nonce.p, madeMs))
+    return Check::UNKNOWN;
+  std::string const expected = signature(madeMs, realm);
+  // Compared in full whatever differs first, so the time taken tells
+  // nothing about how much of a forged signature was right.
+  unsigned char difference = 0;
+  for (size_t i = 0; i < expected.size(); ++i)
+    difference |= static_cast<unsigned char>(expected[i] ^ nonce.p[i]);
+  if (difference != 0 || madeMs > nowMs)
+    return Check::UNKNOWN;
+  return nowMs - madeMs > kLifetimeMs ? Check::STALE : Check::VALID;
+}

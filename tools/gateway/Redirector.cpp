@@ -1,0 +1,33 @@
+#include "Redirector.h"
+
+#include "CBlob.h"
+#include "Exchange.h"
+#include "LS_IRegistrationInbound.h"
+
+void Redirector::handle(Exchange& exchange) {
+  CNameAddr target;
+  RefPtr<LS_IIdentity> const identity = exchange.resolveOrAnswer(exchange.request().ruri, target);
+  if (!identity)
+    return;
+  std::string contacts;
+  exchange.clock().measure([&] {
+    RefPtr<LS_IRegistrationInbound> face;
+    LS_getFaceIf(identity.get(), LS_IdentityFace::REGISTRATION_INBOUND, face);
+    unsigned int const count = face ? face->getNumberOfContacts() : 0;
+    for (unsigned int i = 0; i < count && i < kMaximumContacts; ++i) {
+      String callId, context, provider;
+      CNameAddr contact;
+      CHostPort received;
+      unsigned int priority = 0;
+      unsigned int expires = 0;
+      if (face->getContact(i, callId, contact, received, context, provider, priority, expires).isFailure())
+        continue;
+      CBlob text;
+      contact.Serialize(text);
+      contacts += "Contact: " + std::string(reinterpret_cast<char const*>(text.GetData()), text.GetSize()) + "\r\n";
+    }
+  });
+  if (contacts.empty())
+    return exchange.answer(480, "Temporarily Unavailable");
+  exchange.answer(302, "Moved Temporarily", contacts);
+}

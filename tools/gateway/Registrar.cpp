@@ -1,0 +1,270 @@
+#include "Registrar.h"
+
+#include <algorithm>
+#include <vector>
+
+#include "DigestAuthentication.h"
+#include "Exchange.h"
+#include "LS_CredentialLookup.h"
+
+namespace {
+
+// Authorization headers looked at per request, and the longest user name
+// passed to the library: more is an attack, not a phone.
+constexpr unsigned int kMaximumAuthorizations = 8;
+constexpr size_t kMaximumUserName = 256;
+
+std::string text(pl const& value) {
+  return std::string(value.p, value.l);
+}
+
+// A delta-seconds value; one beyond 32 bits saturates (RFC 3261 asks to
+// take such a value as the largest). False for anything but digits.
+bool parseSeconds(pl const& value, uint32_t& seconds) {
+  if (value.l == 0)
+    return false;
+  uint64_t total = 0;
+  for (size_t i = 0; i < value.l; ++i) {
+    char const c = value.p[i];
+    if (c < '0' || c > '9')
+      return false;
+    total = std::min<uint64_t>(total * 10 + static_cast<uint64_t>(c - '0'), UINT32_MAX);
+  }
+  seconds = static_cast<uint32_t>(total);
+  return true;
+}
+
+template <class Visit>
+void forEachHeader(sip_msg const& message, sip_hdrid id, Visit visit) {
+  for (le const* entry = list_head(&message.hdrl); entry; entry = entry->next) {
+    sip_hdr const* header = static_cast<sip_hdr const*>(entry->data);
+    if (header->id == id && !visit(*header))
+      return;
+  }
+}
+
+CHostPort sourceOf(sip_msg const& message) {
+  char address[64];
+  re_snprintf(address, sizeof address, "%J", &message.src);
+  CHostPort source;
+  source.Parse(address, std::char_traits<char>::length(address));
+  return source;
+}
+
+}  // namespace
+
+Registrar::~Registrar() {
+  for (auto& entry : m_bindings) {
+    size_t const before = entry.second.byContact.size();
+    removeAll(entry.second);
+    reportTransition(entry.second, before);
+  }
+}
+
+void Registrar::handle(Exchange& exchange) {
+  sip_msg const& message = exchange.request();
+  CNameAddr to;
+  RefPtr<LS_IIdentity> const identity = exchange.resolveOrAnswer(message.to.auri, to);
+  if (!identity || !authenticated(exchange, identity.get(), to))
+    return;
+
+  RefPtr<LS_IRegistrationInbound> face;
+  m_clock.measure([&] {
+    adoptInterface(face, [&](UUID const& iid, void** raw) {
+      return identity->createDynamicFaceIf(LS_IdentityFace::REGISTRATION_INBOUND, iid, raw);
+    });
+  });
+  if (!face)
+    return exchange.answer(500, "No Registration Face");
+  unsigned int minimum = 0;
+  unsigned int maximum = 0;
+  unsigned int defaultLifetime = 0;
+  m_clock.measure([&] { face->getLifetimeRange(minimum, maximum, defaultLifetime); });
+
+  uint32_t headerExpires = defaultLifetime;
+  bool const hasExpires = pl_isset(&message.expires);
+  if (hasExpires && !parseSeconds(message.expires, headerExpires))
+    return exchange.answer(400, "Bad Expires");
+
+  bool wildcard = false;
+  bool malformed = false;
+  std::vector<ContactRequest> requests;
+  forEachHeader(message, SIP_HDR_CONTACT, [&](sip_hdr const& header) {
+    pl value = header.val;
+    if (pl_strcmp(&value, "*") == 0) {
+      wildcard = true;
+      return true;
+    }
+    sip_addr address;
+    uint32_t expires = headerExpires;
+    pl parameter;
+    CNameAddr contact;
+    if (requests.size() == kMaximumContacts || sip_addr_decode(&address, &value) != 0 ||
+        !contact.Parse(address.auri.p, address.auri.l) ||
+        (msg_param_decode(&address.params, "expires", &parameter) == 0 && !parseSeconds(parameter, expires))) {
+      malformed = true;
+      return false;
+    }
+    requests.push_back(ContactRequest{contact, text(address.auri), std::min<uint32_t>(expires, maximum)});
+    return true;
+  });
+  if (malformed)
+    return exchange.answer(400, "Bad Contact");
+
+  if (wildcard && (!requests.empty() || !hasExpires || headerExpires != 0))
+    return exchange.answer(400, "Bad Wildcard Contact");
+  for (ContactRequest const& request : requests)
+    if (request.expires != 0 && request.expires < minimum)
+      return exchange.answer(423, "Interval Too Brief", "Min-Expires: " + std::to_string(minimum) + "\r\n");
+  Bindings& bindings = m_bindings[identity.get()];
+  bindings.identity = identity;
+  bindings.face = face;
+  size_t const before = bindings.byContact.size();
+  size_t added = 0;
+  for (ContactRequest const& request : requests)
+    added += request.expires != 0 && bindings.byContact.count(request.key) == 0;
+  if (before + added > kMaximumBindings)
+    return exchange.answer(403, "Too Many Bindings");
+
+  if (wildcard)
+    removeAll(bindings);
+  std::string const callId = text(message.callid);
+  CHostPort const received = sourceOf(message);
+  for (ContactRequest const& request : requests) {
+    if (request.expires != 0) {
+      add(bindings, request, callId, received);
+      continue;
+    }
+    auto const found = bindings.byContact.find(request.key);
+    if (found != bindings.byContact.end())
+      remove(*found->second);
+  }
+  reportTransition(bindings, before);
+  exchange.answer(200, "OK", bindingHeaders(bindings));
+  if (bindings.byContact.empty())
+    m_bindings.erase(identity.get());
+}
+
+bool Registrar::authenticated(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to) {
+  String error;
+  Vector<LS_ProtocolRealm> realms;
+  m_clock.measure([&] { LS_getInboundAuthenticationChallenge(error, realms, identity, nullptr); });
+  if (realms.isEmpty())
+    return true;
+
+  sip_msg const& message = exchange.request();
+  uint64_t const now = tmr_jiffies();
+  bool stale = false;
+  unsigned int looked = 0;
+  int verdict = 0;  // 1 accepted, -1 refused, 0 no usable credentials
+  forEachHeader(message, SIP_HDR_AUTHORIZATION, [&](sip_hdr const& header) {
+    httpauth_digest_resp response;
+    if (++looked > kMaximumAuthorizations)
+      return false;
+    if (httpauth_digest_response_decode(&response, &header.val) != 0 || response.username.l > kMaximumUserName)
+      return true;
+    auto const realm = std::find_if(realms.begin(), realms.end(), [&](LS_ProtocolRealm const& candidate) {
+      return pl_strcmp(&response.realm, candidate.realm.c_str()) == 0;
+    });
+    if (realm == realms.end())
+      return true;
+    NonceGenerator::Check const check = m_nonces.check(response.nonce, response.realm, now);
+    if (check != NonceGenerator::Check::VALID) {
+      stale = stale || check == NonceGenerator::Check::STALE;
+      return true;
+    }
+    Vector<String> passwords;
+    String const user(response.username.p, response.username.l);
+    m_clock.measure([&] {
+      LS_getInboundAuthenticationResponse(error, passwords, identity, to, realm->protocol, realm->realm, user,
+                                          nullptr);
+    });
+    bool const matches = std::any_of(passwords.begin(), passwords.end(), [&](String const& password) {
+      return digestResponseMatches(response, message.met, password.c_str());
+    });
+    verdict = matches ? 1 : -1;
+    return false;
+  });
+  if (verdict > 0)
+    return true;
+  if (verdict < 0) {
+    exchange.answer(403, "Forbidden");
+    return false;
+  }
+  std::string challenges;
+  for (LS_ProtocolRealm const& realm : realms) {
+    pl name;
+    pl_set_str(&name, realm.realm.c_str());
+    challenges += "WWW-Authenticate: " + digestChallenge(name, m_nonces.make(name, now), stale) + "\r\n";
+  }
+  exchange.answer(401, "Unauthorized", challenges);
+  return false;
+}
+
+void Registrar::add(Bindings& bindings, ContactRequest const& request, std::string const& callId,
+                    CHostPort const& received) {
+  XCode const added = m_clock.measure([&] {
+    return bindings.face->addContact(callId.c_str(), request.contact, received, "", "", 0, request.expires);
+  });
+  // A contact configured statically on the face stands as registered already.
+  if (added.isFailure())
+    return;
+  std::unique_ptr<Binding>& slot = bindings.byContact[request.key];
+  if (!slot) {
+    slot = std::make_unique<Binding>();
+    slot->registrar = this;
+    slot->owner = &bindings;
+    slot->contact = request.contact;
+    tmr_init(&slot->timer);
+  }
+  slot->callId = callId;
+  slot->expiresAtMs = tmr_jiffies() + uint64_t{request.expires} * 1000;
+  tmr_start(&slot->timer, uint64_t{request.expires} * 1000, onExpiry, slot.get());
+}
+
+void Registrar::remove(Binding& binding) {
+  tmr_cancel(&binding.timer);
+  Bindings& bindings = *binding.owner;
+  m_clock.measure([&] { bindings.face->removeContact(binding.contact, binding.callId.c_str()); });
+  for (auto entry = bindings.byContact.begin(); entry != bindings.byContact.end(); ++entry)
+    if (entry->second.get() == &binding) {
+      bindings.byContact.erase(entry);
+      return;
+    }
+}
+
+void Registrar::removeAll(Bindings& bindings) {
+  for (auto& entry : bindings.byContact)
+    tmr_cancel(&entry.second->timer);
+  bindings.byContact.clear();
+  m_clock.measure([&] { bindings.face->removeContacts(); });
+}
+
+void Registrar::reportTransition(Bindings& bindings, size_t before) {
+  size_t const after = bindings.byContact.size();
+  if (before == 0 && after != 0)
+    m_clock.measure([&] { bindings.identity->isInboundRegistered(); });
+  else if (before != 0 && after == 0)
+    m_clock.measure([&] { bindings.identity->isInboundUnregistered(); });
+}
+
+std::string Registrar::bindingHeaders(Bindings const& bindings) {
+  uint64_t const now = tmr_jiffies();
+  std::string headers;
+  for (auto const& entry : bindings.byContact) {
+    uint64_t const remainingMs = entry.second->expiresAtMs > now ? entry.second->expiresAtMs - now : 0;
+    headers += "Contact: <" + entry.first + ">;expires=" + std::to_string((remainingMs + 999) / 1000) + "\r\n";
+  }
+  return headers;
+}
+
+void Registrar::onExpiry(void* argument) {
+  Binding& binding = *static_cast<Binding*>(argument);
+  Registrar& registrar = *binding.registrar;
+  Bindings& bindings = *binding.owner;
+  LS_IIdentity* const identity = bindings.identity.get();
+  registrar.remove(binding);
+  registrar.reportTransition(bindings, 1);
+  if (bindings.byContact.empty())
+    registrar.m_bindings.erase(identity);
+}

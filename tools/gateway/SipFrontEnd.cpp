@@ -1,0 +1,106 @@
+#include "SipFrontEnd.h"
+
+#include <cstring>
+
+#include "Exchange.h"
+
+namespace {
+
+char const kAllow[] = "Allow: REGISTER, INVITE, ACK, CANCEL, MESSAGE, SUBSCRIBE, OPTIONS\r\n";
+
+// Hash table sizes of the stack: client transactions, server transactions,
+// TCP connections. Server transactions outlive their answer by up to 32 s,
+// so a busy registrar holds many at once.
+constexpr uint32_t kClientTransactions = 64;
+constexpr uint32_t kServerTransactions = 4096;
+constexpr uint32_t kConnections = 64;
+
+void stopLoop(void*) {
+  re_cancel();
+}
+
+}  // namespace
+
+SipFrontEnd::~SipFrontEnd() {
+  m_trunks.reset();
+  mem_deref(m_listener);
+  if (m_stack)
+    sip_close(m_stack, true);
+  mem_deref(m_stack);
+}
+
+bool SipFrontEnd::start(std::string const& listen, std::string& bound, std::string& error) {
+  sa address;
+  if (sa_decode(&address, listen.c_str(), listen.size()) != 0) {
+    error = "cannot read the listen address " + listen + " (ADDR:PORT)";
+    return false;
+  }
+  int result = sip_alloc(&m_stack, nullptr, kClientTransactions, kServerTransactions, kConnections,
+                         "location-gateway", onClosed, this);
+  if (result == 0)
+    result = sip_transp_add(m_stack, SIP_TRANSP_UDP, &address);
+  if (result == 0)
+    result = sip_transp_laddr(m_stack, &address, SIP_TRANSP_UDP, nullptr);
+  if (result == 0)
+    result = sip_listen(&m_listener, m_stack, true, onRequest, this);
+  if (result != 0) {
+    error = "cannot listen on " + listen + ": " + std::strerror(result);
+    return false;
+  }
+  // TCP is a convenience: a port taken for TCP leaves the gateway on UDP.
+  sip_transp_add(m_stack, SIP_TRANSP_TCP, &address);
+  char text[64];
+  re_snprintf(text, sizeof text, "%J", &address);
+  bound = text;
+  CHostPort own;
+  own.Parse(bound.data(), bound.size());
+  m_clock.measure([&] { m_session.stack().localHostPorts.add(own); });
+  m_trunks = std::make_unique<TrunkRegistrations>(*m_stack, m_session, m_clock);
+  m_trunks->start();
+  return true;
+}
+
+void SipFrontEnd::shutDown() {
+  m_listener = static_cast<sip_lsnr*>(mem_deref(m_listener));
+  m_trunks->stop();
+  tmr deadline;
+  tmr_init(&deadline);
+  tmr_start(&deadline, kShutDownMs, stopLoop, nullptr);
+  sip_close(m_stack, false);
+  re_main(nullptr);
+  tmr_cancel(&deadline);
+}
+
+bool SipFrontEnd::onRequest(sip_msg const* request, void* argument) {
+  SipFrontEnd& frontEnd = *static_cast<SipFrontEnd*>(argument);
+  sip_msg const& message = *request;
+  // An ACK gets no answer; one for a 302 never reaches here, its
+  // transaction takes it.
+  if (pl_strcmp(&message.met, "ACK") == 0)
+    return true;
+  Exchange exchange(*frontEnd.m_stack, message, frontEnd.m_session, frontEnd.m_log, frontEnd.m_clock);
+  if (pl_strcmp(&message.met, "REGISTER") == 0) {
+    frontEnd.m_registrar.handle(exchange);
+    return true;
+  }
+  bool const toUser = message.uri.user.l != 0;
+  if (pl_strcmp(&message.met, "OPTIONS") == 0 && !toUser) {
+    exchange.answer(200, "OK", kAllow);
+    return true;
+  }
+  if (pl_strcmp(&message.met, "CANCEL") == 0) {
+    exchange.answer(481, "Call/Transaction Does Not Exist");
+    return true;
+  }
+  if (pl_strcmp(&message.met, "INVITE") == 0 || pl_strcmp(&message.met, "MESSAGE") == 0 ||
+      pl_strcmp(&message.met, "SUBSCRIBE") == 0 || pl_strcmp(&message.met, "OPTIONS") == 0) {
+    frontEnd.m_redirector.handle(exchange);
+    return true;
+  }
+  exchange.answer(405, "Method Not Allowed", kAllow);
+  return true;
+}
+
+void SipFrontEnd::onClosed(void*) {
+  re_cancel();
+}

@@ -1,0 +1,55 @@
+// SipFrontEnd: the SIP side of the gateway on libre: the stack with its
+// transports, the listener that hands each request to the part that answers
+// its method (Registrar for REGISTER, Redirector for requests to a user, 200
+// for OPTIONS to the gateway itself, 405 with Allow for the rest), and the
+// trunk registrations. Malformed messages never reach it: libre drops what it
+// cannot parse, and every length read here is bounded by the parts.
+//
+// Built after the scripts have run; the listen address joins the stack
+// settings' local host-ports. Owned by main; shutDown() unregisters the
+// trunks and closes the stack within a bounded time, after which the object
+// may die.
+#pragma once
+
+#include <memory>
+#include <string>
+
+#include "Libre.h"
+#include "LibraryClock.h"
+#include "Redirector.h"
+#include "Registrar.h"
+#include "RequestLog.h"
+#include "ScriptSession.h"
+#include "TrunkRegistrations.h"
+
+class SipFrontEnd {
+ public:
+  SipFrontEnd(ScriptSession& session, LibraryClock& clock) : m_session(session), m_clock(clock), m_registrar(clock) {}
+  ~SipFrontEnd();
+  SipFrontEnd(SipFrontEnd const&) = delete;
+  SipFrontEnd& operator=(SipFrontEnd const&) = delete;
+
+  // Binds UDP (and TCP on the same port when it can) at listen, "ADDR:PORT";
+  // port 0 takes a free one. The bound address, "ADDR:PORT", or an error
+  // text in error.
+  bool start(std::string const& listen, std::string& bound, std::string& error);
+  // Unregisters the trunks and lets the stack finish, at most kShutDownMs.
+  void shutDown();
+
+  unsigned long requests() const { return m_log.requests(); }
+
+  static constexpr uint64_t kShutDownMs = 2000;
+
+ private:
+  static bool onRequest(sip_msg const* request, void* frontEnd);
+  static void onClosed(void* frontEnd);
+
+  ScriptSession& m_session;
+  LibraryClock& m_clock;
+  RequestLog m_log;
+  Registrar m_registrar;
+  Redirector m_redirector;
+  sip* m_stack = nullptr;
+  sip_lsnr* m_listener = nullptr;
+  std::unique_ptr<TrunkRegistrations> m_trunks;
+};

@@ -1,0 +1,170 @@
+#include "TrunkRegistrations.h"
+
+#include <cstring>
+#include <iostream>
+
+#include "LS_CredentialLookup.h"
+#include "LS_ILocationService.h"
+#include "LS_IOutbound.h"
+
+namespace {
+
+std::string hostPortText(CHostPort const& hostPort) {
+  std::string text = hostPort.GetHost().c_str();
+  if (hostPort.GetPort() != 0)
+    text += ":" + std::to_string(hostPort.GetPort());
+  return text;
+}
+
+}  // namespace
+
+void TrunkRegistrations::report(std::string const& line) {
+  m_session.flushDebugLines();
+  std::cerr << "location-gateway: " << line << std::endl;
+}
+
+TrunkRegistrations::~TrunkRegistrations() {
+  stop();
+}
+
+void TrunkRegistrations::start() {
+  m_clock.measure([&] {
+    LS_IMasterLocationService* const master = m_session.locationMaster();
+    Vector<String> services;
+    master->getLocationServices(services);
+    for (String const& serviceName : services) {
+      RefPtr<LS_ILocationService> service;
+      if (LS_getLocationServiceIf(master, serviceName, service).isFailure())
+        continue;
+      Vector<String> identities;
+      service->getIdentities(identities);
+      for (String const& name : identities) {
+        RefPtr<LS_IIdentity> identity;
+        if (LS_getIdentityIf(service.get(), name, identity).isSuccess())
+          findTrunk(identity.get(), serviceName.str() + "/" + name.str());
+      }
+    }
+  });
+  for (std::unique_ptr<Trunk> const& trunk : m_trunks)
+    registerTrunk(*trunk);
+}
+
+void TrunkRegistrations::findTrunk(LS_IIdentity* identity, std::string const& path) {
+  if (identity->getIdentityType() != LS_IdentityType::IDENTITY)
+    return;
+  RefPtr<LS_IRegistrationOutbound> face;
+  LS_getFaceIf(identity, LS_IdentityFace::REGISTRATION_OUTBOUND, face);
+  CHostPort registrar;
+  CHostPort tlsRegistrar;
+  if (!face || (face->getRegistrar(registrar, tlsRegistrar).isFailure() &&
+                face->getDynamicRegistrar(registrar).isFailure()))
+    return;
+  auto trunk = std::make_unique<Trunk>();
+  trunk->owner = this;
+  trunk->identity = identity;
+  trunk->face = face;
+  trunk->path = path;
+  char const* const scheme = face->getUriScheme() == LS_UriScheme::SIPS ? "sips:" : "sip:";
+  trunk->registrarUri = scheme + hostPortText(registrar);
+  trunk->addressOfRecord = scheme + identity->getName().str() + "@" + registrar.GetHost().c_str();
+  trunk->lifetime = face->getLifetime();
+  RefPtr<LS_IOutbound> outbound;
+  face->queryIf(outbound);
+  CHostPort proxy;
+  CHostPort tlsProxy;
+  bool strictRoute = false;
+  if (outbound && outbound->getNumberOfProxies() != 0 &&
+      outbound->getProxy(0, proxy, tlsProxy, strictRoute).isSuccess() && !proxy.GetHost().isEmpty())
+    trunk->route = scheme + hostPortText(proxy) + (strictRoute ? "" : ";lr");
+  tmr_init(&trunk->timer);
+  m_trunks.push_back(std::move(trunk));
+}
+
+void TrunkRegistrations::registerTrunk(Trunk& trunk) {
+  char const* routes[] = {trunk.route.c_str()};
+  std::string const user = trunk.identity->getName().str();
+  int const error = sipreg_register(&trunk.registration, &m_stack, trunk.registrarUri.c_str(),
+                                    trunk.addressOfRecord.c_str(), nullptr, trunk.addressOfRecord.c_str(),
+                                    trunk.lifetime, user.c_str(), trunk.route.empty() ? nullptr : routes,
+                                    trunk.route.empty() ? 0 : 1, 0, onChallenge, &trunk, false, onResponse, &trunk,
+                                    nullptr, nullptr);
+  if (error == 0)
+    return;
+  report("trunk " + trunk.path + " cannot register at " + trunk.registrarUri + ": " + std::strerror(error));
+  trunk.retryMs = uint64_t{m_clock.measure([&] { return trunk.face->getRetryTimeoutOnSystemError(); })} * 1000;
+  tmr_start(&trunk.timer, trunk.retryMs, onRetry, &trunk);
+}
+
+int TrunkRegistrations::onChallenge(char** user, char** password, char const* realm, void* argument) {
+  Trunk& trunk = *static_cast<Trunk*>(argument);
+  TrunkRegistrations& owner = *trunk.owner;
+  String error;
+  String userName;
+  String secret;
+  CNameAddr addressOfRecord;
+  addressOfRecord.Parse(trunk.addressOfRecord.data(), trunk.addressOfRecord.size());
+  XCode const found = owner.m_clock.measure([&] {
+    return LS_getOutboundAuthenticationCredentials(error, userName, secret, trunk.identity.get(), addressOfRecord,
+                                                   LS_AuthenticationProtocol::HTTP, realm, nullptr);
+  });
+  if (found.isFailure()) {
+    owner.report("trunk " + trunk.path + " has no credentials for realm \"" + realm + "\"");
+    return EAUTH;
+  }
+  int result = str_dup(user, userName.c_str());
+  if (result == 0)
+    result = str_dup(password, secret.c_str());
+  return result;
+}
+
+void TrunkRegistrations::onResponse(int error, sip_msg const* response, void* argument) {
+  Trunk& trunk = *static_cast<Trunk*>(argument);
+  TrunkRegistrations& owner = *trunk.owner;
+  LibraryClock& clock = owner.m_clock;
+  if (error == 0 && response && response->scode < 300) {
+    char address[64];
+    re_snprintf(address, sizeof address, "%J", &response->src);
+    CHostPort registrar;
+    registrar.Parse(address, std::char_traits<char>::length(address));
+    clock.measure([&] { trunk.face->setRegistrarAddr(registrar); });
+    owner.report("trunk " + trunk.path + " registered at " + sip_transp_name(response->tp) + ":" + address + " for " +
+           std::to_string(trunk.lifetime) + " s");
+    return;
+  }
+  unsigned int seconds;
+  std::string cause;
+  if (error != 0 || !response) {
+    seconds = clock.measure([&] { return trunk.face->getRetryTimeoutOnSystemError(); });
+    cause = std::strerror(error);
+  } else if (response->scode >= 500 && response->scode < 600) {
+    seconds = clock.measure([&] { return trunk.face->getRetryTimeoutOnServerError(); });
+    cause = std::to_string(response->scode);
+  } else {
+    seconds = clock.measure([&] { return trunk.face->getRetryTimeoutOnClientError(); });
+    cause = std::to_string(response->scode);
+  }
+  owner.report("trunk " + trunk.path + " failed to register (" + cause + "), retrying in " + std::to_string(seconds) +
+         " s");
+  trunk.retryMs = uint64_t{seconds} * 1000;
+  tmr_start(&trunk.timer, 0, onDropFailed, &trunk);
+}
+
+void TrunkRegistrations::onDropFailed(void* argument) {
+  Trunk& trunk = *static_cast<Trunk*>(argument);
+  trunk.registration = static_cast<sipreg*>(mem_deref(trunk.registration));
+  tmr_start(&trunk.timer, trunk.retryMs, onRetry, &trunk);
+}
+
+void TrunkRegistrations::onRetry(void* argument) {
+  Trunk& trunk = *static_cast<Trunk*>(argument);
+  trunk.owner->registerTrunk(trunk);
+}
+
+void TrunkRegistrations::stop() {
+  for (std::unique_ptr<Trunk> const& trunk : m_trunks) {
+    tmr_cancel(&trunk->timer);
+    if (trunk->registration)
+      report("trunk " + trunk->path + " unregistering");
+    trunk->registration = static_cast<sipreg*>(mem_deref(trunk->registration));
+  }
+}

@@ -1,0 +1,75 @@
+// TrunkRegistrations: the gateway's own registrations. At start every
+// identity (not a group) whose outbound-registration face has a registrar,
+// configured or else learnt, registers there through libre's sipreg: the
+// address of record is the face's URI scheme with the identity's name at the
+// registrar's host, the lifetime is the face's, and the face's first proxy,
+// when there is one, is the route. A 401 or 407 is answered with the
+// library's outbound credentials for the challenge's realm; sipreg refreshes
+// a registration before it expires.
+//
+// On failure the registration is dropped and made anew after the face's
+// retry timeout for that class of error: system (no answer, transport
+// failure), server (5xx) or client (any other final failure, 4xx and 6xx),
+// instead of sipreg's own back-off, so that the configuration decides. The
+// registrar's address (where the 2xx came from) is recorded with
+// setRegistrarAddr. Progress goes to standard error, one line per event.
+//
+// stop() unregisters: it drops every sipreg, which sends its REGISTER with
+// expiry 0 and lives on inside libre until answered; the caller then lets the
+// stack run for a bounded time. Owned by the front-end; everything runs on
+// libre's thread.
+#pragma once
+
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "LS_IIdentity.h"
+#include "LS_IRegistrationOutbound.h"
+#include "Libre.h"
+#include "LibraryClock.h"
+#include "RefPtr.h"
+#include "ScriptSession.h"
+
+class TrunkRegistrations {
+ public:
+  TrunkRegistrations(sip& stack, ScriptSession& session, LibraryClock& clock)
+      : m_stack(stack), m_session(session), m_clock(clock) {}
+  ~TrunkRegistrations();
+  TrunkRegistrations(TrunkRegistrations const&) = delete;
+  TrunkRegistrations& operator=(TrunkRegistrations const&) = delete;
+
+  void start();
+  void stop();
+
+ private:
+  struct Trunk {
+    TrunkRegistrations* owner;
+    RefPtr<LS_IIdentity> identity;
+    RefPtr<LS_IRegistrationOutbound> face;
+    std::string path;
+    std::string registrarUri;
+    std::string addressOfRecord;
+    std::string route;
+    uint32_t lifetime;
+    sipreg* registration = nullptr;
+    // Drops a failed registration outside sipreg's own call, then waits
+    // retryMs and registers anew.
+    tmr timer;
+    uint64_t retryMs = 0;
+  };
+
+  void findTrunk(LS_IIdentity* identity, std::string const& path);
+  void registerTrunk(Trunk& trunk);
+  // One progress line on standard error, after the library's debug lines.
+  void report(std::string const& line);
+  static int onChallenge(char** user, char** password, char const* realm, void* trunk);
+  static void onResponse(int error, sip_msg const* response, void* trunk);
+  static void onDropFailed(void* trunk);
+  static void onRetry(void* trunk);
+
+  sip& m_stack;
+  ScriptSession& m_session;
+  LibraryClock& m_clock;
+  std::vector<std::unique_ptr<Trunk>> m_trunks;
+};
