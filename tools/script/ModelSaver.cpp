@@ -1,5 +1,6 @@
 #include "ModelSaver.h"
 
+#include <algorithm>
 #include <optional>
 
 #include "CommandTable.h"
@@ -88,22 +89,6 @@ RefPtr<T> faceOf(LS_IIdentity const* identity, LS_IdentityFace::Type face) {
   return found;
 }
 
-// Learnt values read through to the base's face; one is counted on the
-// face that holds it, so a group's learnt registrar counts once, not once
-// for every member.
-template <class T, class Read>
-bool holdsLearnt(LS_IIdentity const* identity, LS_IdentityFace::Type face, Read read) {
-  RefPtr<T> const own = faceOf<T>(identity, face);
-  std::string learnt;
-  if (!own || !read(own.get(), learnt))
-    return false;
-  RefPtr<LS_IIdentity> base;
-  identity->getBaseIdentity(base);
-  RefPtr<T> const inherited = faceOf<T>(base.get(), face);
-  std::string fromBase;
-  return !inherited || !read(inherited.get(), fromBase) || fromBase != learnt;
-}
-
 // Faces the identity holds itself that the SIP side made to record what it
 // learnt: not configuration.
 unsigned int dynamicFaces(LS_IIdentity const* identity) {
@@ -115,31 +100,37 @@ unsigned int dynamicFaces(LS_IIdentity const* identity) {
   return count;
 }
 
+// The proxy, registrar and message server learnt on the identity's face,
+// its own or the one it inherits, one text each.
+std::vector<std::string> learntOn(LS_IIdentity const* identity, LS_IdentityFace::Type face) {
+  std::vector<std::string> learnt;
+  CHostPort address;
+  bool strict = false;
+  RefPtr<LS_IOutbound> const outbound = faceOf<LS_IOutbound>(identity, face);
+  if (outbound && outbound->getDynamicProxy(address, strict).isSuccess())
+    learnt.push_back("proxy " + hostPortWord(address) + " " + switchWord(strict));
+  RefPtr<LS_IRegistrationOutbound> const registration = faceOf<LS_IRegistrationOutbound>(identity, face);
+  if (registration && registration->getDynamicRegistrar(address).isSuccess())
+    learnt.push_back("registrar " + hostPortWord(address));
+  RefPtr<LS_IMwiSubscription> const subscription = faceOf<LS_IMwiSubscription>(identity, face);
+  if (subscription && subscription->getDynamicMwiNotifier(address).isSuccess())
+    learnt.push_back("notifier " + hostPortWord(address));
+  return learnt;
+}
+
+// Learnt values read through to the faces of derived identities; each is
+// counted on the identity that holds it, so a group's learnt registrar
+// counts once, not once for every member.
 unsigned int learntValues(LS_IIdentity const* identity) {
+  RefPtr<LS_IIdentity> base;
+  identity->getBaseIdentity(base);
   unsigned int count = 0;
-  for (size_t face = 0; face < faceNames().size(); ++face)
-    count += holdsLearnt<LS_IOutbound>(identity, static_cast<LS_IdentityFace::Type>(face),
-                                       [](LS_IOutbound* outbound, std::string& learnt) {
-                                         CHostPort proxy;
-                                         bool strict = false;
-                                         bool const held = outbound->getDynamicProxy(proxy, strict).isSuccess();
-                                         learnt = hostPortWord(proxy) + switchWord(strict);
-                                         return held;
-                                       });
-  count += holdsLearnt<LS_IRegistrationOutbound>(
-      identity, LS_IdentityFace::REGISTRATION_OUTBOUND, [](LS_IRegistrationOutbound* face, std::string& learnt) {
-        CHostPort registrar;
-        bool const held = face->getDynamicRegistrar(registrar).isSuccess();
-        learnt = hostPortWord(registrar);
-        return held;
-      });
-  count += holdsLearnt<LS_IMwiSubscription>(identity, LS_IdentityFace::MESSAGE_SUBSCRIPTION,
-                                            [](LS_IMwiSubscription* face, std::string& learnt) {
-                                              CHostPort notifier;
-                                              bool const held = face->getDynamicMwiNotifier(notifier).isSuccess();
-                                              learnt = hostPortWord(notifier);
-                                              return held;
-                                            });
+  for (size_t face = 0; face < faceNames().size(); ++face) {
+    LS_IdentityFace::Type const type = static_cast<LS_IdentityFace::Type>(face);
+    std::vector<std::string> const inherited = learntOn(base.get(), type);
+    for (std::string const& learnt : learntOn(identity, type))
+      count += std::find(inherited.begin(), inherited.end(), learnt) == inherited.end() ? 1 : 0;
+  }
   return count;
 }
 
@@ -203,11 +194,14 @@ std::string ModelSaver::leftOutComment() const {
       learnt += learntValues(identity.get());
     }
   }
+  // Counts every contact of the process; a host program holds one model.
   int const registered = s_sipStatistics.getInboundRegistrations();
-  return "# left out as run-time state: " + counted(dynamicIdentities, "dynamic identity", "dynamic identities") +
-         ", " + counted(faces, "dynamic face", "dynamic faces") + ", " + counted(registered > 0 ? static_cast<unsigned int>(registered) : 0, "registered contact",
-                        "registered contacts") +
-         ", " + counted(learnt, "learnt proxy, registrar or message server", "learnt proxies, registrars and message servers") +
+  std::string const contacts =
+      counted(registered > 0 ? static_cast<unsigned int>(registered) : 0, "registered contact", "registered contacts");
+  return "# left out as run-time state: " +
+         counted(dynamicIdentities, "dynamic identity", "dynamic identities") + ", " +
+         counted(faces, "dynamic face", "dynamic faces") + ", " + contacts + ", " +
+         counted(learnt, "learnt proxy, registrar or message server", "learnt proxies, registrars and message servers") +
          "\n";
 }
 
