@@ -421,15 +421,31 @@ void ModelSaver::saveInbound(Words const& face, IUnknown* config) {
   }
 }
 
-// A registrar or message server: its getter fails without the TLS address,
-// though it has filled in the plain one.
-void ModelSaver::addressPair(Words const& face, char const* name, CHostPort const& address, CHostPort const& tls) {
-  if (isEmpty(address))
-    return;
-  Words words = face + Words{name, "set", hostPortWord(address)};
-  if (!isEmpty(tls))
-    words.push_back(hostPortWord(tls));
-  line(words);
+// What the outbound-registration and message-waiting faces share, each
+// under its own interface: the server with its TLS counterpart, the lifetime
+// and the retry timeouts. The server's getter fails without the TLS
+// address, though it has filled in the plain one.
+template <class Config>
+void ModelSaver::saveServer(Words const& face,
+                            char const* server,
+                            Config const* get,
+                            XCode (Config::*getServer)(CHostPort&, CHostPort&) const) {
+  CHostPort address;
+  CHostPort tls;
+  (get->*getServer)(address, tls);
+  if (!isEmpty(address)) {
+    Words words = face + Words{server, "set", hostPortWord(address)};
+    if (!isEmpty(tls))
+      words.push_back(hostPortWord(tls));
+    line(words);
+  }
+  setting(face, "lifetime", ownSetting(get, &Config::getConfigLifetime, numberWord));
+  setting(face, "retry-timeout-on-system-error",
+          ownSetting(get, &Config::getConfigRetryTimeoutOnSystemError, numberWord));
+  setting(face, "retry-timeout-on-client-error",
+          ownSetting(get, &Config::getConfigRetryTimeoutOnClientError, numberWord));
+  setting(face, "retry-timeout-on-server-error",
+          ownSetting(get, &Config::getConfigRetryTimeoutOnServerError, numberWord));
 }
 
 void ModelSaver::saveRegistrationOutbound(Words const& face, IUnknown* config) {
@@ -438,21 +454,11 @@ void ModelSaver::saveRegistrationOutbound(Words const& face, IUnknown* config) {
     return;
   using Config = LS_IRegistrationOutboundConfig;
   Config const* const get = registration.get();
-  CHostPort registrar;
-  CHostPort tlsRegistrar;
-  get->getConfigRegistrar(registrar, tlsRegistrar);
-  addressPair(face, "registrar", registrar, tlsRegistrar);
-  setting(face, "lifetime", ownSetting(get, &Config::getConfigLifetime, numberWord));
+  saveServer(face, "registrar", get, &Config::getConfigRegistrar);
   setting(face, "dns-security-check", ownSetting(get, &Config::getConfigDnsSecurityCheck, switchWord));
   setting(face, "registration-mode",
           ownSetting(get, &Config::getConfigRegistrationMode, enumerationWordOf<LS_RegistrationMode>));
   setting(face, "uri-scheme", ownSetting(get, &Config::getConfigUriScheme, enumerationWordOf<LS_UriScheme>));
-  setting(face, "retry-timeout-on-system-error",
-          ownSetting(get, &Config::getConfigRetryTimeoutOnSystemError, numberWord));
-  setting(face, "retry-timeout-on-client-error",
-          ownSetting(get, &Config::getConfigRetryTimeoutOnClientError, numberWord));
-  setting(face, "retry-timeout-on-server-error",
-          ownSetting(get, &Config::getConfigRetryTimeoutOnServerError, numberWord));
   setting(face, "nat-traversal-flows", ownSetting(get, &Config::getConfigNatTraversalFlows, switchWord));
   setting(face, "nat-traversal-method",
           ownSetting(get, &Config::getConfigNatTraversalMethod, enumerationWordOf<LS_NatTraversalMethod>));
@@ -488,19 +494,9 @@ void ModelSaver::saveMwiSubscription(Words const& face, IUnknown* config) {
     return;
   using Config = LS_IMwiSubscriptionConfig;
   Config const* const get = subscription.get();
-  CHostPort notifier;
-  CHostPort tlsNotifier;
-  get->getConfigMwiNotifier(notifier, tlsNotifier);
-  addressPair(face, "mwi-notifier", notifier, tlsNotifier);
-  setting(face, "lifetime", ownSetting(get, &Config::getConfigLifetime, numberWord));
+  saveServer(face, "mwi-notifier", get, &Config::getConfigMwiNotifier);
   setting(face, "mwi-subscription-mode",
           ownSetting(get, &Config::getConfigMwiSubscriptionMode, enumerationWordOf<LS_MwiSubscriptionMode>));
-  setting(face, "retry-timeout-on-system-error",
-          ownSetting(get, &Config::getConfigRetryTimeoutOnSystemError, numberWord));
-  setting(face, "retry-timeout-on-client-error",
-          ownSetting(get, &Config::getConfigRetryTimeoutOnClientError, numberWord));
-  setting(face, "retry-timeout-on-server-error",
-          ownSetting(get, &Config::getConfigRetryTimeoutOnServerError, numberWord));
 }
 
 void ModelSaver::saveCall(Words const& face, IUnknown* config) {

@@ -44,7 +44,11 @@ class ModelSaver {
   void saveFace(Words const& identity, Words const& face, IUnknown* config);
   void saveOutbound(Words const& face, IUnknown* config);
   void saveInbound(Words const& face, IUnknown* config);
-  void addressPair(Words const& face, char const* name, CHostPort const& address, CHostPort const& tls);
+  template <class Config>
+  void saveServer(Words const& face,
+                  char const* server,
+                  Config const* get,
+                  XCode (Config::*getServer)(CHostPort&, CHostPort&) const);
   void saveRegistrationOutbound(Words const& face, IUnknown* config);
   void saveRegistrationInbound(Words const& face, IUnknown* config);
   void saveMwiSubscription(Words const& face, IUnknown* config);
