@@ -10,6 +10,7 @@
 #include <fstream>
 #include <iostream>
 #include <sstream>
+#include <stdexcept>
 #include <vector>
 
 #include "CommandTable.h"
@@ -108,14 +109,16 @@ int main(int argc, char** argv) {
     std::cerr << "location-console: not saved to " << saveTo << ": the run stopped at a failed line\n";
     return status;
   }
+  std::string script;
   try {
-    std::ofstream file(saveTo, std::ios::binary);
-    if (!(file << ModelSaver(session).script(0)).flush()) {
-      std::cerr << "location-console: cannot write " << saveTo << ": " << std::strerror(errno) << "\n";
-      return 2;
-    }
-  } catch (CommandError const& error) {
+    script = ModelSaver(session).script();
+  } catch (std::runtime_error const& error) {
     std::cerr << "location-console: not saved to " << saveTo << ": " << error.what() << "\n";
+    return 2;
+  }
+  std::ofstream file(saveTo, std::ios::binary);
+  if (!(file << script).flush()) {
+    std::cerr << "location-console: cannot write " << saveTo << ": " << std::strerror(errno) << "\n";
     return 2;
   }
   return status;

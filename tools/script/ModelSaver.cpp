@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <optional>
+#include <stdexcept>
 
 #include "CommandTable.h"
 #include "FaceNames.h"
@@ -145,8 +146,7 @@ struct ModelSaver::Identity {
   size_t base;
 };
 
-std::string ModelSaver::script(size_t column) {
-  m_column = column;
+std::string ModelSaver::script() {
   m_out.str(std::string());
   m_out << leftOutComment();
   Vector<String> names;
@@ -165,7 +165,7 @@ void ModelSaver::line(Words const& words) {
   std::string text;
   for (std::string const& word : words) {
     if (word.find('\n') != std::string::npos)
-      throw CommandError(m_column, "cannot save " + quotedWord(word) + ": a script line cannot hold a line break");
+      throw std::runtime_error("cannot save " + quotedWord(word) + ": a script line cannot hold a line break");
     text += (text.empty() ? "" : " ") + scriptWord(word);
   }
   m_out << text << "\n";

@@ -1,13 +1,13 @@
 // ModelSaver: writes the configuration the model holds now as a script of
-// the host programs' own language, one that rebuilds it in a fresh session:
+// the host programs' own language that rebuilds it in a fresh session:
 // authentication services, then location services, then each service's
-// configured identities with their aliases, values and faces, in the
-// service's order, each base link written once its base exists. It reads only the configuration
-// interfaces and writes only what each object holds itself, never what it
-// inherits. Run-time state (dynamic identities, registered contacts, learnt
-// proxies, registrars and message servers) is no configuration: one comment
-// line says how much of it was left out. Running the script belongs to the
-// script runner; choosing where it goes, to the save command.
+// configured identities in the service's order, with their aliases, values
+// and faces, each base link written once its base exists. It reads only the
+// configuration interfaces and writes only what each object holds itself,
+// never what it inherits. Run-time state (dynamic identities and faces,
+// registered contacts, learnt proxies, registrars and message servers) is
+// no configuration: one comment line says how much of it was left out.
+// Where the script goes belongs to the save command.
 #pragma once
 
 #include <optional>
@@ -21,9 +21,9 @@ class ModelSaver {
  public:
   explicit ModelSaver(ScriptSession const& session) : m_session(session) {}
 
-  // The whole script. Throws CommandError, at column, for a text that holds
-  // a line break, which no line of a script can hold.
-  std::string script(size_t column);
+  // The whole script. Throws std::runtime_error for a text that holds a
+  // line break, which no line of a script can hold.
+  std::string script();
 
  private:
   using Words = std::vector<std::string>;
@@ -59,6 +59,5 @@ class ModelSaver {
   std::string listedName(LS_ILocationServiceConfig const* service) const;
 
   ScriptSession const& m_session;
-  size_t m_column = 0;
   std::ostringstream m_out;
 };

@@ -3,6 +3,7 @@
 #include <cerrno>
 #include <cstring>
 #include <fstream>
+#include <stdexcept>
 
 #include "IInfo.h"
 #include "InfoContainer.h"
@@ -80,7 +81,12 @@ void addSessionCommands(CommandTable& table) {
             });
   table.add("save [<file>]", "the configuration as the script that rebuilds it, into file or shown",
             [](Session& session, Args const& arguments) {
-              std::string const script = ModelSaver(session).script(1);
+              std::string script;
+              try {
+                script = ModelSaver(session).script();
+              } catch (std::runtime_error const& error) {
+                throw CommandError(1, error.what());
+              }
               if (!arguments.has("file")) {
                 session.output() << script;
                 return;
