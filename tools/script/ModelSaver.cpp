@@ -8,8 +8,8 @@
 #include "FaceNames.h"
 #include "LS_AddressText.h"
 #include "LS_IAuthenticationConfig.h"
-#include "LS_IElement.h"
 #include "LS_ICallConfig.h"
+#include "LS_IElement.h"
 #include "LS_IInboundConfig.h"
 #include "LS_IMwiSubscription.h"
 #include "LS_IMwiSubscriptionConfig.h"
@@ -198,10 +198,10 @@ std::string ModelSaver::leftOutComment() const {
   int const registered = s_sipStatistics.getInboundRegistrations();
   std::string const contacts =
       counted(registered > 0 ? static_cast<unsigned int>(registered) : 0, "registered contact", "registered contacts");
-  return "# left out as run-time state: " +
-         counted(dynamicIdentities, "dynamic identity", "dynamic identities") + ", " +
-         counted(faces, "dynamic face", "dynamic faces") + ", " + contacts + ", " +
-         counted(learnt, "learnt proxy, registrar or message server", "learnt proxies, registrars and message servers") +
+  return "# left out as run-time state: " + counted(dynamicIdentities, "dynamic identity", "dynamic identities") +
+         ", " + counted(faces, "dynamic face", "dynamic faces") + ", " + contacts + ", " +
+         counted(learnt, "learnt proxy, registrar or message server",
+                 "learnt proxies, registrars and message servers") +
          "\n";
 }
 
@@ -279,8 +279,8 @@ void ModelSaver::saveIdentities(String const& serviceName) {
   }
   for (size_t index = 0; index < identities.size(); ++index) {
     Identity const& identity = identities[index];
-    Words create = identity.words + Words{"create", enumerationWordOf<LS_IdentityType>(
-                                                        identity.config->getConfigIdentityType())};
+    Words create =
+        identity.words + Words{"create", enumerationWordOf<LS_IdentityType>(identity.config->getConfigIdentityType())};
     if (identity.base < index)
       create.push_back(identities[identity.base].words.back());
     line(create);
@@ -295,7 +295,8 @@ void ModelSaver::saveIdentity(Words const& identity, LS_IIdentityConfig* config,
   if (!(config->getConfigName() == identity.back().c_str()))
     line(identity + Words{"name", "set", config->getConfigName().str()});
   RefPtr<LS_ILocationServiceConfig> linked;
-  adoptInterface(linked, [config](UUID const& iid, void** raw) { return config->getConfigLocationServiceIf(iid, raw); });
+  adoptInterface(linked,
+                 [config](UUID const& iid, void** raw) { return config->getConfigLocationServiceIf(iid, raw); });
   std::string const linkedName = listedName(linked.get());
   if (!linkedName.empty() && linkedName != serviceName.str())
     line(identity + Words{"location-service", "set", linkedName});
