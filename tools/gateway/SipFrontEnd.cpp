@@ -22,10 +22,12 @@ void stopLoop(void*) {
 }  // namespace
 
 SipFrontEnd::~SipFrontEnd() {
-  m_trunks.reset();
   mem_deref(m_listener);
+  // Forced: a registrar that never answered the unregistration must not
+  // keep a registration alive that points at a trunk about to die.
   if (m_stack)
     sip_close(m_stack, true);
+  m_trunks.reset();
   mem_deref(m_stack);
 }
 

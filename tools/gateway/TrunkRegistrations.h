@@ -48,6 +48,8 @@ class TrunkRegistrations {
     RefPtr<LS_IIdentity> identity;
     RefPtr<LS_IRegistrationOutbound> face;
     std::string path;
+    // The identity's name, the user part of the contact registered.
+    std::string user;
     std::string registrarUri;
     std::string addressOfRecord;
     std::string route;
