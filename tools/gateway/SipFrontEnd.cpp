@@ -56,7 +56,7 @@ bool SipFrontEnd::start(std::string const& listen, std::string& bound, std::stri
   bound = text;
   CHostPort own;
   own.Parse(bound.data(), bound.size());
-  m_clock.measure([&] { m_session.stack().localHostPorts.add(own); });
+  m_session.stack().localHostPorts.add(own);
   m_trunks = std::make_unique<TrunkRegistrations>(*m_stack, m_session, m_clock);
   m_trunks->start();
   return true;
