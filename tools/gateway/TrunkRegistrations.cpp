@@ -78,7 +78,7 @@ void TrunkRegistrations::findTrunk(LS_IIdentity* identity, std::string const& pa
   bool strictRoute = false;
   if (outbound && outbound->getNumberOfProxies() != 0 &&
       outbound->getProxy(0, proxy, tlsProxy, strictRoute).isSuccess() && !proxy.GetHost().isEmpty())
-    trunk->route = scheme + hostPortText(proxy) + (strictRoute ? "" : ";lr");
+    trunk->route = scheme + hostPortText(proxy);
   tmr_init(&trunk->timer);
   m_trunks.push_back(std::move(trunk));
 }

@@ -7,7 +7,7 @@
 #          phone.xml against it, and the gateway's request lines must be
 #          exactly phone.out.
 # carrier: SIPp plays the carrier's registrar of carrier.xml; the gateway
-#          serves trunk.script with the registrar's address added, must
+#          serves trunk.script with SIPp's address added as the proxy, must
 #          retry after the registrar's 503, report the trunk registered
 #          there, and on SIGTERM unregister it.
 #
@@ -99,8 +99,8 @@ case $scenario in
       sipp_pid=
     done
     [[ -n $sipp_pid ]] || fail "SIPp found no free port"
-    echo "face example.com trunk registration-outbound registrar set 127.0.0.1:$port" >"$scenario".registrar.script
-    start_gateway "$here/trunk.script" "$scenario".registrar.script
+    echo "face example.com trunk registration-outbound proxy insert 0 127.0.0.1:$port loose" >"$scenario".proxy.script
+    start_gateway "$here/trunk.script" "$scenario".proxy.script
     await_line "$scenario".gateway.err "trunk example.com/trunk registered at udp:127.0.0.1:$port for 300 s" ||
       fail "the trunk did not register"
     grep -q "trunk example.com/trunk failed to register (503), retrying in 1 s" "$scenario".gateway.err ||
