@@ -6,6 +6,9 @@
 #include "DigestAuthentication.h"
 #include "Exchange.h"
 #include "LS_CredentialLookup.h"
+#include "LS_ILocationService.h"
+#include "LS_IdentityResolution.h"
+#include "LS_IdentityType.h"
 
 namespace {
 
@@ -64,12 +67,63 @@ Registrar::~Registrar() {
 }
 
 void Registrar::handle(Exchange& exchange) {
-  sip_msg const& message = exchange.request();
   CNameAddr to;
-  RefPtr<LS_IIdentity> const identity = exchange.resolveOrAnswer(message.to.auri, to);
-  if (!identity || !authenticated(exchange, identity.get(), to))
+  RefPtr<LS_IIdentity> const resolved = exchange.resolveOrAnswer(exchange.request().to.auri, to);
+  if (!resolved || !authenticated(exchange, resolved.get(), to))
     return;
+  bool created = false;
+  RefPtr<LS_IIdentity> const identity = registering(resolved.get(), to, created);
+  if (!identity)
+    return exchange.answer(403, "Forbidden");
+  update(exchange, identity, created);
+  forgetIfUnbound(identity.get(), created);
+}
 
+RefPtr<LS_IIdentity> Registrar::registering(LS_IIdentity* resolved, CNameAddr const& to, bool& created) {
+  return m_clock.measure([&] {
+    if (resolved->getIdentityType() != LS_IdentityType::IDENTITY_GROUP)
+      return RefPtr<LS_IIdentity>(resolved);
+    String error;
+    String user;
+    CHostPort host;
+    RefPtr<LS_ILocationService> service;
+    RefPtr<LS_IIdentity> identity;
+    if (LS_splitNameAddr(error, user, host, to).isFailure() ||
+        adoptInterface(service, [&](UUID const& iid, void** raw) {
+          return resolved->getLocationServiceIf(iid, raw);
+        }).isFailure() ||
+        adoptInterface(identity, [&](UUID const& iid, void** raw) {
+          return service->createDynamicIdentityIf(user, iid, raw);
+        }).isFailure())
+      return RefPtr<LS_IIdentity>();
+    created = true;
+    return identity;
+  });
+}
+
+void Registrar::forgetIfUnbound(LS_IIdentity* identity, bool created) {
+  // Held here: the table's entry may be the last reference.
+  RefPtr<LS_IIdentity> const held(identity);
+  bool dynamic = created;
+  auto const found = m_bindings.find(identity);
+  if (found != m_bindings.end()) {
+    if (!found->second.byContact.empty())
+      return;
+    dynamic = dynamic || found->second.dynamic;
+    m_bindings.erase(found);
+  }
+  if (!dynamic)
+    return;
+  m_clock.measure([&] {
+    RefPtr<LS_ILocationService> service;
+    adoptInterface(service, [&](UUID const& iid, void** raw) { return identity->getLocationServiceIf(iid, raw); });
+    if (service)
+      service->removeDynamicIdentity(identity->getName());
+  });
+}
+
+void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity, bool created) {
+  sip_msg const& message = exchange.request();
   RefPtr<LS_IRegistrationInbound> face;
   m_clock.measure([&] {
     adoptInterface(face, [&](UUID const& iid, void** raw) {
@@ -122,6 +176,7 @@ void Registrar::handle(Exchange& exchange) {
       return exchange.answer(423, "Interval Too Brief", "Min-Expires: " + std::to_string(minimum) + "\r\n");
   Bindings& bindings = m_bindings[identity.get()];
   bindings.identity = identity;
+  bindings.dynamic = bindings.dynamic || created;
   bindings.face = face;
   size_t const before = bindings.byContact.size();
   size_t added = 0;
@@ -145,8 +200,6 @@ void Registrar::handle(Exchange& exchange) {
   }
   reportTransition(bindings, before);
   exchange.answer(200, "OK", bindingHeaders(bindings));
-  if (bindings.byContact.empty())
-    m_bindings.erase(identity.get());
 }
 
 bool Registrar::authenticated(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to) {
@@ -269,6 +322,5 @@ void Registrar::onExpiry(void* argument) {
   LS_IIdentity* const identity = bindings.identity.get();
   registrar.remove(binding);
   registrar.reportTransition(bindings, 1);
-  if (bindings.byContact.empty())
-    registrar.m_bindings.erase(identity);
+  registrar.forgetIfUnbound(identity, false);
 }

@@ -15,7 +15,13 @@
 //   unregistered when its last one goes (removed, expired or shut down).
 // - At most kMaximumContacts per request (400 beyond) and kMaximumBindings
 //   per identity (403 beyond), so that no phone can grow the gateway's
-//   memory at will; the "DEFAULT" group answers every unknown user.
+//   memory at will.
+// - A user that only the "DEFAULT" group answers registers as a dynamic
+//   identity of the user's name, which its location service bases on the
+//   group: a contact on the group's own face would be inherited by every
+//   member. The registrar removes that identity again when its last binding
+//   goes, so that the group answers the user as before. The group's own
+//   name cannot register (403).
 // - A digest response to a nonce this process did not make counts as no
 //   credentials (a fresh 401), one to an expired nonce gets 401 with
 //   stale=true; only a wrong password on a valid nonce gets 403.
@@ -66,6 +72,7 @@ class Registrar {
   // One identity's bindings, by contact text.
   struct Bindings {
     RefPtr<LS_IIdentity> identity;
+    bool dynamic = false;  // created by this registrar for a "DEFAULT" user
     RefPtr<LS_IRegistrationInbound> face;
     std::map<std::string, std::unique_ptr<Binding>> byContact;
   };
@@ -76,6 +83,15 @@ class Registrar {
     uint32_t expires;
   };
 
+  // The identity whose face takes the contacts: resolved itself, or for a
+  // user the group answers, a dynamic identity of the user's name (created
+  // set then). Null when there is none.
+  RefPtr<LS_IIdentity> registering(LS_IIdentity* resolved, CNameAddr const& to, bool& created);
+  // The contacts of one accepted REGISTER applied and answered.
+  void update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity, bool created);
+  // Drops the identity's table entry when it holds no binding, and a
+  // dynamic identity made for it with it.
+  void forgetIfUnbound(LS_IIdentity* identity, bool created);
   // Whether the request carries valid credentials; answers 401 or 403
   // itself when not.
   bool authenticated(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to);
