@@ -83,14 +83,6 @@ class AliasModel {
     }
   }
 
-  // An identity removed from its service keeps its link to it, and may since
-  // have become the base of one the service still holds: that link closes a
-  // cycle that the master, which cuts the links of listed identities only,
-  // leaves alone.
-  ~AliasModel() {
-    for (RefPtr<LS_IIdentityConfig> const& identity : m_held)
-      identity->setConfigLocationService(nullptr);
-  }
   AliasModel(AliasModel const&) = delete;
   AliasModel& operator=(AliasModel const&) = delete;
 
