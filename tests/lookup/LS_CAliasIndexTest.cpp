@@ -6,42 +6,12 @@
 #include <string>
 #include <vector>
 
-#include "CInherit.h"
 #include "LS_CLocationService.h"
 #include "LS_IdentityResolution.h"
 #include "LookupFixture.h"
+#include "support/ScanOnlyService.h"
 
 namespace {
-
-// The run-time view of a real service without its alias index: the lookups
-// find no LS_CLocationService behind it and ask every identity in turn.
-class ScanOnlyService : public CInherit<ScanOnlyService, CObject, LS_ILocationService> {
- public:
-  explicit ScanOnlyService(RefPtr<LS_ILocationService> target) : m_target(std::move(target)) {}
-
-  String getName() const override { return m_target->getName(); }
-  LS_Imperative::Type getImperative() const override { return m_target->getImperative(); }
-  bool isResponsible(CHostPort const& hostPort,
-                     Vector<CHostPort> const& localHostPorts,
-                     LS_Imperative::Type imperative,
-                     bool& exact) const override {
-    return m_target->isResponsible(hostPort, localHostPorts, imperative, exact);
-  }
-  unsigned int getNumberOfDomains() const override { return m_target->getNumberOfDomains(); }
-  CHostPort getDomain(unsigned int index) const override { return m_target->getDomain(index); }
-  bool getDefaultDomain() const override { return m_target->getDefaultDomain(); }
-  XCode getIdentityIf(String const& name, UUID const& iid, void** out) override {
-    return m_target->getIdentityIf(name, iid, out);
-  }
-  XCode createDynamicIdentityIf(String const& name, UUID const& iid, void** out) override {
-    return m_target->createDynamicIdentityIf(name, iid, out);
-  }
-  void removeDynamicIdentity(String const& name) override { m_target->removeDynamicIdentity(name); }
-  void getIdentities(Vector<String>& names) const override { m_target->getIdentities(names); }
-
- private:
-  RefPtr<LS_ILocationService> const m_target;
-};
 
 // Identity names and users overlap on purpose: own names, renames and the
 // "DEFAULT" group compete with aliases. Users sit inside, on the ends of and
