@@ -242,13 +242,10 @@ struct World {
 
 void checkAliasIndex(World const& world) {
   for (RefPtr<LS_ILocationService> const& indexed : world.servicesWithinReach()) {
-    RefPtr<LS_ILocationService> const scanned = adoptRef(new ScanOnlyService(indexed));
     for (char const* user : USERS) {
       RefPtr<LS_IIdentity> fromIndex;
       RefPtr<LS_IIdentity> fromScan;
-      bool const foundIndexed = LS_getIdentityOrAliasIf(indexed, user, false, fromIndex).isSuccess();
-      bool const foundScanned = LS_getIdentityOrAliasIf(scanned, user, false, fromScan).isSuccess();
-      check(foundIndexed == foundScanned && fromIndex.get() == fromScan.get());
+      check(answersAsTheScan(indexed, user, false, fromIndex, fromScan));
     }
   }
 }

@@ -1,13 +1,15 @@
 // ScanOnlyService: the run-time view of a real location service without its
 // alias index, so that the lookups find no LS_CLocationService behind it and
-// ask every identity in turn. The reference that the alias index is checked
-// against, by its differential test and by the configuration fuzzer.
+// ask every identity in turn; and the comparison of a service's answer with
+// that reference, which the alias index's differential test and the
+// configuration fuzzer make.
 #pragma once
 
 #include <utility>
 
 #include "CInherit.h"
 #include "LS_ILocationService.h"
+#include "LS_IdentityResolution.h"
 
 class ScanOnlyService : public CInherit<ScanOnlyService, CObject, LS_ILocationService> {
  public:
@@ -36,3 +38,16 @@ class ScanOnlyService : public CInherit<ScanOnlyService, CObject, LS_ILocationSe
  private:
   RefPtr<LS_ILocationService> const m_target;
 };
+
+// True when service answers user as asking each of its identities in turn
+// does: the same identity, or none from both. The two answers are handed out.
+inline bool answersAsTheScan(RefPtr<LS_ILocationService> const& service,
+                             String const& user,
+                             bool useDefault,
+                             RefPtr<LS_IIdentity>& fromIndex,
+                             RefPtr<LS_IIdentity>& fromScan) {
+  RefPtr<LS_ILocationService> const scanned = adoptRef(new ScanOnlyService(service));
+  bool const foundIndexed = LS_getIdentityOrAliasIf(service, user, useDefault, fromIndex).isSuccess();
+  bool const foundScanned = LS_getIdentityOrAliasIf(scanned, user, useDefault, fromScan).isSuccess();
+  return foundIndexed == foundScanned && fromIndex.get() == fromScan.get();
+}
