@@ -411,6 +411,7 @@ void editFace(World& world, Decoder& in) {
   char const* const service = in.pick(AUTHENTICATION_SERVICES);
   char const* const user = in.pick(USERS);
   unsigned int const index = in.byte() % 4;
+  bool const set = edit % 2;
   if (RefPtr<LS_IRegistrationInboundConfig> const inbound = as<LS_IRegistrationInboundConfig>(face)) {
     if (edit % 3 == 0)
       inbound->addConfigContact(nameAddr(contact), "ctx", "prov", index);
@@ -427,14 +428,30 @@ void editFace(World& world, Decoder& in) {
     else
       authentication->destroyConfigAuthenticates();
   }
-  if (RefPtr<LS_IOutbound> const outbound = as<LS_IOutbound>(face))
-    edit % 2 ? outbound->setDynamicProxy(hostPort(host), false) : outbound->removeDynamicProxy();
-  if (RefPtr<LS_IRegistrationOutbound> const registration = as<LS_IRegistrationOutbound>(face))
-    edit % 2 ? registration->setDynamicRegistrar(hostPort(host)) : registration->removeDynamicRegistrar();
-  if (RefPtr<LS_IMwiSubscription> const mwi = as<LS_IMwiSubscription>(face))
-    edit % 2 ? mwi->setDynamicMwiNotifier(hostPort(host)) : mwi->removeDynamicMwiNotifier();
-  if (RefPtr<LS_ICallConfig> const call = as<LS_ICallConfig>(face))
-    edit % 2 ? call->setConfigVoipProfile(user) : call->removeConfigVoipProfile();
+  if (RefPtr<LS_IOutbound> const outbound = as<LS_IOutbound>(face)) {
+    if (set)
+      outbound->setDynamicProxy(hostPort(host), false);
+    else
+      outbound->removeDynamicProxy();
+  }
+  if (RefPtr<LS_IRegistrationOutbound> const registration = as<LS_IRegistrationOutbound>(face)) {
+    if (set)
+      registration->setDynamicRegistrar(hostPort(host));
+    else
+      registration->removeDynamicRegistrar();
+  }
+  if (RefPtr<LS_IMwiSubscription> const mwi = as<LS_IMwiSubscription>(face)) {
+    if (set)
+      mwi->setDynamicMwiNotifier(hostPort(host));
+    else
+      mwi->removeDynamicMwiNotifier();
+  }
+  if (RefPtr<LS_ICallConfig> const call = as<LS_ICallConfig>(face)) {
+    if (set)
+      call->setConfigVoipProfile(user);
+    else
+      call->removeConfigVoipProfile();
+  }
 }
 
 void registerContact(World& world, Decoder& in) {
@@ -464,7 +481,10 @@ void announceRegistration(World& world, Decoder& in) {
   bool const registered = in.flag();
   if (!identity)
     return;
-  registered ? identity->isInboundRegistered() : identity->isInboundUnregistered();
+  if (registered)
+    identity->isInboundRegistered();
+  else
+    identity->isInboundUnregistered();
 }
 
 void editService(World& world, Decoder& in) {
