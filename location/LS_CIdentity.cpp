@@ -3,6 +3,7 @@
 #include <utility>
 
 #include "LS_CAliasIndex.h"
+#include "LS_CLocationService.h"
 #include "LS_ClassIdentifiers.h"
 #include "LS_Debug.h"
 #include "LS_ElementClassTable.h"
@@ -142,6 +143,7 @@ LS_CIdentity::LS_CIdentity() {
 
 LS_CIdentity::~LS_CIdentity() {
   LS_DEBUG("LS_CIdentity(%p)::~LS_Identity()\n", logAddress());
+  unlinked();
 }
 
 String const& LS_CIdentity::GET_ELEMENT_NAME(LS_IdentityFace::Type face) {
@@ -239,10 +241,24 @@ XCode LS_CIdentity::getConfigLocationServiceIf(UUID const& iid, void** out) {
 XCode LS_CIdentity::setConfigLocationService(LS_ILocationServiceConfig* service) {
   // The old link is dropped last: it may hold the service that holds this
   // identity.
-  RefPtr<LS_ILocationService> const previous = std::move(m_locationService);
+  RefPtr<LS_ILocationService> const previous = unlinked();
   if (!service)
     return XCode::success();
-  return LockedPtr<LS_ILocationServiceConfig>(service)->queryIf(m_locationService);
+  RefPtr<LS_ILocationService> linked;
+  XCode const result = LockedPtr<LS_ILocationServiceConfig>(service)->queryIf(linked);
+  if (result.isFailure())
+    return result;
+  auto* const owner = dynamic_cast<LS_CLocationService*>(linked.get());
+  if (owner && !owner->acceptLink(this))
+    return result;
+  m_locationService = std::move(linked);
+  return result;
+}
+
+RefPtr<LS_ILocationService> LS_CIdentity::unlinked() {
+  if (auto* const owner = dynamic_cast<LS_CLocationService*>(m_locationService.get()))
+    owner->dropLink(this);
+  return std::move(m_locationService);
 }
 
 XCode LS_CIdentity::isNoIdentityConfigLoop(LS_IIdentityConfig* identity, unsigned int depth) {

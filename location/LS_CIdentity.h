@@ -7,12 +7,13 @@
 // followed live.
 //
 // Ownership: counted. The location service holds the identity and the
-// identity holds its location service back; that cycle is cut by the owner
-// of the service with setConfigLocationService(nullptr) before it lets the
-// service go. The identity holds its base through the element model, so a
-// base outlives the identities derived from it; a removed base announces its
-// destruction and every derived identity drops it. The identity holds its
-// observers as borrowed pointers.
+// identity holds its location service back; the service's master cuts that
+// link, on every identity linked to the service, when it lets the service
+// go, and a service let go links no identity (LS_CLocationService). The
+// identity holds its base through the element model, so a base outlives the
+// identities derived from it; a removed base announces its destruction and
+// every derived identity drops it. The identity holds its observers as
+// borrowed pointers.
 //
 // Notifications: a change of the own or inherited outbound-registration,
 // inbound-registration or message-waiting face reaches the identity as a
@@ -179,6 +180,8 @@ class LS_CIdentity : public CInherit<LS_CIdentity,
   void notifyAliasChange();
   // Tells the alias index, when a service lists the identity.
   void aliasIndexChanged();
+  // Takes the identity off its service's links and hands over the link.
+  RefPtr<LS_ILocationService> unlinked();
   void dumpFaces(InfoContainer& info,
                  unsigned int maxLevel,
                  unsigned int level,
@@ -187,7 +190,7 @@ class LS_CIdentity : public CInherit<LS_CIdentity,
 
   String m_name;
   LS_IdentityType::Type m_type = LS_IdentityType::IDENTITY;
-  RefPtr<LS_ILocationService> m_locationService;  // null while detached
+  RefPtr<LS_ILocationService> m_locationService;  // null while unlinked
   ObserverContainer<LS_IRegistrationOutbound, LS_IRegistrationOutboundObserver>
       m_registrationOutboundObservers;
   ObserverContainer<LS_IRegistrationInbound, LS_IRegistrationInboundObserver> m_registrationInboundObservers;

@@ -88,6 +88,27 @@ LS_CLocationService::~LS_CLocationService() {
   LS_DEBUG("LS_CLocationService(%p)::~LS_CLocationService()\n", LS_ptr(this));
 }
 
+// Links back.
+
+bool LS_CLocationService::acceptLink(LS_CIdentity* identity) {
+  if (m_detached)
+    return false;
+  m_linked.insert(identity);
+  return true;
+}
+
+void LS_CLocationService::dropLink(LS_CIdentity* identity) {
+  m_linked.erase(identity);
+}
+
+// The caller holds the service, so no cut link is its last reference; each
+// cut takes the identity out of m_linked.
+void LS_CLocationService::detachIdentities() {
+  m_detached = true;
+  while (!m_linked.empty())
+    LockedPtr<LS_IIdentityConfig>(*m_linked.begin())->setConfigLocationService(nullptr);
+}
+
 // Name, imperative, default domain.
 
 String LS_CLocationService::getConfigName() const {

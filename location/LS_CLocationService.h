@@ -6,11 +6,21 @@
 //
 // Ownership: counted. The master holds the service; the service holds one
 // reference to each identity, and each identity holds the service back. The
-// master cuts the identities' links before it lets a service go, which is
-// what breaks that cycle; a service dropped any other way is kept alive by
-// its own identities. Removing an identity announces its destruction to the
+// master cuts those links when it lets the service go, which is what breaks
+// that cycle. Removing an identity announces its destruction to the
 // elements based on it, so derived identities drop it as their base and
 // nothing dangles.
+//
+// Decision: a removed identity still answers the service it was removed
+// from, as long as the master holds that service; when the master lets the
+// service go, it cuts the link of every identity that points back here,
+// removed ones included, and the service links no identity from then on
+// (one made in it afterwards has no location service, like every other
+// identity it holds by then). A removed identity may since have become the
+// base of one the service still holds, and one made later is held by the
+// service: either link back would close a cycle that nothing cuts any more.
+// So the service knows every identity linked to it, as a borrowed pointer
+// that the identity takes back before it lets the link go.
 //
 // Re-entrancy: observers of the service or of its identities may remove
 // identities, or drop the service, while they are told: every walk over an
@@ -29,6 +39,8 @@
 // serialise every operation and the lookups that read the service.
 // Finding the service responsible for a host belongs to the lookups.
 #pragma once
+
+#include <unordered_set>
 
 #include "CHostPort.h"
 #include "CInherit.h"
@@ -95,6 +107,14 @@ class LS_CLocationService : public CInherit<LS_CLocationService,
   // alias index, without asking each identity.
   RefPtr<LS_IIdentity> getFirstResponsibleIdentity(String const& user);
 
+  // Links back (see Ownership). False once the master has let the service
+  // go: the identity then holds no link.
+  bool acceptLink(LS_CIdentity* identity);
+  void dropLink(LS_CIdentity* identity);
+  // The master lets the service go: every identity linked here lets go of
+  // it, and none is linked from then on.
+  void detachIdentities();
+
   // LS_ILocationServiceSubject
   void addLocationServiceObserver(LS_ILocationServiceObserver* observer, unsigned int priority) override;
   void removeLocationServiceObserver(LS_ILocationServiceObserver* observer) override;
@@ -158,4 +178,6 @@ class LS_CLocationService : public CInherit<LS_CLocationService,
   // lets them go while they are still held.
   LS_CAliasIndex m_aliasIndex;
   ObserverContainer<LS_ILocationService, LS_ILocationServiceObserver> m_observers;
+  std::unordered_set<LS_CIdentity*> m_linked;  // borrowed; see Ownership
+  bool m_detached = false;                     // the master has let the service go
 };

@@ -3,7 +3,6 @@
 #include "IDriver.h"
 #include "LS_CLocationService.h"
 #include "LS_ClassIdentifiers.h"
-#include "LS_IIdentityConfig.h"
 #include "LS_ILocationServiceConfig.h"
 #include "LS_InfoRows.h"
 #include "LockedPtr.h"
@@ -73,16 +72,8 @@ void LS_CMasterLocationService::removeLocationService(String const& name) {
 }
 
 void LS_CMasterLocationService::detachIdentities(RefPtr<LS_ILocationService> const& service) {
-  RefPtr<LS_ILocationServiceConfig> config;
-  if (LockedPtr<LS_ILocationService>(service)->queryIf(config).isFailure())
-    return;
-  Vector<String> names;
-  LockedPtr<LS_ILocationService>(service)->getIdentities(names);
-  for (String const& name : names) {
-    RefPtr<LS_IIdentityConfig> identity;
-    if (LS_getIdentityIf(service.get(), name, identity).isSuccess())
-      LockedPtr<LS_IIdentityConfig>(identity)->setConfigLocationService(nullptr);
-  }
+  // Every service in the table was made here.
+  LockedPtr<LS_CLocationService>(static_cast<LS_CLocationService*>(service.get()))->detachIdentities();
 }
 
 void LS_CMasterLocationService::getLocationServices(Vector<String>& names) const {

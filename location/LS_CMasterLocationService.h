@@ -64,7 +64,8 @@ class LS_EXPORT LS_CMasterLocationService : public CInherit<LS_CMasterLocationSe
                          String const& prefix) const override;
 
  private:
-  // Cuts the link of each of the service's identities back to it.
+  // Cuts the link of every identity back to the service, removed ones
+  // included, for good.
   static void detachIdentities(RefPtr<LS_ILocationService> const& service);
   void notifyLocationServiceAdded(LS_ILocationService* service);
   void notifyLocationServiceRemoved(LS_ILocationService* service);

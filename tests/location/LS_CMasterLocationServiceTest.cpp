@@ -146,4 +146,59 @@ TEST_F(LocationTest, TearingDownTheMasterLeavesNothingBehind) {
             countLinesEndingIn(log, "::~LS_CData()\n"));
 }
 
+// What a caller may still hold of a service its master has let go keeps no
+// cycle alive: once every outside reference is dropped, every identity and
+// the service are gone while the master itself lives on.
+struct Leftover {
+  char const* name;
+  void (*keep)(LS_ILocationServiceConfig* service, LS_CMasterLocationService* master);
+};
+
+RefPtr<LS_IIdentityConfig> configured(LS_ILocationServiceConfig* service, char const* name) {
+  return handedOut<LS_IIdentityConfig>([&](UUID const& iid, void** out) {
+    return service->createConfigIdentityIf(name, "", LS_IdentityType::IDENTITY, iid, out);
+  });
+}
+
+bool linksBack(LS_IIdentityConfig* identity) {
+  return handedOut([&](UUID const& iid, void** out) {
+           return identity->getConfigLocationServiceIf(iid, out);
+         }) != nullptr;
+}
+
+Leftover const LEFTOVERS[] = {
+    {"ARemovedIdentityMadeTheBaseOfOneStillListed",
+     [](LS_ILocationServiceConfig* service, LS_CMasterLocationService* master) {
+       RefPtr<LS_IIdentityConfig> const a = configured(service, "a");
+       RefPtr<LS_IIdentityConfig> const b = configured(service, "b");
+       service->removeConfigIdentity("a");
+       ASSERT_TRUE(b->setConfigBaseIdentity(a.get()).isSuccess());
+       EXPECT_TRUE(linksBack(a.get()));
+       master->removeLocationService("s");
+       EXPECT_FALSE(linksBack(a.get()));
+     }},
+    {"AnIdentityMadeInTheServiceAfterItsRemoval",
+     [](LS_ILocationServiceConfig* service, LS_CMasterLocationService* master) {
+       master->removeLocationService("s");
+       EXPECT_FALSE(linksBack(configured(service, "late").get()));
+     }},
+};
+
+class LeftoverTest : public ::testing::TestWithParam<Leftover> {};
+
+TEST_P(LeftoverTest, GoesWithTheLastOutsideReference) {
+  LogCapture log;
+  RefPtr<LS_CMasterLocationService> const master = adoptRef(new LS_CMasterLocationService);
+  {
+    RefPtr<LS_ILocationServiceConfig> const service = handedOut<LS_ILocationServiceConfig>(
+        [&](UUID const& iid, void** out) { return master->createLocationServiceIf("s", iid, out); });
+    GetParam().keep(service.get(), master.get());
+  }
+
+  EXPECT_EQ(countLinesEndingIn(log, "::LS_Identity()\n"), countLinesEndingIn(log, "::~LS_Identity()\n"));
+  EXPECT_EQ(countLinesEndingIn(log, "::~LS_CLocationService()\n"), 1u);
+}
+
+INSTANTIATE_TEST_SUITE_P(Service, LeftoverTest, ::testing::ValuesIn(LEFTOVERS), rowName<Leftover>);
+
 }  // namespace

@@ -6,42 +6,12 @@
 #include <string>
 #include <vector>
 
-#include "CInherit.h"
 #include "LS_CLocationService.h"
 #include "LS_IdentityResolution.h"
 #include "LookupFixture.h"
+#include "support/ScanOnlyService.h"
 
 namespace {
-
-// The run-time view of a real service without its alias index: the lookups
-// find no LS_CLocationService behind it and ask every identity in turn.
-class ScanOnlyService : public CInherit<ScanOnlyService, CObject, LS_ILocationService> {
- public:
-  explicit ScanOnlyService(RefPtr<LS_ILocationService> target) : m_target(std::move(target)) {}
-
-  String getName() const override { return m_target->getName(); }
-  LS_Imperative::Type getImperative() const override { return m_target->getImperative(); }
-  bool isResponsible(CHostPort const& hostPort,
-                     Vector<CHostPort> const& localHostPorts,
-                     LS_Imperative::Type imperative,
-                     bool& exact) const override {
-    return m_target->isResponsible(hostPort, localHostPorts, imperative, exact);
-  }
-  unsigned int getNumberOfDomains() const override { return m_target->getNumberOfDomains(); }
-  CHostPort getDomain(unsigned int index) const override { return m_target->getDomain(index); }
-  bool getDefaultDomain() const override { return m_target->getDefaultDomain(); }
-  XCode getIdentityIf(String const& name, UUID const& iid, void** out) override {
-    return m_target->getIdentityIf(name, iid, out);
-  }
-  XCode createDynamicIdentityIf(String const& name, UUID const& iid, void** out) override {
-    return m_target->createDynamicIdentityIf(name, iid, out);
-  }
-  void removeDynamicIdentity(String const& name) override { m_target->removeDynamicIdentity(name); }
-  void getIdentities(Vector<String>& names) const override { m_target->getIdentities(names); }
-
- private:
-  RefPtr<LS_ILocationService> const m_target;
-};
 
 // Identity names and users overlap on purpose: own names, renames and the
 // "DEFAULT" group compete with aliases. Users sit inside, on the ends of and
@@ -65,6 +35,16 @@ int below(std::mt19937& random, int bound) {
   return std::uniform_int_distribution<int>(0, bound - 1)(random);
 }
 
+// Empty when service answers user as asking every identity in turn does;
+// else both answers.
+std::string disagreementOn(RefPtr<LS_ILocationService> const& service, String const& user, bool useDefault) {
+  RefPtr<LS_IIdentity> fromIndex;
+  RefPtr<LS_IIdentity> fromScan;
+  if (answersAsTheScan(service, user, useDefault, fromIndex, fromScan))
+    return std::string();
+  return "user '" + user.str() + "': index " + whereIs(fromIndex) + ", scan " + whereIs(fromScan);
+}
+
 // One random model of three location services, edited step by step; after
 // every step each service answers random users through its index and
 // through the scan-only view, and the two answers must be the same identity.
@@ -79,18 +59,9 @@ class AliasModel {
       config->queryIf(runtime);
       m_configs.push_back(config);
       m_indexed.push_back(runtime);
-      m_scanned.push_back(adoptRef(new ScanOnlyService(runtime)));
     }
   }
 
-  // An identity removed from its service keeps its link to it, and may since
-  // have become the base of one the service still holds: that link closes a
-  // cycle that the master, which cuts the links of listed identities only,
-  // leaves alone.
-  ~AliasModel() {
-    for (RefPtr<LS_IIdentityConfig> const& identity : m_held)
-      identity->setConfigLocationService(nullptr);
-  }
   AliasModel(AliasModel const&) = delete;
   AliasModel& operator=(AliasModel const&) = delete;
 
@@ -147,17 +118,10 @@ class AliasModel {
   std::string disagreement() {
     for (size_t service = 0; service < m_indexed.size(); ++service) {
       for (int query = 0; query < 3; ++query) {
-        String const user = pick(m_random, USERS);
-        bool const useDefault = below(m_random, 2) == 0;
-        RefPtr<LS_IIdentity> indexed;
-        RefPtr<LS_IIdentity> scanned;
-        bool const foundIndexed =
-            LS_getIdentityOrAliasIf(m_indexed[service], user, useDefault, indexed).isSuccess();
-        bool const foundScanned =
-            LS_getIdentityOrAliasIf(m_scanned[service], user, useDefault, scanned).isSuccess();
-        if (foundIndexed != foundScanned || indexed.get() != scanned.get())
-          return "s" + std::to_string(service) + " user '" + user.str() + "': index " + whereIs(indexed) +
-                 ", scan " + whereIs(scanned);
+        std::string const difference =
+            disagreementOn(m_indexed[service], pick(m_random, USERS), below(m_random, 2) == 0);
+        if (!difference.empty())
+          return "s" + std::to_string(service) + " " + difference;
       }
     }
     return std::string();
@@ -252,7 +216,6 @@ class AliasModel {
   RefPtr<LS_CMasterLocationService> const m_master = adoptRef(new LS_CMasterLocationService);
   std::vector<RefPtr<LS_ILocationServiceConfig>> m_configs;
   std::vector<RefPtr<LS_ILocationService>> m_indexed;
-  std::vector<RefPtr<LS_ILocationService>> m_scanned;
   std::vector<RefPtr<LS_IIdentityConfig>> m_held;
 };
 
@@ -269,6 +232,42 @@ TEST(AliasIndex, AnswersAsAskingEveryIdentityDoesThroughRandomEdits) {
       ASSERT_EQ(difference, "") << "run " << run << ", step " << step << " after: " << history;
     }
   }
+}
+
+class AliasIndexTest : public LookupTest {};
+
+// Every range below lies under the prefix "1", so all are nodes of one
+// tree; the one reaching highest goes first each time, so the bounds that
+// the tree keeps above it must come down with it.
+TEST_F(AliasIndexTest, RangesLeavingOneBucketWidestFirstLeaveItsBoundsRight) {
+  // In byte order, so the last reaches highest.
+  char const* const lasts[] = {"11", "110", "111", "112", "12", "13", "14", "15", "16", "17", "18", "19"};
+  std::vector<RefPtr<LS_IIdentityConfig>> members;
+  for (char const* last : lasts) {
+    members.push_back(identity("s", (std::string("m") + last).c_str()));
+    members.back()->addConfigAliasRange("10", last);
+  }
+  for (auto member = members.rbegin(); member != members.rend(); ++member) {
+    (*member)->clearConfigAlias();
+    for (char const* user : {"1", "10", "105", "11", "110", "112", "15", "19", "2"})
+      ASSERT_EQ(disagreementOn(runtimeService("s"), user, false), "") << (*member)->getConfigName().str();
+  }
+}
+
+// The index forgets, now and then, the identities that left it since the
+// last lookup; an edit it noted before must survive that.
+TEST_F(AliasIndexTest, AnEditNotedBeforeManyIdentitiesComeAndGoStillCounts) {
+  RefPtr<LS_IIdentityConfig> const kept = identity("s", "kept");
+  RefPtr<LS_IIdentity> found;
+  ASSERT_TRUE(LS_getIdentityOrAliasIf(runtimeService("s"), "x", false, found).isFailure());
+  kept->addConfigAliasName("x");
+  for (int passing = 0; passing < 100; ++passing) {
+    identity("s", "passing");
+    locationService("s")->removeConfigIdentity("passing");
+  }
+
+  ASSERT_TRUE(LS_getIdentityOrAliasIf(runtimeService("s"), "x", false, found).isSuccess());
+  EXPECT_EQ(found->getName(), "kept");
 }
 
 }  // namespace
