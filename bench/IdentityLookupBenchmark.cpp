@@ -11,8 +11,8 @@
 // given at the same size, which stay flat from 1,000 to 100,000 when their
 // cost does not grow with the service; challenge and response as ratios to the
 // map lookup alone. Also: how long one change of a group takes to reach the
-// registration observers of its 10,000 members, and the heap that one member
-// of a full group takes.
+// registration observers of its 10,000 members. What one member of a group
+// takes in memory is identity_memory's (IdentityMemory.cpp).
 #include <benchmark/benchmark.h>
 #include <malloc.h>
 
@@ -29,10 +29,6 @@
 #include "LS_CMasterLocationService.h"
 #include "LS_CredentialLookup.h"
 #include "LS_IAuthenticationConfig.h"
-#include "LS_ICallConfig.h"
-#include "LS_IMwiSubscriptionConfig.h"
-#include "LS_IOutboundConfig.h"
-#include "LS_IRegistrationInboundConfig.h"
 #include "LS_IRegistrationOutboundConfig.h"
 #include "LS_IRegistrationOutboundObserver.h"
 #include "LS_IRegistrationOutboundSubject.h"
@@ -287,45 +283,6 @@ RefPtr<T> faceOf(LS_IIdentityConfig* group, LS_IdentityFace::Type face) {
   return created;
 }
 
-// The heap that one more identity takes when it inherits a group with all
-// seven faces and some twenty settings on them, as a gateway's subscribers
-// inherit their group.
-size_t bytesOfOneInheritingIdentity() {
-  Model model(0);
-  RefPtr<LS_IIdentityConfig> const group = model.identity("FULL", "", LS_IdentityType::IDENTITY_GROUP);
-  group->setConfigDisplayName("Group");
-  group->setConfigPhoneContext("example.com");
-  RefPtr<LS_IRegistrationOutboundConfig> const outbound =
-      faceOf<LS_IRegistrationOutboundConfig>(group.get(), LS_IdentityFace::REGISTRATION_OUTBOUND);
-  outbound->setConfigRegistrar(Model::hostPortOf("registrar.example.com"), CHostPort());
-  outbound->setConfigLifetime(600);
-  RefPtr<LS_IOutboundConfig> transport;
-  outbound->queryIf(transport);
-  transport->setConfigTrafficClass(46);
-  transport->setConfigPenaltyBox(true);
-  outbound->setConfigKeepAliveInterval(30);
-  RefPtr<LS_IRegistrationInboundConfig> const inbound =
-      faceOf<LS_IRegistrationInboundConfig>(group.get(), LS_IdentityFace::REGISTRATION_INBOUND);
-  inbound->setConfigLifetimeRange(60, 3600, 600);
-  RefPtr<LS_IMwiSubscriptionConfig> const mwi =
-      faceOf<LS_IMwiSubscriptionConfig>(group.get(), LS_IdentityFace::MESSAGE_SUBSCRIPTION);
-  mwi->setConfigMwiNotifier(Model::hostPortOf("mwi.example.com"), CHostPort());
-  mwi->setConfigLifetime(3600);
-  for (LS_IdentityFace::Type face : {LS_IdentityFace::CALL_OUTBOUND, LS_IdentityFace::CALL_INBOUND}) {
-    RefPtr<LS_ICallConfig> const call = faceOf<LS_ICallConfig>(group.get(), face);
-    call->setConfigVoipProfile("voip");
-    call->setConfigToneSetProfile("tones");
-    call->setConfigSipProfile("sip");
-  }
-  for (LS_IdentityFace::Type face : {LS_IdentityFace::AUTHENTICATION_OUTBOUND, LS_IdentityFace::AUTHENTICATION_INBOUND})
-    faceOf<LS_IAuthenticationConfig>(group.get(), face)->insertConfigAuthenticate(0, "http", "");
-
-  model.identity("warm-up", "FULL", LS_IdentityType::IDENTITY);
-  size_t const before = mallinfo2().uordblks;
-  RefPtr<LS_IIdentityConfig> const member = model.identity("member", "FULL", LS_IdentityType::IDENTITY);
-  return mallinfo2().uordblks - before;
-}
-
 // Counts the outbound-registration changes that reach a member.
 class RegistrationCounter : public LS_IRegistrationOutboundObserver {
  public:
@@ -402,7 +359,6 @@ int main(int argc, char** argv) {
   for (auto const& first : firstLookups())
     std::printf("first lookup after creating %d identities: %.1f ms, alias index %.0f bytes per identity\n",
                 first.first, first.second.milliseconds, first.second.bytesPerIdentity);
-  std::printf("one identity inheriting a full group: %zu bytes\n", bytesOfOneInheritingIdentity());
   benchmark::Shutdown();
   return 0;
 }
