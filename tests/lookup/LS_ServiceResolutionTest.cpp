@@ -123,7 +123,9 @@ TEST_F(ServiceResolutionTest, MissingNamesSayWhatIsMissing) {
 struct Gateway {
   Gateway() {
     RefPtr<LS_ILocationServiceConfig> config;
-    adoptInterface(config, [&](UUID const& iid, void** raw) { return location->createLocationServiceIf("ls", iid, raw); });
+    adoptInterface(config, [&](UUID const& iid, void** raw) {
+      return location->createLocationServiceIf("ls", iid, raw);
+    });
     config->insertConfigDomain(0, hostPort("example.com"));
     adoptInterface(alice, [&](UUID const& iid, void** raw) {
       return config->createConfigIdentityIf("alice", "", LS_IdentityType::IDENTITY, iid, raw);
