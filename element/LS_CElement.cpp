@@ -29,31 +29,34 @@ void LS_CElement::notifyDestroying() {
 }
 
 XCode LS_CElement::getBase(RefPtr<LS_IElement>& base) const {
-  base = m_base;
+  base = RefPtr<LS_IElement>(baseElement());
   return base ? XCode::success() : XCode::failure();
 }
 
 void LS_CElement::setBase(LS_IElement* newBase) {
   LS_DEBUG("LS_CElement(%p)::setBase(%p)\n", logAddress(), LS_ptr(newBase));
-  if (newBase == m_base.get())
+  if (newBase == baseElement())
     return;
-  if (m_base)
-    LockedPtr<LS_IElement>(m_base)->removeElementObserver(this);
-  // Keep the old base alive until it has been let go of completely.
-  RefPtr<LS_IElement> const oldBase = m_base;
-  m_base = newBase;
-  if (m_base)
-    LockedPtr<LS_IElement>(m_base)->addElementObserver(this, 0);
+  if (baseElement())
+    LockedPtr<LS_IElement>(baseElement())->removeElementObserver(this);
+  // The old base keeps the reference this element held until it has been
+  // let go of completely.
+  RefPtr<LS_IElement> const oldBase = adoptRef(baseElement());
+  if (newBase)
+    newBase->addRef();
+  m_baseAndDynamic = reinterpret_cast<std::uintptr_t>(newBase) | (m_baseAndDynamic & kDynamic);
+  if (newBase)
+    LockedPtr<LS_IElement>(newBase)->addElementObserver(this, 0);
 }
 
 void LS_CElement::onChange(ObserverEvent<LS_IElement>& event) {
   LS_DEBUG("LS_CElement(%p)::onChange()\n", logAddress());
-  if (event.getSubject() == m_base.get())
+  if (event.getSubject() == baseElement())
     notifyChange();
 }
 
 void LS_CElement::onDestroying(ObserverEvent<LS_IElement>& event) {
   LS_DEBUG("LS_CElement(%p)::onDestroying()\n", logAddress());
-  if (event.getSubject() == m_base.get())
+  if (event.getSubject() == baseElement())
     setBase(nullptr);
 }

@@ -14,6 +14,8 @@
 // itself.
 #pragma once
 
+#include <cstdint>
+
 #include "CInherit.h"
 #include "LS_IElement.h"
 #include "ObserverContainer.h"
@@ -31,8 +33,10 @@ class LS_CElement : public CInherit<LS_CElement, CObject, LS_IElement>, public L
   XCode getBase(RefPtr<LS_IElement>& base) const override;
   void setBase(LS_IElement* base) override;
   void reset() override {}
-  void setDynamic(bool dynamic) override { m_dynamic = dynamic; }
-  bool isDynamic() const override { return m_dynamic; }
+  void setDynamic(bool dynamic) override {
+    m_baseAndDynamic = (m_baseAndDynamic & ~kDynamic) | (dynamic ? kDynamic : 0);
+  }
+  bool isDynamic() const override { return (m_baseAndDynamic & kDynamic) != 0; }
 
   // LS_IElementObserver: a change of the base is this element's change; a
   // base that goes away is dropped.
@@ -41,14 +45,19 @@ class LS_CElement : public CInherit<LS_CElement, CObject, LS_IElement>, public L
 
  protected:
   // The base element, borrowed; for hot read paths that must not count.
-  LS_IElement* baseElement() const { return m_base.get(); }
+  LS_IElement* baseElement() const { return reinterpret_cast<LS_IElement*>(m_baseAndDynamic & ~kDynamic); }
   LS_IElementObserver* asElementObserver() { return this; }
   // The address log lines print for this element: its LS_IElement, the
   // pointer that other elements' lines (setBase, addElement) print for it.
   void const* logAddress() const { return static_cast<LS_IElement const*>(this); }
 
  private:
+  static constexpr std::uintptr_t kDynamic = 1;
+  static_assert(alignof(LS_IElement) > 1, "the low bit of an element's address is free");
+
   ObserverContainer<LS_IElement, LS_IElementObserver> m_observers;
-  RefPtr<LS_IElement> m_base;
-  bool m_dynamic = false;
+  // The base element, holding a counted reference, with the dynamic flag in
+  // the low bit of its address: a bool of its own padded every element by a
+  // word on 32-bit targets, and a derived identity holds some thirty.
+  std::uintptr_t m_baseAndDynamic = 0;
 };

@@ -109,7 +109,7 @@ class LS_ElementTable {
       moveTo(capacity() ? capacity() * 2 : 1);
     new (m_block->entries() + m_block->size) Entry{std::move(name), RefPtr<LS_IElement>(value)};
     ++m_block->size;
-    if (m_block->index)
+    if (m_block->index())
       indexEntry(m_block->size - 1);
     else if (m_block->size > kIndexedFrom)
       rebuildIndex();
@@ -143,25 +143,41 @@ class LS_ElementTable {
   static constexpr std::uint32_t kEmpty = 0;  // index slots hold position + 1
 
   // The entries follow the header in the same allocation; an empty table
-  // has none.
+  // has none. A block with room for more than kIndexedFrom entries, and
+  // only such a block, has one more word after its entries, for the index:
+  // the few-entry tables that derived identities hold by the hundred
+  // thousand never need one.
   struct Block {
     unsigned int size;
     unsigned int capacity;
-    // Open addressing over entry positions: slot 0 holds the mask, the
-    // slots after it position + 1 or kEmpty. Null for a short table.
-    std::uint32_t* index;
 
+    static size_t bytesFor(size_t capacity) {
+      return sizeof(Block) + capacity * sizeof(Entry) +
+             (capacity > kIndexedFrom ? sizeof(std::uint32_t*) : 0);
+    }
     Entry* entries() { return reinterpret_cast<Entry*>(this + 1); }
     Entry* end() { return entries() + size; }
+    // Open addressing over entry positions: slot 0 holds the mask, the
+    // slots after it position + 1 or kEmpty. Null for a short table.
+    std::uint32_t* index() { return capacity > kIndexedFrom ? *indexWord() : nullptr; }
+    // Only a block with the word may be given a non-null index.
+    void setIndex(std::uint32_t* index) {
+      if (capacity > kIndexedFrom)
+        new (indexWord()) std::uint32_t*(index);
+    }
+
+   private:
+    std::uint32_t** indexWord() { return reinterpret_cast<std::uint32_t**>(entries() + capacity); }
   };
   static_assert(sizeof(Block) % alignof(Entry) == 0, "entries follow the header");
+  static_assert(alignof(Entry) % alignof(std::uint32_t*) == 0, "the index word follows the entries");
 
   static void release(Block* block) {
     if (!block)
       return;
     for (Entry* entry = block->entries(); entry != block->end(); ++entry)
       entry->~Entry();
-    delete[] block->index;
+    delete[] block->index();
     ::operator delete(block);
   }
 
@@ -169,12 +185,16 @@ class LS_ElementTable {
 
   // Moves the entries to a block of room for capacity.
   void moveTo(size_t capacity) {
-    void* const memory = ::operator new(sizeof(Block) + capacity * sizeof(Entry));
-    Block* const moved = new (memory) Block{0, static_cast<unsigned int>(capacity), nullptr};
+    void* const memory = ::operator new(Block::bytesFor(capacity));
+    Block* const moved = new (memory) Block{0, static_cast<unsigned int>(capacity)};
+    moved->setIndex(nullptr);
     if (m_block) {
       for (Entry* entry = m_block->entries(); entry != m_block->end(); ++entry)
         new (moved->entries() + moved->size++) Entry{std::move(*entry)};
-      std::swap(moved->index, m_block->index);
+      // Tables only grow, so a block with an index moves to one with room
+      // for it.
+      moved->setIndex(m_block->index());
+      m_block->setIndex(nullptr);
       release(m_block);
     }
     m_block = moved;
@@ -184,7 +204,7 @@ class LS_ElementTable {
     if (!m_block)
       return nullptr;
     size_t const hash = LS_ElementName::hashOf(key);
-    std::uint32_t const* const index = m_block->index;
+    std::uint32_t const* const index = m_block->index();
     if (!index) {
       for (Entry* entry = m_block->entries(); entry != m_block->end(); ++entry) {
         if (entry->name.equals(key, hash))
@@ -202,7 +222,7 @@ class LS_ElementTable {
   }
 
   void indexEntry(size_t position) {
-    std::uint32_t* const index = m_block->index;
+    std::uint32_t* const index = m_block->index();
     std::uint32_t const mask = index[0];
     if (m_block->size * 4 > (size_t{mask} + 1) * 3) {
       rebuildIndex();
@@ -217,15 +237,16 @@ class LS_ElementTable {
   // Short tables drop their index; long ones file every entry anew, at most
   // three quarters full.
   void rebuildIndex() {
-    delete[] m_block->index;
-    m_block->index = nullptr;
+    delete[] m_block->index();
+    m_block->setIndex(nullptr);
     if (m_block->size <= kIndexedFrom)
       return;
     size_t slots = 32;
     while (m_block->size * 4 > slots * 3)
       slots *= 2;
-    m_block->index = new std::uint32_t[slots + 1]();
-    m_block->index[0] = static_cast<std::uint32_t>(slots - 1);
+    std::uint32_t* const index = new std::uint32_t[slots + 1]();
+    index[0] = static_cast<std::uint32_t>(slots - 1);
+    m_block->setIndex(index);
     for (size_t position = 0; position < m_block->size; ++position)
       indexEntry(position);
   }

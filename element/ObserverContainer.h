@@ -4,10 +4,10 @@
 //
 // Re-entrancy: a handler may register or unregister observers, itself
 // included, while a broadcast runs. An entry unregistered then is only marked
-// (count 0, delegate dropped) and skipped; it is unlinked by the housekeeping
-// that ends the outermost broadcast. Outside broadcasts it is unlinked at
-// once. An entry registered during a broadcast is linked at once and is
-// reached if it lies ahead of the current one.
+// (its target cleared, a delegate dropped) and skipped; it is unlinked by the
+// housekeeping that ends the outermost broadcast. Outside broadcasts it is
+// unlinked at once. An entry registered during a broadcast is linked at once
+// and is reached if it lies ahead of the current one.
 //
 // Layout: the entries lie in one array in the reverse of notification order,
 // so that the registration the library always makes (priority 0, notified
@@ -26,16 +26,22 @@
 //
 // Cost: a group's value is watched by every member that inherits it, so one
 // subject may carry tens of thousands of observers. Registering and
-// unregistering must not walk such a list. Once a list grows past
-// kIndexedFrom entries it keeps an index of its live bare observers by
-// observer; shorter lists are walked, which costs less than hashing and
-// keeps the many subjects with one or two observers small. A long list does
-// not close the gap an unregistered entry leaves at once: the entry stays as
-// a tombstone, and the array is compacted (and the index rebuilt) once
-// tombstones make up half of it, so that every operation stays constant in
-// amortised time. That holds for registrations of the lowest priority yet
-// registered (the library's are all 0): one of a higher priority goes below
-// them in the array and moves them up, a cost that grows with the list.
+// unregistering must not walk such a list. A list past kIndexedFrom entries
+// finds an observer through an index of its live bare observers by observer;
+// shorter lists are walked, which costs less than hashing and keeps the many
+// subjects with one or two observers small. The index is built at the first
+// lookup of an observer (an unregistration) and kept up to date from then on:
+// loading a configuration registers every member of a group with each of the
+// group's thirty-odd subjects and unregisters none, and an index made
+// meanwhile would cost every member some 7 bytes in each of those lists.
+// Building it walks the list once, which the registrations that made the list
+// have paid for. A long list does not close the gap an unregistered entry
+// leaves at once: the entry stays as a tombstone, and the array is compacted
+// (and any index rebuilt) once tombstones make up half of it, so that every
+// operation stays constant in amortised time. That holds for registrations of
+// the lowest priority yet registered (the library's are all 0): one of a
+// higher priority goes below them in the array and moves them up, a cost that
+// grows with the list.
 //
 // Memory: the library registers bare observers (addObserver(O*, priority)),
 // and the delegate it would make for each of them is reachable by nobody
@@ -56,6 +62,7 @@
 #include <cstring>
 #include <memory>
 #include <new>
+#include <optional>
 
 #include "ObserverDelegate.h"
 #include "ObserverIndex.h"
@@ -90,11 +97,11 @@ class ObserverContainer {
     if (!delegate)
       return;
     if (Entry* const registered = entryHolding(delegate)) {
-      ++registered->count;
+      ++registered->registered()->count;
       return;
     }
     delegate->addRef();
-    link(Entry::ofDelegate(delegate), priority, flag);
+    link(Entry::ofDelegate(delegate, flag), priority);
   }
 
   // The registration every subject of the library offers: observer, notified
@@ -113,7 +120,7 @@ class ObserverContainer {
       m_word = Entry::ofObserver(observer) | kSingle;
       return;
     }
-    link(Entry::ofObserver(observer), priority, true);
+    link(Entry::ofObserver(observer), priority);
   }
 
   // Undoes one registration of observer, the first in notification order;
@@ -126,7 +133,7 @@ class ObserverContainer {
       return;
     }
     Entry* const registration = firstRegistrationOf(observer);
-    if (registration && --registration->count <= 0)
+    if (registration && registration->undoOneRegistration())
       retire(registration);
     doHousekeeping();
   }
@@ -141,7 +148,7 @@ class ObserverContainer {
     OnStack local;
     if (O* const observer = single()) {
       local.header = Block{nullptr, nullptr, 1, 1 | kOnStack};
-      local.entry = Entry{Entry::ofObserver(observer), 0, 1, true};
+      local.entry = Entry{Entry::ofObserver(observer), 0};
       setBlock(&local.header);
     }
     Broadcast frame{block()->size, block()->broadcasts};
@@ -150,7 +157,7 @@ class ObserverContainer {
       --frame.cursor;
       // Handlers may move the array: read it afresh for every entry.
       Entry const entry = block()->at(frame.cursor);
-      if (entry.count <= 0 || !entry.target)
+      if (!entry.live())
         continue;
       std::unique_ptr<ObserverEvent<S>> const copy = event.clone();
       if (!copy)
@@ -168,7 +175,7 @@ class ObserverContainer {
     if (block() == &local.header) {
       // Nothing could be added without moving the array to the heap, so the
       // entry is still the single observer, alive or unregistered.
-      m_word = local.entry.count > 0 ? local.entry.target | kSingle : 0;
+      m_word = local.entry.live() ? local.entry.target | kSingle : 0;
       return;
     }
     doHousekeeping();
@@ -202,31 +209,48 @@ class ObserverContainer {
   }
 
  private:
+  // What a delegate's registration holds beyond its priority, kept out of
+  // the array: only callers register delegates, and rarely, while a bare
+  // observer's registration always counts 1 and was made with the flag set,
+  // so that its entry needs no room for either.
+  struct Registered {
+    Delegate* delegate;  // holds a counted reference
+    int count;  // registrations of this delegate; at least 1 while linked
+    bool flag;  // stored as registered; nothing in the library reads it
+  };
+
+  // Two words: on 32-bit targets, where a group's value holds one entry for
+  // every member, a third word for the count and flag cost each member four
+  // bytes in each of the group's lists.
   struct Entry {
-    // A registered delegate, holding a counted reference (low bit set), or a
-    // bare observer; 0 once unregistered.
+    // A bare observer, or its Registered record with the low bit set; 0
+    // once unregistered, which is what marks the entry dead.
     std::uintptr_t target;
     unsigned int priority;
-    int count : 31;  // registrations of this entry; 0 marks it dead
-    bool flag : 1;  // stored as registered; nothing in the library reads it
 
-    static std::uintptr_t ofDelegate(Delegate* delegate) {
-      return reinterpret_cast<std::uintptr_t>(delegate) | 1u;
+    static std::uintptr_t ofDelegate(Delegate* delegate, bool flag) {
+      return reinterpret_cast<std::uintptr_t>(new Registered{delegate, 1, flag}) | 1u;
     }
     static std::uintptr_t ofObserver(O* observer) { return reinterpret_cast<std::uintptr_t>(observer); }
 
+    bool live() const { return target != 0; }
     bool isDelegate() const { return (target & 1u) != 0; }
-    Delegate* delegate() const {
-      return isDelegate() ? reinterpret_cast<Delegate*>(target & ~std::uintptr_t{1}) : nullptr;
+    Registered* registered() const {
+      return isDelegate() ? reinterpret_cast<Registered*>(target & ~std::uintptr_t{1}) : nullptr;
     }
+    Delegate* delegate() const { return isDelegate() ? registered()->delegate : nullptr; }
     // A bare observer (null for a delegate entry).
     O* observer() const { return isDelegate() ? nullptr : reinterpret_cast<O*>(target); }
     // Whom the entry notifies now: a stopped delegate notifies nobody.
     O* notified() const { return isDelegate() ? delegate()->getObserver() : observer(); }
+    // Counts one registration down; true when it was the last.
+    bool undoOneRegistration() { return !isDelegate() || --registered()->count <= 0; }
     // Ends the entry's hold on its delegate.
     void drop() {
-      if (Delegate* const held = delegate())
-        held->release();
+      if (Registered* const held = registered()) {
+        held->delegate->release();
+        delete held;
+      }
       target = 0;
     }
   };
@@ -240,8 +264,9 @@ class ObserverContainer {
   // What only a long list keeps. A short one holds dead entries only until
   // the next housekeeping, so it needs no count of them.
   struct Long {
-    explicit Long(size_t expected) : index(expected) {}
-    ObserverIndex<O> index;  // live bare observers by observer
+    // Live bare observers by observer; absent until an observer is first
+    // looked up (see Cost).
+    std::optional<ObserverIndex<O>> index;
     size_t liveDelegates = 0;  // while any, observers are found by walking
     unsigned int tombstones = 0;  // dead entries still in the array
     unsigned int pending = 0;  // of those, retired since the last housekeeping
@@ -282,7 +307,7 @@ class ObserverContainer {
     if (!observer)
       return;
     Block* const spread = allocate(2);
-    spread->at(0) = Entry{Entry::ofObserver(observer), 0, 1, true};
+    spread->at(0) = Entry{Entry::ofObserver(observer), 0};
     spread->size = 1;
     setBlock(spread);
   }
@@ -309,9 +334,8 @@ class ObserverContainer {
   Entry* entryHolding(Delegate* delegate) {
     if (!m_word || single())
       return nullptr;
-    std::uintptr_t const target = Entry::ofDelegate(delegate);
     for (Entry& entry : *block()) {
-      if (entry.target == target)
+      if (entry.delegate() == delegate)
         return &entry;
     }
     return nullptr;
@@ -331,8 +355,10 @@ class ObserverContainer {
       }
       return nullptr;
     }
+    if (!extra->index)
+      reindex();
     Entry* first = nullptr;
-    extra->index.forEach(observer, keyOf(), [&](unsigned int position) {
+    extra->index->forEach(observer, keyOf(), [&](unsigned int position) {
       Entry& candidate = block()->at(position);
       if (notifies(candidate) && (!first || first < &candidate))
         first = &candidate;
@@ -355,7 +381,7 @@ class ObserverContainer {
     return low;
   }
 
-  void link(std::uintptr_t target, unsigned int priority, bool flag) {
+  void link(std::uintptr_t target, unsigned int priority) {
     spread();
     if (!block())
       setBlock(allocate(1));
@@ -364,7 +390,7 @@ class ObserverContainer {
     unsigned int const position = insertionPoint(priority);
     Entry* const at = &block()->at(position);
     std::memmove(static_cast<void*>(at + 1), at, (block()->size - position) * sizeof(Entry));
-    *at = Entry{target, priority, 1, flag};
+    *at = Entry{target, priority};
     ++block()->size;
     for (Broadcast* running = block()->broadcasts; running; running = running->outer) {
       if (position <= running->cursor)
@@ -378,51 +404,56 @@ class ObserverContainer {
     }
     if (at->isDelegate())
       ++extra->liveDelegates;
+    if (!extra->index)
+      return;
     if (position + 1 != block()->size)
-      extra->index.shiftFrom(position);
+      extra->index->shiftFrom(position);
     if (at->observer())
-      extra->index.add(at->observer(), position, keyOf());
+      extra->index->add(at->observer(), position, keyOf());
   }
 
-  // Doubles the array; the header, running broadcasts' chain included, moves
-  // with it.
+  // Makes the array half as large again; the header, running broadcasts'
+  // chain included, moves with it. Half, not double: a group's value holds
+  // an entry for every member, so the room a growth leaves empty is paid by
+  // every member, up to a whole entry each after doubling and half of one
+  // now, for a copy more of each entry over the list's growth.
   void grow() {
     bool const onStack = (block()->capacity & kOnStack) != 0;
-    Block* const larger = allocate((block()->capacity & ~kOnStack) * 2);
-    unsigned int const capacity = larger->capacity;
+    unsigned int const capacity = block()->capacity & ~kOnStack;
+    Block* const larger = allocate(capacity + (capacity + 1) / 2);
+    unsigned int const largerCapacity = larger->capacity;
     std::memcpy(static_cast<void*>(larger), block(), sizeof(Block) + block()->size * sizeof(Entry));
-    larger->capacity = capacity;
+    larger->capacity = largerCapacity;
     if (!onStack)
       ::operator delete(block());
     setBlock(larger);
   }
 
   void becomeLong() {
-    block()->extra = new Long(block()->size);
+    block()->extra = new Long;
     for (Entry const& entry : *block()) {
-      if (entry.count <= 0)
+      if (!entry.live())
         ++block()->extra->tombstones;
       else if (entry.isDelegate())
         ++block()->extra->liveDelegates;
     }
     block()->extra->pending = block()->extra->tombstones;
-    reindex();
   }
 
   // Files every live bare observer of a long list anew.
   void reindex() {
     Long* const extra = block()->extra;
-    extra->index = ObserverIndex<O>(block()->size - extra->tombstones);
+    extra->index.emplace(block()->size - extra->tombstones);
     for (unsigned int position = 0; position < block()->size; ++position) {
       Entry const& entry = block()->at(position);
-      if (entry.count > 0 && entry.observer())
-        extra->index.add(entry.observer(), position, keyOf());
+      if (entry.live() && entry.observer())
+        extra->index->add(entry.observer(), position, keyOf());
     }
   }
 
   bool holdsDeadEntries() {
     for (Entry const& entry : *block()) {
-      if (entry.count <= 0)
+      if (!entry.live())
         return true;
     }
     return false;
@@ -432,12 +463,11 @@ class ObserverContainer {
   // array as a tombstone until housekeeping: at once outside broadcasts for
   // a short list, when tombstones fill half of a long one.
   void retire(Entry* entry) {
-    entry->count = 0;
     if (Long* const extra = block()->extra) {
       if (entry->isDelegate())
         --extra->liveDelegates;
-      else if (entry->observer())
-        extra->index.remove(entry->observer(), positionOf(entry), keyOf());
+      else if (entry->observer() && extra->index)
+        extra->index->remove(entry->observer(), positionOf(entry), keyOf());
       ++extra->tombstones;
       ++extra->pending;
     }
@@ -448,7 +478,7 @@ class ObserverContainer {
   void compact() {
     Entry* kept = block()->begin();
     for (Entry const& entry : *block()) {
-      if (entry.count > 0)
+      if (entry.live())
         *kept++ = entry;
     }
     block()->size = static_cast<unsigned int>(kept - block()->begin());
@@ -462,7 +492,8 @@ class ObserverContainer {
       return;
     extra->tombstones = 0;
     if (block()->size > kIndexedFrom) {
-      reindex();
+      if (extra->index)
+        reindex();
       return;
     }
     delete extra;

@@ -8,15 +8,27 @@
 
 namespace {
 
+// The masters' driver names, built once: a driver name is a pure function of
+// the arguments it is built from, and building it took most of the time of
+// finding a master.
+String const& locationMasterName() {
+  static String const name(LS_masterDriverName("master-location-service"));
+  return name;
+}
+String const& authenticationMasterName() {
+  static String const name(LS_masterDriverName("master-authentication-service"));
+  return name;
+}
+
 template <class Master>
-XCode findMaster(String& error, RefPtr<Master>& out, char const* baseName, char const* missing) {
+XCode findMaster(String& error, RefPtr<Master>& out, String const& driverName, char const* missing) {
   out = nullptr;
   RefPtr<IDriverRepository> repository = SYSTEM::DRIVER_REPOSITORY();
   if (!repository) {
     error = "DRIVER REPOSITORY DOES NOT EXIST";
     return XCode::failure();
   }
-  XCode const result = getDriverInterface(repository, LS_masterDriverName(baseName), out);
+  XCode const result = getDriverInterface(repository, driverName, out);
   if (result.isFailure())
     error = missing;
   return result;
@@ -89,11 +101,11 @@ RefPtr<LS_ILocationService> firstDefaultDomain(LS_IMasterLocationService* master
 }  // namespace
 
 XCode LS_getMasterLocationService(String& error, RefPtr<LS_IMasterLocationService>& out) {
-  return findMaster(error, out, "master-location-service", "MASTER LOCATION-SERVICE DOES NOT EXIST");
+  return findMaster(error, out, locationMasterName(), "MASTER LOCATION-SERVICE DOES NOT EXIST");
 }
 
 XCode LS_getMasterAuthenticationService(String& error, RefPtr<LS_IMasterAuthenticationService>& out) {
-  return findMaster(error, out, "master-authentication-service", "MASTER AUTHENTICATION-SERVICE DOES NOT EXIST");
+  return findMaster(error, out, authenticationMasterName(), "MASTER AUTHENTICATION-SERVICE DOES NOT EXIST");
 }
 
 XCode LS_getLocationService(String& error,

@@ -10,6 +10,13 @@
 // no state and take no lock of their own; every call on an object goes
 // through that object's LockedPtr for that one call. They allocate nothing
 // that outlives the call except the references handed back.
+//
+// Decision: without a master, every call asks the repository; nothing found
+// there is kept, so the repository stays the authority when drivers are
+// registered, replaced or removed between calls. What made asking it cost
+// was building the driver name on every call; the two names are pure
+// functions of constant arguments and are built once instead, which leaves
+// the repository's own lookup by name as the price of passing no master.
 #pragma once
 
 #include "Export.h"

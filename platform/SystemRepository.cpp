@@ -1,5 +1,6 @@
 #include "SystemRepository.h"
 
+#include <atomic>
 #include <mutex>
 #include <utility>
 
@@ -7,9 +8,14 @@
 
 namespace {
 
+// The installed repository's reference is owned by `owner`, changed under
+// the mutex; `current` mirrors it for readers, who only load it: every
+// lookup that the SIP stack makes without a master reads it, and a mutex
+// there cost as much as the rest of finding the master.
 struct Installed {
   std::mutex mutex;
-  RefPtr<IDriverRepository> repository;
+  RefPtr<IDriverRepository> owner;
+  std::atomic<IDriverRepository*> current{nullptr};
 };
 
 Installed& installed() {
@@ -24,9 +30,7 @@ Installed& installed() {
 namespace SYSTEM {
 
 IDriverRepository* DRIVER_REPOSITORY() {
-  Installed& state = installed();
-  std::lock_guard<std::mutex> guard(state.mutex);
-  return state.repository.get();
+  return installed().current.load(std::memory_order_acquire);
 }
 
 void SET_DRIVER_REPOSITORY(IDriverRepository* repository) {
@@ -34,7 +38,8 @@ void SET_DRIVER_REPOSITORY(IDriverRepository* repository) {
   Installed& state = installed();
   {
     std::lock_guard<std::mutex> guard(state.mutex);
-    std::swap(replaced, state.repository);
+    std::swap(replaced, state.owner);
+    state.current.store(repository, std::memory_order_release);
   }
   // The previous repository is released here, outside the mutex, since its
   // destruction releases drivers that may look drivers up.

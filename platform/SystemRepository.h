@@ -6,6 +6,8 @@
 // replaced or removed. DRIVER_REPOSITORY() returns a borrowed pointer:
 // callers that keep it take a reference of their own, and the host installs
 // the repository before, and removes it after, anything can look drivers up.
+// Reading it takes no lock, since every lookup that is given no master reads
+// it; installing is serialised.
 #pragma once
 
 #include "Export.h"

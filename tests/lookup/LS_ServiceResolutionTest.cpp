@@ -2,9 +2,11 @@
 
 #include <gtest/gtest.h>
 
+#include <functional>
 #include <string>
 
 #include "CDriverRepository.h"
+#include "LS_IdentityResolution.h"
 #include "LookupFixture.h"
 #include "SystemRepository.h"
 
@@ -93,20 +95,11 @@ TEST_F(ServiceResolutionTest, WithoutNamesEveryServiceIsTriedInCreationOrderThro
   EXPECT_EQ(error, "untouched");
 }
 
-TEST_F(ServiceResolutionTest, MissingRepositoryMastersAndNamesSayWhatIsMissing) {
+TEST_F(ServiceResolutionTest, MissingNamesSayWhatIsMissing) {
   RefPtr<LS_ILocationService> location;
   RefPtr<LS_IAuthenticationService> authentication;
-  EXPECT_TRUE(LS_getLocationService(error, location, "exact", nullptr).isFailure());
-  EXPECT_EQ(error, "DRIVER REPOSITORY DOES NOT EXIST");
   EXPECT_TRUE(LS_getLocationService(error, location, "exact", locationMaster.get()).isSuccess())
       << "a given master needs no repository";
-
-  RefPtr<CDriverRepository> const empty = adoptRef(new CDriverRepository);
-  SYSTEM::SET_DRIVER_REPOSITORY(empty.get());
-  EXPECT_TRUE(LS_getLocationService(error, location, "exact", nullptr).isFailure());
-  EXPECT_EQ(error, "MASTER LOCATION-SERVICE DOES NOT EXIST");
-  EXPECT_TRUE(LS_getAuthenticationService(error, authentication, "a", nullptr).isFailure());
-  EXPECT_EQ(error, "MASTER AUTHENTICATION-SERVICE DOES NOT EXIST");
 
   SYSTEM::SET_DRIVER_REPOSITORY(repository.get());
   EXPECT_TRUE(LS_getLocationService(error, location, "Exact", nullptr).isFailure());
@@ -122,6 +115,116 @@ TEST_F(ServiceResolutionTest, MissingRepositoryMastersAndNamesSayWhatIsMissing) 
   EXPECT_TRUE(LS_getAuthenticationService(error, authentication, "a", nullptr).isSuccess());
   EXPECT_TRUE(LS_getLocationService(error, location, "exact", nullptr).isSuccess());
   EXPECT_EQ(error, "untouched");
+}
+
+// A gateway's two masters with what each question asks for: location
+// service "ls" for example.com holding identity "alice", and
+// authentication service "auth".
+struct Gateway {
+  Gateway() {
+    RefPtr<LS_ILocationServiceConfig> config;
+    adoptInterface(config, [&](UUID const& iid, void** raw) {
+      return location->createLocationServiceIf("ls", iid, raw);
+    });
+    config->insertConfigDomain(0, hostPort("example.com"));
+    adoptInterface(alice, [&](UUID const& iid, void** raw) {
+      return config->createConfigIdentityIf("alice", "", LS_IdentityType::IDENTITY, iid, raw);
+    });
+    adoptInterface(auth, [&](UUID const& iid, void** raw) {
+      return authentication->createAuthenticationServiceIf("auth", iid, raw);
+    });
+    LS_getLocationServiceIf(location.get(), "ls", service);
+  }
+  void registerIn(CDriverRepository& repository) {
+    repository.registerDriver(location.get());
+    repository.registerDriver(authentication.get());
+  }
+  void unregisterFrom(CDriverRepository& repository) {
+    repository.unregisterDriver(location->getDriverName());
+    repository.unregisterDriver(authentication->getDriverName());
+  }
+
+  RefPtr<LS_CMasterLocationService> location = adoptRef(new LS_CMasterLocationService);
+  RefPtr<LS_CMasterAuthenticationService> authentication = adoptRef(new LS_CMasterAuthenticationService);
+  RefPtr<LS_ILocationService> service;
+  RefPtr<LS_IIdentity> alice;
+  RefPtr<LS_IAuthenticationService> auth;
+};
+
+// Masters registered, replaced and removed between questions: every
+// question asked without a master finds the masters registered at that
+// moment, whatever it found before.
+class RepositoryChanges : public ::testing::Test {
+ protected:
+  void TearDown() override { SYSTEM::SET_DRIVER_REPOSITORY(nullptr); }
+
+  // Which gateway answers the location service by name, by host, the
+  // identity and the authentication service, or the error text.
+  std::string answers() {
+    std::string text;
+    String error;
+    auto const note = [&](XCode result, void const* found, void const* fromFirst, void const* fromSecond) {
+      text += result.isFailure() ? error.str() : found == fromFirst ? "first" : found == fromSecond ? "second" : "?";
+      text += "; ";
+    };
+    RefPtr<LS_ILocationService> service;
+    XCode result = LS_getLocationService(error, service, "ls", nullptr);
+    note(result, service.get(), first.service.get(), second.service.get());
+    result = LS_getLocationService(error, service, hostPort("example.com"), Vector<CHostPort>(),
+                                   LS_Imperative::AUTHORITATIVE, nullptr);
+    note(result, service.get(), first.service.get(), second.service.get());
+    RefPtr<LS_IIdentity> identity;
+    result = LS_getIdentity(error, identity, nameAddr("sip:alice@example.com"), false, Vector<CHostPort>(),
+                            LS_Imperative::AUTHORITATIVE, nullptr);
+    note(result, identity.get(), first.alice.get(), second.alice.get());
+    RefPtr<LS_IAuthenticationService> auth;
+    result = LS_getAuthenticationService(error, auth, "auth", nullptr);
+    note(result, auth.get(), first.auth.get(), second.auth.get());
+    return text;
+  }
+
+  Gateway first;
+  Gateway second;
+  RefPtr<CDriverRepository> const repository = adoptRef(new CDriverRepository);
+  RefPtr<CDriverRepository> const other = adoptRef(new CDriverRepository);
+};
+
+TEST_F(RepositoryChanges, EveryQuestionFindsTheMastersRegisteredAtTheTime) {
+  auto const everyQuestion = [](std::string const& answer) { return answer + answer + answer + answer; };
+  struct Step {
+    char const* what;
+    std::function<void()> change;
+    std::string expected;
+  };
+  Step const steps[] = {
+      {"first registered",
+       [&] {
+         first.registerIn(*repository);
+         SYSTEM::SET_DRIVER_REPOSITORY(repository.get());
+       },
+       everyQuestion("first; ")},
+      {"replaced by the second",
+       [&] {
+         first.unregisterFrom(*repository);
+         second.registerIn(*repository);
+       },
+       everyQuestion("second; ")},
+      {"removed", [&] { second.unregisterFrom(*repository); },
+       "MASTER LOCATION-SERVICE DOES NOT EXIST; MASTER LOCATION-SERVICE DOES NOT EXIST; "
+       "MASTER LOCATION-SERVICE DOES NOT EXIST; MASTER AUTHENTICATION-SERVICE DOES NOT EXIST; "},
+      {"first in another repository",
+       [&] {
+         first.registerIn(*other);
+         SYSTEM::SET_DRIVER_REPOSITORY(other.get());
+       },
+       everyQuestion("first; ")},
+      {"no repository", [&] { SYSTEM::SET_DRIVER_REPOSITORY(nullptr); },
+       everyQuestion("DRIVER REPOSITORY DOES NOT EXIST; ")},
+  };
+  for (Step const& step : steps) {
+    step.change();
+    EXPECT_EQ(answers(), step.expected) << step.what;
+  }
 }
 
 }  // namespace
