@@ -172,6 +172,15 @@ class LS_CIdentity : public CInherit<LS_CIdentity,
   // it of every change of its name, its type or its aliases in effect.
   void setAliasIndex(LS_CAliasIndex* index) { m_aliasIndex = index; }
 
+  // This identity's place among the identities linked back to one service,
+  // which that service threads through them (LS_CLocationService): kept in
+  // the identity, so that a link back costs no allocation of its own.
+  struct ServiceLinks {
+    LS_CIdentity* previous = nullptr;
+    LS_CIdentity* next = nullptr;
+  };
+  ServiceLinks& serviceLinks() { return m_serviceLinks; }
+
  private:
   // The identity's own alias record, or null.
   LS_Alias const* ownAlias() const;
@@ -196,4 +205,5 @@ class LS_CIdentity : public CInherit<LS_CIdentity,
   ObserverContainer<LS_IRegistrationInbound, LS_IRegistrationInboundObserver> m_registrationInboundObservers;
   ObserverContainer<LS_IMwiSubscription, LS_IMwiSubscriptionObserver> m_mwiSubscriptionObservers;
   LS_CAliasIndex* m_aliasIndex = nullptr;  // borrowed; see setAliasIndex
+  ServiceLinks m_serviceLinks;             // set while m_locationService links back
 };

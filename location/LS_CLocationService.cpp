@@ -93,20 +93,32 @@ LS_CLocationService::~LS_CLocationService() {
 bool LS_CLocationService::acceptLink(LS_CIdentity* identity) {
   if (m_detached)
     return false;
-  m_linked.insert(identity);
+  LS_CIdentity::ServiceLinks& links = identity->serviceLinks();
+  links.previous = nullptr;
+  links.next = m_firstLinked;
+  if (m_firstLinked)
+    m_firstLinked->serviceLinks().previous = identity;
+  m_firstLinked = identity;
   return true;
 }
 
 void LS_CLocationService::dropLink(LS_CIdentity* identity) {
-  m_linked.erase(identity);
+  LS_CIdentity::ServiceLinks& links = identity->serviceLinks();
+  if (links.previous)
+    links.previous->serviceLinks().next = links.next;
+  else
+    m_firstLinked = links.next;
+  if (links.next)
+    links.next->serviceLinks().previous = links.previous;
+  links = LS_CIdentity::ServiceLinks();
 }
 
 // The caller holds the service, so no cut link is its last reference; each
-// cut takes the identity out of m_linked.
+// cut takes the identity off the list.
 void LS_CLocationService::detachIdentities() {
   m_detached = true;
-  while (!m_linked.empty())
-    LockedPtr<LS_IIdentityConfig>(*m_linked.begin())->setConfigLocationService(nullptr);
+  while (m_firstLinked)
+    LockedPtr<LS_IIdentityConfig>(m_firstLinked)->setConfigLocationService(nullptr);
 }
 
 // Name, imperative, default domain.

@@ -19,8 +19,9 @@
 // identity it holds by then). A removed identity may since have become the
 // base of one the service still holds, and one made later is held by the
 // service: either link back would close a cycle that nothing cuts any more.
-// So the service knows every identity linked to it, as a borrowed pointer
-// that the identity takes back before it lets the link go.
+// So the service knows every identity linked to it, on a list threaded
+// through the identities themselves (borrowed pointers), from which an
+// identity takes itself before it lets the link go.
 //
 // Re-entrancy: observers of the service or of its identities may remove
 // identities, or drop the service, while they are told: every walk over an
@@ -39,8 +40,6 @@
 // serialise every operation and the lookups that read the service.
 // Finding the service responsible for a host belongs to the lookups.
 #pragma once
-
-#include <unordered_set>
 
 #include "CHostPort.h"
 #include "CInherit.h"
@@ -178,6 +177,6 @@ class LS_CLocationService : public CInherit<LS_CLocationService,
   // lets them go while they are still held.
   LS_CAliasIndex m_aliasIndex;
   ObserverContainer<LS_ILocationService, LS_ILocationServiceObserver> m_observers;
-  std::unordered_set<LS_CIdentity*> m_linked;  // borrowed; see Ownership
-  bool m_detached = false;                     // the master has let the service go
+  LS_CIdentity* m_firstLinked = nullptr;  // borrowed; see Ownership
+  bool m_detached = false;                // the master has let the service go
 };
