@@ -2,7 +2,8 @@
 // stack, the request, the session whose library answers, the log and the
 // clock) and what the log line says about the lookup, and sends the final
 // answer through a server transaction of the stack, which absorbs
-// retransmissions of the request and retransmits the answer itself. Each
+// retransmissions of the request and retransmits the answer itself, except
+// for an INVITE, which is answered without one (see answer()). Each
 // exchange answers exactly once; the log line leaves with the answer.
 #pragma once
 

@@ -64,6 +64,7 @@ Registrar::~Registrar() {
     removeAll(entry.second);
     reportTransition(entry.second, before);
   }
+  tmr_cancel(&m_sweep);
 }
 
 void Registrar::handle(Exchange& exchange) {
@@ -269,18 +270,18 @@ void Registrar::add(Bindings& bindings, ContactRequest const& request, std::stri
   std::unique_ptr<Binding>& slot = bindings.byContact[request.key];
   if (!slot) {
     slot = std::make_unique<Binding>();
-    slot->registrar = this;
     slot->owner = &bindings;
     slot->contact = request.contact;
-    tmr_init(&slot->timer);
+  } else {
+    unschedule(*slot);
   }
   slot->callId = callId;
   slot->expiresAtMs = tmr_jiffies() + uint64_t{request.expires} * 1000;
-  tmr_start(&slot->timer, uint64_t{request.expires} * 1000, onExpiry, slot.get());
+  schedule(*slot);
 }
 
 void Registrar::remove(Binding& binding) {
-  tmr_cancel(&binding.timer);
+  unschedule(binding);
   Bindings& bindings = *binding.owner;
   m_clock.measure([&] { bindings.face->removeContact(binding.contact, binding.callId.c_str()); });
   for (auto entry = bindings.byContact.begin(); entry != bindings.byContact.end(); ++entry)
@@ -292,7 +293,7 @@ void Registrar::remove(Binding& binding) {
 
 void Registrar::removeAll(Bindings& bindings) {
   for (auto& entry : bindings.byContact)
-    tmr_cancel(&entry.second->timer);
+    unschedule(*entry.second);
   bindings.byContact.clear();
   m_clock.measure([&] { bindings.face->removeContacts(); });
 }
@@ -315,12 +316,36 @@ std::string Registrar::bindingHeaders(Bindings const& bindings) {
   return headers;
 }
 
-void Registrar::onExpiry(void* argument) {
-  Binding& binding = *static_cast<Binding*>(argument);
-  Registrar& registrar = *binding.registrar;
-  Bindings& bindings = *binding.owner;
-  LS_IIdentity* const identity = bindings.identity.get();
-  registrar.remove(binding);
-  registrar.reportTransition(bindings, 1);
-  registrar.forgetIfUnbound(identity, false);
+void Registrar::schedule(Binding& binding) {
+  binding.expiry = m_expiries.emplace(binding.expiresAtMs, &binding);
+  if (binding.expiry == m_expiries.begin())
+    rearm();
+}
+
+// The stack timer stays set for an earlier binding that went: the sweep it
+// then makes finds nothing due and sets it again.
+void Registrar::unschedule(Binding& binding) {
+  m_expiries.erase(binding.expiry);
+}
+
+void Registrar::rearm() {
+  if (m_expiries.empty())
+    return tmr_cancel(&m_sweep);
+  uint64_t const now = tmr_jiffies();
+  uint64_t const first = m_expiries.begin()->first;
+  tmr_start(&m_sweep, first > now ? first - now : 0, onSweep, this);
+}
+
+void Registrar::onSweep(void* argument) {
+  Registrar& registrar = *static_cast<Registrar*>(argument);
+  uint64_t const now = tmr_jiffies();
+  while (!registrar.m_expiries.empty() && registrar.m_expiries.begin()->first <= now) {
+    Binding& binding = *registrar.m_expiries.begin()->second;
+    Bindings& bindings = *binding.owner;
+    LS_IIdentity* const identity = bindings.identity.get();
+    registrar.remove(binding);
+    registrar.reportTransition(bindings, 1);
+    registrar.forgetIfUnbound(identity, false);
+  }
+  registrar.rearm();
 }

@@ -2,7 +2,7 @@
 // identity; the library gives the realms to challenge with and the passwords
 // to check a digest response against; accepted contacts are recorded on the
 // identity's own inbound-registration face (a dynamic one is created when it
-// has none), each with a timer that removes it when its time runs out.
+// has none), each removed when its time runs out.
 //
 // Decisions, with their reasons:
 // - Expiry: the contact's "expires" parameter, else the Expires header,
@@ -52,7 +52,7 @@ class Registrar {
   static constexpr size_t kMaximumBindings = 32;
   static constexpr size_t kMaximumContacts = 16;
 
-  explicit Registrar(LibraryClock& clock) : m_clock(clock) {}
+  explicit Registrar(LibraryClock& clock) : m_clock(clock) { tmr_init(&m_sweep); }
   ~Registrar();
   Registrar(Registrar const&) = delete;
   Registrar& operator=(Registrar const&) = delete;
@@ -61,13 +61,19 @@ class Registrar {
 
  private:
   struct Bindings;
+  struct Binding;
+  // Every binding by the time it runs out, earliest first. One stack timer
+  // serves them all, set for the earliest: the stack keeps its timers on
+  // one sorted list that each new timer walks, so a timer per binding would
+  // make every transaction's own timers cost as many steps as there are
+  // bindings.
+  using Expiries = std::multimap<uint64_t, Binding*>;
   struct Binding {
-    Registrar* registrar;
     Bindings* owner;
     CNameAddr contact;
     std::string callId;
     uint64_t expiresAtMs;
-    tmr timer;
+    Expiries::iterator expiry;  // its entry in m_expiries
   };
   // One identity's bindings, by contact text.
   struct Bindings {
@@ -104,9 +110,18 @@ class Registrar {
   // Tells the identity when its first binding came or its last went.
   void reportTransition(Bindings& bindings, size_t before);
   static std::string bindingHeaders(Bindings const& bindings);
-  static void onExpiry(void* binding);
+  // (Re)files the binding under its time; sets the stack timer when it is
+  // now the earliest.
+  void schedule(Binding& binding);
+  void unschedule(Binding& binding);
+  // Sets the stack timer for the earliest expiry, or stops it.
+  void rearm();
+  // Removes every binding whose time has run out.
+  static void onSweep(void* registrar);
 
   LibraryClock& m_clock;
   NonceGenerator m_nonces;
   std::map<LS_IIdentity*, Bindings> m_bindings;
+  Expiries m_expiries;
+  tmr m_sweep;
 };

@@ -78,8 +78,8 @@ void SipFrontEnd::shutDown() {
 bool SipFrontEnd::onRequest(sip_msg const* request, void* argument) {
   SipFrontEnd& frontEnd = *static_cast<SipFrontEnd*>(argument);
   sip_msg const& message = *request;
-  // An ACK gets no answer; one for a 302 never reaches here, its
-  // transaction takes it.
+  // An ACK gets no answer, the one for a 302 included (INVITEs are answered
+  // without a transaction, see Exchange::answer).
   if (pl_strcmp(&message.met, "ACK") == 0)
     return true;
   Exchange exchange(*frontEnd.m_stack, message, frontEnd.m_session, frontEnd.m_log, frontEnd.m_clock);
