@@ -70,3 +70,28 @@ TEST(ScriptLineTest, TakesALineOfTheMaximumLength) {
 }
 
 }  // namespace
+
+class ScriptWordTest : public ::testing::TestWithParam<std::string> {};
+
+// What the writer makes of a text, read back in the middle of a line, is
+// the text again, as one word.
+TEST_P(ScriptWordTest, ReadsBackAsTheSameText) {
+  ScriptLine const line("set " + scriptWord(GetParam()) + " x");
+  ASSERT_EQ(line.words().size(), 3u);
+  EXPECT_EQ(line.words()[1].text, GetParam());
+}
+
+INSTANTIATE_TEST_SUITE_P(Texts,
+                         ScriptWordTest,
+                         ::testing::Values("plain",
+                                           "",
+                                           "two words",
+                                           "\"quoted\"",
+                                           "ends in \\",
+                                           "\\\"",
+                                           "#7",
+                                           "a#b",
+                                           "tab\there",
+                                           "cr\rhere",
+                                           std::string("nul\0here", 8),
+                                           "J\xc3\xbcrgen"));

@@ -10,10 +10,12 @@
 #include <fstream>
 #include <iostream>
 #include <sstream>
+#include <stdexcept>
 #include <vector>
 
 #include "CommandTable.h"
 #include "DefaultSession.h"
+#include "ModelSaver.h"
 #include "ScriptLanguage.h"
 #include "ScriptRunner.h"
 #include "ScriptSession.h"
@@ -21,7 +23,8 @@
 namespace {
 
 char const kUsage[] =
-    "usage: location-console [--debug] [--keep-going] [--print-default] [--help] [script ...]\n"
+    "usage: location-console [--debug] [--keep-going] [--save file] [--print-default] [--help]\n"
+    "                        [script ...]\n"
     "\n"
     "Runs each script in turn against one model; \"-\" reads standard input\n"
     "(with a prompt when it is a terminal). Without a script it runs the\n"
@@ -30,6 +33,9 @@ char const kUsage[] =
     "\n"
     "  --debug          show the library's debug lines for each command\n"
     "  --keep-going     go on after a line that cannot be applied\n"
+    "  --save file      after the scripts, write the configuration to file as\n"
+    "                   the script that rebuilds it (not when a failed line\n"
+    "                   stopped the run)\n"
     "  --print-default  print the default session's script and exit\n"
     "  --help           print this and the command reference, and exit\n"
     "\n"
@@ -41,6 +47,7 @@ char const kUsage[] =
 int main(int argc, char** argv) {
   bool debug = false;
   bool keepGoing = false;
+  std::string saveTo;
   std::vector<std::string> scripts;
   CommandTable table;
   addScriptCommands(table);
@@ -50,6 +57,12 @@ int main(int argc, char** argv) {
       debug = true;
     } else if (argument == "--keep-going") {
       keepGoing = true;
+    } else if (argument == "--save") {
+      if (i + 1 == argc) {
+        std::cerr << "location-console: --save needs a file\n" << kUsage;
+        return 2;
+      }
+      saveTo = argv[++i];
     } else if (argument == "--print-default") {
       std::cout << defaultSession();
       return 0;
@@ -68,23 +81,45 @@ int main(int argc, char** argv) {
   session.showDebugLines(debug);
   ScriptRunner runner(session, table, std::cout, std::cerr);
   runner.keepGoing(keepGoing);
+  bool stopped = false;
   if (scripts.empty()) {
     std::istringstream script(defaultSession());
-    runner.run(script, "<default>", false);
+    stopped = !runner.run(script, "<default>", false);
   }
   for (std::string const& name : scripts) {
     if (name == "-") {
-      if (!runner.run(std::cin, "<stdin>", isatty(STDIN_FILENO) != 0))
-        break;
-      continue;
+      stopped = !runner.run(std::cin, "<stdin>", isatty(STDIN_FILENO) != 0);
+    } else {
+      std::ifstream file(name);
+      if (!file) {
+        std::cerr << "location-console: cannot read " << name << ": " << std::strerror(errno) << "\n";
+        return 2;
+      }
+      stopped = !runner.run(file, name, false);
     }
-    std::ifstream file(name);
-    if (!file) {
-      std::cerr << "location-console: cannot read " << name << ": " << std::strerror(errno) << "\n";
-      return 2;
-    }
-    if (!runner.run(file, name, false))
+    if (stopped)
       break;
   }
-  return runner.anyLineFailed() ? 1 : 0;
+  int const status = runner.anyLineFailed() ? 1 : 0;
+  if (saveTo.empty())
+    return status;
+  // A run cut short holds part of what the scripts describe; saving it
+  // under the name asked for would pass it off as the whole.
+  if (stopped) {
+    std::cerr << "location-console: not saved to " << saveTo << ": the run stopped at a failed line\n";
+    return status;
+  }
+  std::string script;
+  try {
+    script = ModelSaver(session).script();
+  } catch (std::runtime_error const& error) {
+    std::cerr << "location-console: not saved to " << saveTo << ": " << error.what() << "\n";
+    return 2;
+  }
+  std::ofstream file(saveTo, std::ios::binary);
+  if (!(file << script).flush()) {
+    std::cerr << "location-console: cannot write " << saveTo << ": " << std::strerror(errno) << "\n";
+    return 2;
+  }
+  return status;
 }

@@ -1,5 +1,7 @@
 #include "Redirector.h"
 
+#include <vector>
+
 #include "CBlob.h"
 #include "Exchange.h"
 #include "LS_IRegistrationInbound.h"
@@ -9,7 +11,7 @@ void Redirector::handle(Exchange& exchange) {
   RefPtr<LS_IIdentity> const identity = exchange.resolveOrAnswer(exchange.request().ruri, target);
   if (!identity)
     return;
-  std::string contacts;
+  std::vector<CNameAddr> found;
   exchange.clock().measure([&] {
     RefPtr<LS_IRegistrationInbound> face;
     LS_getFaceIf(identity.get(), LS_IdentityFace::REGISTRATION_INBOUND, face);
@@ -20,13 +22,16 @@ void Redirector::handle(Exchange& exchange) {
       CHostPort received;
       unsigned int priority = 0;
       unsigned int expires = 0;
-      if (face->getContact(i, callId, contact, received, context, provider, priority, expires).isFailure())
-        continue;
-      CBlob text;
-      contact.Serialize(text);
-      contacts += "Contact: " + std::string(reinterpret_cast<char const*>(text.GetData()), text.GetSize()) + "\r\n";
+      if (face->getContact(i, callId, contact, received, context, provider, priority, expires).isSuccess())
+        found.push_back(contact);
     }
   });
+  std::string contacts;
+  for (CNameAddr const& contact : found) {
+    CBlob text;
+    contact.Serialize(text);
+    contacts += "Contact: " + std::string(reinterpret_cast<char const*>(text.GetData()), text.GetSize()) + "\r\n";
+  }
   if (contacts.empty())
     return exchange.answer(480, "Temporarily Unavailable");
   exchange.answer(302, "Moved Temporarily", contacts);

@@ -13,6 +13,8 @@ namespace {
 // passed to the library: more is an attack, not a phone.
 constexpr unsigned int kMaximumAuthorizations = 8;
 constexpr size_t kMaximumUserName = 256;
+// The Call-ID is kept with every binding; a longer one is refused.
+constexpr size_t kMaximumCallId = 256;
 
 std::string text(pl const& value) {
   return std::string(value.p, value.l);
@@ -81,6 +83,8 @@ void Registrar::handle(Exchange& exchange) {
   unsigned int defaultLifetime = 0;
   m_clock.measure([&] { face->getLifetimeRange(minimum, maximum, defaultLifetime); });
 
+  if (message.callid.l > kMaximumCallId)
+    return exchange.answer(400, "Call-ID Too Long");
   uint32_t headerExpires = defaultLifetime;
   bool const hasExpires = pl_isset(&message.expires);
   if (hasExpires && !parseSeconds(message.expires, headerExpires))

@@ -1,5 +1,7 @@
 #include "TrunkRegistrations.h"
 
+#include <algorithm>
+#include <cctype>
 #include <cstring>
 #include <iostream>
 
@@ -127,10 +129,15 @@ void TrunkRegistrations::onResponse(int error, sip_msg const* response, void* ar
     CHostPort registrar;
     registrar.Parse(address, std::char_traits<char>::length(address));
     clock.measure([&] { trunk.face->setRegistrarAddr(registrar); });
-    owner.report("trunk " + trunk.path + " registered at " + sip_transp_name(response->tp) + ":" + address + " for " +
-           std::to_string(trunk.lifetime) + " s");
+    trunk.registered = true;
+    std::string transport = sip_transp_name(response->tp);
+    std::transform(transport.begin(), transport.end(), transport.begin(),
+                   [](char c) { return static_cast<char>(std::tolower(static_cast<unsigned char>(c))); });
+    owner.report("trunk " + trunk.path + " registered at " + transport + ":" + address + " for " +
+                 std::to_string(trunk.lifetime) + " s");
     return;
   }
+  trunk.registered = false;
   unsigned int seconds;
   std::string cause;
   if (error != 0 || !response) {
@@ -163,8 +170,9 @@ void TrunkRegistrations::onRetry(void* argument) {
 void TrunkRegistrations::stop() {
   for (std::unique_ptr<Trunk> const& trunk : m_trunks) {
     tmr_cancel(&trunk->timer);
-    if (trunk->registration)
+    if (trunk->registered)
       report("trunk " + trunk->path + " unregistering");
+    trunk->registered = false;
     trunk->registration = static_cast<sipreg*>(mem_deref(trunk->registration));
   }
 }

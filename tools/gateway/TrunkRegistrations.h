@@ -53,6 +53,7 @@ class TrunkRegistrations {
     std::string route;
     uint32_t lifetime;
     sipreg* registration = nullptr;
+    bool registered = false;
     // Drops a failed registration outside sipreg's own call, then waits
     // retryMs and registers anew.
     tmr timer;

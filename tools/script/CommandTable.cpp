@@ -23,23 +23,15 @@ namespace {
 
 using Value = Arguments::Value;
 
-std::string lowerHyphenated(char const* text) {
-  std::string word;
-  for (char const* c = text; *c; ++c)
-    word += *c == ' ' ? '-' : static_cast<char>(std::tolower(static_cast<unsigned char>(*c)));
-  return word;
-}
-
-// The texts of an enumeration, read from NAME until it answers with the
-// invalid text, written lower-case with hyphens for blanks: "Identity-Group"
-// is typed identity-group.
+// The words of an enumeration, from its texts read from NAME until it
+// answers with the invalid text.
 template <class Enumeration>
 std::vector<std::string> textsOf() {
   using Type = typename Enumeration::Type;
   char const* const invalid = Enumeration::NAME(static_cast<Type>(UINT32_MAX));
   std::vector<std::string> texts;
   for (uint32_t value = 0; std::strcmp(Enumeration::NAME(static_cast<Type>(value)), invalid) != 0; ++value)
-    texts.push_back(lowerHyphenated(Enumeration::NAME(static_cast<Type>(value))));
+    texts.push_back(enumerationWord(Enumeration::NAME(static_cast<Type>(value))));
   return texts;
 }
 
@@ -186,6 +178,13 @@ std::string quotedList(std::set<std::string> const& words) {
 }
 
 }  // namespace
+
+std::string enumerationWord(char const* text) {
+  std::string word;
+  for (char const* c = text; *c; ++c)
+    word += *c == ' ' ? '-' : static_cast<char>(std::tolower(static_cast<unsigned char>(*c)));
+  return word;
+}
 
 std::vector<Arguments::Value> const& Arguments::all(char const* name) const {
   static std::vector<Value> const none;

@@ -30,6 +30,10 @@
 
 class ScriptSession;
 
+// How the language writes an enumeration's text: lower-case, with hyphens
+// for blanks ("Identity-Group" is typed identity-group).
+std::string enumerationWord(char const* text);
+
 // The values of one matched line, by the names their pattern gives them.
 class Arguments {
  public:

@@ -4,6 +4,7 @@
 #include "LS_AddressText.h"
 #include "LS_IdentityResolution.h"
 #include "RegEx.h"
+#include "ScriptLine.h"
 
 namespace {
 
@@ -12,7 +13,7 @@ bool isIdentityOfType(LS_IIdentity* identity, LS_IdentityType::Type type) {
 }
 
 std::string quoted(String const& text) {
-  return "\"" + text.str() + "\"";
+  return quotedWord(text.str());
 }
 
 }  // namespace

@@ -6,7 +6,32 @@ bool isBlank(char c) {
   return c == ' ' || c == '\t' || c == '\r';
 }
 
+bool needsQuotes(std::string const& text) {
+  if (text.empty())
+    return true;
+  for (char const c : text) {
+    unsigned char const byte = static_cast<unsigned char>(c);
+    if (byte <= ' ' || byte >= 0x7f || c == '"' || c == '\\' || c == '#')
+      return true;
+  }
+  return false;
+}
+
 }  // namespace
+
+std::string quotedWord(std::string const& text) {
+  std::string word = "\"";
+  for (char const c : text) {
+    if (c == '"' || c == '\\')
+      word += '\\';
+    word += c;
+  }
+  return word + "\"";
+}
+
+std::string scriptWord(std::string const& text) {
+  return needsQuotes(text) ? quotedWord(text) : text;
+}
 
 ScriptLine::ScriptLine(std::string const& text) : m_endColumn(text.size() + 1) {
   if (text.size() > kMaximumLength)

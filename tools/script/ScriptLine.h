@@ -3,7 +3,8 @@
 // is about. Words are separated by blanks and tabs; a word in double quotes
 // may hold blanks, and inside quotes \" and \\ stand for " and \. A "#" that
 // begins a word starts a comment running to the end of the line. What the
-// words mean belongs to the command table.
+// words mean belongs to the command table. The writing side is here too:
+// the word that reads back as a given text.
 #pragma once
 
 #include <stdexcept>
@@ -46,3 +47,13 @@ class ScriptLine {
   std::vector<ScriptWord> m_words;
   size_t m_endColumn;
 };
+
+// text between double quotes, with '"' and '\\' escaped: what a script line
+// reads back as exactly text, and how printed values are shown.
+std::string quotedWord(std::string const& text);
+
+// text as one word of a script line: bare when it reads back as itself,
+// quoted when it is empty or holds a blank, '"', '\\', '#' or a byte
+// outside printable ASCII. A line break cannot be in a line at all; the
+// caller has to refuse such a text.
+std::string scriptWord(std::string const& text);

@@ -1,7 +1,13 @@
 #include "SessionCommands.h"
 
+#include <cerrno>
+#include <cstring>
+#include <fstream>
+#include <stdexcept>
+
 #include "IInfo.h"
 #include "InfoContainer.h"
+#include "ModelSaver.h"
 #include "ModelWatcher.h"
 #include "ScriptSession.h"
 
@@ -72,6 +78,23 @@ void addSessionCommands(CommandTable& table) {
   table.add("dump authentication-service <authentication-service>", "one authentication service",
             [](Session& session, Args const& arguments) {
               dump(session, session.authenticationService(arguments).get());
+            });
+  table.add("save [<file>]", "the configuration as the script that rebuilds it, into file or shown",
+            [](Session& session, Args const& arguments) {
+              std::string script;
+              try {
+                script = ModelSaver(session).script();
+              } catch (std::runtime_error const& error) {
+                throw CommandError(1, error.what());
+              }
+              if (!arguments.has("file")) {
+                session.output() << script;
+                return;
+              }
+              std::string const& name = arguments.text("file");
+              std::ofstream file(name, std::ios::binary);
+              if (!(file << script).flush())
+                throw CommandError(arguments.column("file"), "cannot write " + name + ": " + std::strerror(errno));
             });
   table.add("watch <on|off>", "print every event of the location model as it happens",
             [](Session& session, Args const& arguments) {

@@ -11,6 +11,7 @@
 #include "LS_IdentityResolution.h"
 #include "LS_ServiceResolution.h"
 #include "ResolutionExplainer.h"
+#include "ScriptLine.h"
 #include "ScriptSession.h"
 #include "SipStatistics.h"
 
@@ -20,7 +21,7 @@ using Session = ScriptSession;
 using Args = Arguments;
 
 std::string quoted(String const& text) {
-  return "\"" + text.str() + "\"";
+  return quotedWord(text.str());
 }
 
 // The message a lookup left, when it left one: a lookup may leave one even
