@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
 # The gateway under load, in one command: builds location-gateway (Release,
-# in build-gateway-bench/), configures it with SUBSCRIBERS (default 100,000)
+# in BUILD, by default build-gateway-bench/), configures it with SUBSCRIBERS (default 100,000)
 # subscribers of one location service inheriting a "DEFAULT" group with
 # inbound authentication (generate.sh), and has SIPp, on loopback:
 #   1. register every subscriber with digest authentication (register.xml:
@@ -13,7 +13,7 @@
 # run fails, at most three times. Every SIPp run is bounded in calls and
 # time; the gateway is stopped at the end or on any failure.
 #
-# Prints, and writes to build-gateway-bench/bench-gateway/report.txt:
+# Prints, and writes to BUILD/bench-gateway/report.txt:
 # registrations and INVITEs per second, the gateway's CPU time per request
 # (from /proc), its resident memory loaded and with every binding (VmRSS,
 # DRAIN_SECONDS after the registrations, once the stack's transactions are
@@ -27,7 +27,7 @@ subscribers=${SUBSCRIBERS:-100000}
 read -r -a rates <<<"${RATES:-1000 2000 4000 6000 8000 10000 12000 15000 20000}"
 probe_seconds=${PROBE_SECONDS:-3}
 drain_seconds=${DRAIN_SECONDS:-35}
-build="$root/build-gateway-bench"
+build=${BUILD:-"$root/build-gateway-bench"}
 work="$build/bench-gateway"
 
 bash "$root/tools/install-missing-packages.sh" cmake make g++ pkg-config libre2-dev libre-dev sip-tester >&2
