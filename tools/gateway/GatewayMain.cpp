@@ -91,22 +91,19 @@ int runScripts(ScriptSession& session, std::vector<std::string> const& scripts) 
 
 int serve(ScriptSession& session, Options const& options) {
   LibraryClock clock(options.statistics);
-  int status = 0;
-  {
-    SipFrontEnd frontEnd(session, clock);
-    std::string bound;
-    std::string error;
-    if (!frontEnd.start(options.listen, bound, error)) {
-      std::cerr << "location-gateway: " << error << "\n";
-      return 1;
-    }
-    std::cerr << "location-gateway: listening on udp:" << bound << std::endl;
-    re_main(onSignal);
-    frontEnd.shutDown();
-    if (options.statistics)
-      std::cerr << "location-gateway: " << frontEnd.requests() << " requests, " << clock.summary() << std::endl;
+  SipFrontEnd frontEnd(session, clock);
+  std::string bound;
+  std::string error;
+  if (!frontEnd.start(options.listen, bound, error)) {
+    std::cerr << "location-gateway: " << error << "\n";
+    return 1;
   }
-  return status;
+  std::cerr << "location-gateway: listening on udp:" << bound << std::endl;
+  re_main(onSignal);
+  frontEnd.shutDown();
+  if (options.statistics)
+    std::cerr << "location-gateway: " << frontEnd.requests() << " requests, " << clock.summary() << std::endl;
+  return 0;
 }
 
 }  // namespace

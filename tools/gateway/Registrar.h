@@ -13,8 +13,12 @@
 //   gateway holds for it), each with its remaining seconds.
 // - The identity is told it is registered when its first binding comes and
 //   unregistered when its last one goes (removed, expired or shut down).
-// - At most kMaximumBindings per identity and kMaximumContacts per request
-//   (403 beyond), so that no phone can grow the gateway's memory at will.
+// - At most kMaximumContacts per request (400 beyond) and kMaximumBindings
+//   per identity (403 beyond), so that no phone can grow the gateway's
+//   memory at will; the "DEFAULT" group answers every unknown user.
+// - A digest response to a nonce this process did not make counts as no
+//   credentials (a fresh 401), one to an expired nonce gets 401 with
+//   stale=true; only a wrong password on a valid nonce gets 403.
 // - A registration whose Call-ID differs from the binding's replaces it; CSeq
 //   ordering is not checked (libre's transactions already drop duplicates).
 //

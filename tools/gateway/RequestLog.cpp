@@ -2,11 +2,24 @@
 
 #include <cstdio>
 
+namespace {
+
+// Method and URI come from the network: libre has bounded the message and
+// cut both at blanks, but a control byte could still garble a terminal.
+void writeToken(pl const& token) {
+  for (size_t i = 0; i < token.l; ++i) {
+    unsigned char const c = static_cast<unsigned char>(token.p[i]);
+    std::putchar(c < 0x20 || c == 0x7f ? '?' : c);
+  }
+}
+
+}  // namespace
+
 void RequestLog::write(sip_msg const& request, std::string const& result, uint16_t code) {
   ++m_requests;
-  // Method and URI come from the network: libre has bounded the message and
-  // parsed both as tokens without blanks, so the line stays one line.
-  std::printf("%.*s %.*s %s %u\n", static_cast<int>(request.met.l), request.met.p, static_cast<int>(request.ruri.l),
-              request.ruri.p, result.c_str(), static_cast<unsigned int>(code));
+  writeToken(request.met);
+  std::putchar(' ');
+  writeToken(request.ruri);
+  std::printf(" %s %u\n", result.c_str(), static_cast<unsigned int>(code));
   std::fflush(stdout);
 }

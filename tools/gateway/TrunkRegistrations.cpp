@@ -66,9 +66,10 @@ void TrunkRegistrations::findTrunk(LS_IIdentity* identity, std::string const& pa
   trunk->identity = identity;
   trunk->face = face;
   trunk->path = path;
+  trunk->user = identity->getName().str();
   char const* const scheme = face->getUriScheme() == LS_UriScheme::SIPS ? "sips:" : "sip:";
   trunk->registrarUri = scheme + hostPortText(registrar);
-  trunk->addressOfRecord = scheme + identity->getName().str() + "@" + registrar.GetHost().c_str();
+  trunk->addressOfRecord = scheme + trunk->user + "@" + registrar.GetHost().c_str();
   trunk->lifetime = face->getLifetime();
   RefPtr<LS_IOutbound> outbound;
   face->queryIf(outbound);
@@ -77,17 +78,16 @@ void TrunkRegistrations::findTrunk(LS_IIdentity* identity, std::string const& pa
   bool strictRoute = false;
   if (outbound && outbound->getNumberOfProxies() != 0 &&
       outbound->getProxy(0, proxy, tlsProxy, strictRoute).isSuccess() && !proxy.GetHost().isEmpty())
-    trunk->route = scheme + hostPortText(proxy) + (strictRoute ? "" : ";lr");
+    trunk->route = scheme + hostPortText(proxy);
   tmr_init(&trunk->timer);
   m_trunks.push_back(std::move(trunk));
 }
 
 void TrunkRegistrations::registerTrunk(Trunk& trunk) {
   char const* routes[] = {trunk.route.c_str()};
-  std::string const user = trunk.identity->getName().str();
   int const error = sipreg_register(&trunk.registration, &m_stack, trunk.registrarUri.c_str(),
                                     trunk.addressOfRecord.c_str(), nullptr, trunk.addressOfRecord.c_str(),
-                                    trunk.lifetime, user.c_str(), trunk.route.empty() ? nullptr : routes,
+                                    trunk.lifetime, trunk.user.c_str(), trunk.route.empty() ? nullptr : routes,
                                     trunk.route.empty() ? 0 : 1, 0, onChallenge, &trunk, false, onResponse, &trunk,
                                     nullptr, nullptr);
   if (error == 0)

@@ -3,7 +3,8 @@
 // configured or else learnt, registers there through libre's sipreg: the
 // address of record is the face's URI scheme with the identity's name at the
 // registrar's host, the lifetime is the face's, and the face's first proxy,
-// when there is one, is the route. A 401 or 407 is answered with the
+// when there is one, is the route (libre routes loosely only, so a proxy
+// configured for strict routing is routed loosely too). A 401 or 407 is answered with the
 // library's outbound credentials for the challenge's realm; sipreg refreshes
 // a registration before it expires.
 //
@@ -48,6 +49,8 @@ class TrunkRegistrations {
     RefPtr<LS_IIdentity> identity;
     RefPtr<LS_IRegistrationOutbound> face;
     std::string path;
+    // The identity's name, the user part of the contact registered.
+    std::string user;
     std::string registrarUri;
     std::string addressOfRecord;
     std::string route;

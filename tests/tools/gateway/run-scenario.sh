@@ -7,8 +7,9 @@
 #          phone.xml against it, and the gateway's request lines must be
 #          exactly phone.out.
 # carrier: SIPp plays the carrier's registrar of carrier.xml; the gateway
-#          serves trunk.script with the registrar's address added, must
-#          report the trunk registered there, and on SIGTERM unregisters it.
+#          serves trunk.script with SIPp's address added as the proxy, must
+#          retry after the registrar's 503, report the trunk registered
+#          there, and on SIGTERM unregister it.
 #
 # The gateway runs through EMULATOR when one is given (qemu-user for a
 # cross build); SIPp always runs natively. Every process is bounded in time,
@@ -74,14 +75,14 @@ stop_gateway() {
 }
 
 run_sipp() {
-  timeout $((sipp_limit + 5)) "$sipp" -sf "$here/$scenario.xml" -i 127.0.0.1 -m 1 -timeout "${sipp_limit}s" \
+  timeout $((sipp_limit + 5)) "$sipp" -sf "$here/$scenario.xml" -i 127.0.0.1 -timeout "${sipp_limit}s" \
     -timeout_error -nostdin -trace_err "$@" >"$scenario".sipp.log 2>&1
 }
 
 case $scenario in
   phone)
     start_gateway "$here/subscribers.script"
-    run_sipp 127.0.0.1:"$gateway_port" || fail "SIPp's phone failed"
+    run_sipp -m 1 127.0.0.1:"$gateway_port" || fail "SIPp's phone failed"
     stop_gateway
     diff -u "$here/phone.out" "$scenario".gateway.out >"$scenario".diff || fail "request lines differ: $(cat "$scenario".diff)"
     ;;
@@ -90,7 +91,7 @@ case $scenario in
     # ones, since one may be taken.
     for attempt in 1 2 3 4 5; do
       port=$((20000 + RANDOM % 30000))
-      run_sipp -p "$port" &
+      run_sipp -m 2 -p "$port" &
       sipp_pid=$!
       sleep 0.5
       kill -0 "$sipp_pid" 2>/dev/null && break
@@ -98,10 +99,12 @@ case $scenario in
       sipp_pid=
     done
     [[ -n $sipp_pid ]] || fail "SIPp found no free port"
-    echo "face example.com trunk registration-outbound registrar set 127.0.0.1:$port" >"$scenario".registrar.script
-    start_gateway "$here/trunk.script" "$scenario".registrar.script
+    echo "face example.com trunk registration-outbound proxy insert 0 127.0.0.1:$port loose" >"$scenario".proxy.script
+    start_gateway "$here/trunk.script" "$scenario".proxy.script
     await_line "$scenario".gateway.err "trunk example.com/trunk registered at udp:127.0.0.1:$port for 300 s" ||
       fail "the trunk did not register"
+    grep -q "trunk example.com/trunk failed to register (503), retrying in 1 s" "$scenario".gateway.err ||
+      fail "the trunk did not retry after the server error"
     stop_gateway
     grep -q "trunk example.com/trunk unregistering" "$scenario".gateway.err || fail "the trunk was not unregistered"
     status=0
