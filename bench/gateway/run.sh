@@ -24,7 +24,7 @@ set -euo pipefail
 root="$(cd "$(dirname "$0")/../.." && pwd)"
 here="$root/bench/gateway"
 subscribers=${SUBSCRIBERS:-100000}
-read -r -a rates <<<"${RATES:-1000 2000 4000 6000 8000 10000 12000 15000 20000}"
+read -r -a rates <<<"${RATES:-500 1000 2000 4000 6000 8000 10000 12000 15000 20000}"
 probe_seconds=${PROBE_SECONDS:-3}
 drain_seconds=${DRAIN_SECONDS:-35}
 build=${BUILD:-"$root/build-gateway-bench"}
@@ -96,13 +96,15 @@ run_sipp() {
     [ "$kept" = 1 ]; then
     passed=true
   fi
-  printf '  %-16s %6d/s asked, %6d/s done, %d of %d succeeded, %d failed, %d retransmitted\n' \
-    "$label" "$rate" "$achieved" "$succeeded" "$calls" "$failed" "$retransmitted" >&2
+  printf '  %-20s %6d/s asked, %6d/s done, %d of %d succeeded, %d failed, %d retransmitted, gateway %.2f s CPU\n' \
+    "$label" "$rate" "$achieved" "$succeeded" "$calls" "$failed" "$retransmitted" \
+    "$(awk -v t="$ticks" -v hz="$ticks_per_second" 'BEGIN { print t / hz }')" >&2
 }
 
 # run_phase SCENARIO NAME: the probes, then every subscriber at the best
-# rate, and again a quarter slower while that fails (at most three full
-# runs); sets rate, achieved, ticks, sipp_cpu and sustained of the last one.
+# rate (the first of RATES when none passed), and again a quarter slower
+# while that fails (at most three full runs); sets rate, achieved, ticks,
+# sipp_cpu and sustained of the last one.
 run_phase() {
   local scenario=$1 name=$2 best=0 probe attempt
   for probe in "${rates[@]}"; do
@@ -112,18 +114,15 @@ run_phase() {
     [ $passed = true ] || break
     best=$probe
   done
-  if [ "$best" = 0 ]; then
-    echo "$name: not even ${rates[0]}/s passed; the logs are in $work" >&2
-    exit 1
-  fi
   rate=$best
+  [ "$rate" != 0 ] || rate=${rates[0]}
   for attempt in 1 2 3; do
     run_sipp "$scenario" "$rate" "$subscribers" "$name-$rate"
     sustained=$passed
     [ $passed = false ] || return 0
     [ $attempt = 3 ] || rate=$((rate * 3 / 4))
   done
-  echo "$name: no full run passed; the figures below are of the last, at $rate/s" >&2
+  echo "$name: no run passed; the figures below are of the last, at $rate/s; the logs are in $work" >&2
 }
 
 "$gateway" --listen 127.0.0.1:0 --statistics subscribers.script >gateway.out 2>gateway.err &
