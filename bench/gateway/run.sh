@@ -41,12 +41,17 @@ bash "$here/generate.sh" "$subscribers" .
 
 ticks_per_second=$(getconf CLK_TCK)
 gateway_pid=""
+# SIGTERM, then SIGKILL when the gateway has not exited a minute later.
 stop_gateway() {
-  if [ -n "$gateway_pid" ]; then
-    kill -TERM "$gateway_pid" 2>/dev/null || true
-    wait "$gateway_pid" || true
-    gateway_pid=""
-  fi
+  [ -n "$gateway_pid" ] || return 0
+  kill -TERM "$gateway_pid" 2>/dev/null || true
+  local tenths=600
+  while kill -0 "$gateway_pid" 2>/dev/null && [ $((tenths--)) -gt 0 ]; do
+    sleep 0.1
+  done
+  kill -KILL "$gateway_pid" 2>/dev/null || true
+  wait "$gateway_pid" || true
+  gateway_pid=""
 }
 trap stop_gateway EXIT
 
