@@ -4,10 +4,22 @@
 
 #include <cstdio>
 
-double LibraryClock::threadSeconds() {
+namespace {
+
+double secondsOf(clockid_t clock) {
   timespec now{};
-  clock_gettime(CLOCK_THREAD_CPUTIME_ID, &now);
+  clock_gettime(clock, &now);
   return static_cast<double>(now.tv_sec) + static_cast<double>(now.tv_nsec) / 1e9;
+}
+
+}  // namespace
+
+double LibraryClock::threadSeconds() {
+  return secondsOf(CLOCK_THREAD_CPUTIME_ID);
+}
+
+double LibraryClock::monotonicSeconds() {
+  return secondsOf(CLOCK_MONOTONIC);
 }
 
 std::string LibraryClock::summary() const {
