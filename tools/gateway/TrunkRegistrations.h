@@ -1,12 +1,12 @@
-// TrunkRegistrations: the gateway's own registrations. At start every
-// identity (not a group) whose outbound-registration face has a registrar,
-// configured or else learnt, registers there through libre's sipreg: the
-// address of record is the face's URI scheme with the identity's name at the
-// registrar's host, the lifetime is the face's, and the face's first proxy,
-// when there is one, is the route (libre routes loosely only, so a proxy
-// configured for strict routing is routed loosely too). A 401 or 407 is answered with the
-// library's outbound credentials for the challenge's realm; sipreg refreshes
-// a registration before it expires.
+// TrunkRegistrations: the gateway's own registrations. At start every identity
+// (not a group) whose outbound-registration face has a registrar, configured
+// or else learnt, registers there through libre's sipreg: the address of
+// record is the face's URI scheme with the identity's name at the registrar's
+// host, the lifetime is the face's, and the face's first proxy, when there is
+// one, is the route (libre routes loosely only, so a proxy configured for
+// strict routing is routed loosely too). A 401 or 407 is answered with the
+// library's outbound credentials for the challenge's realm; sipreg refreshes a
+// registration before it expires.
 //
 // On failure the registration is dropped and made anew after the face's
 // retry timeout for that class of error: system (no answer, transport
