@@ -32,7 +32,7 @@ work="$build/bench-gateway"
 bash "$root/tools/install-missing-packages.sh" cmake make g++ pkg-config libre2-dev libre-dev sip-tester >&2
 cmake -S "$root" -B "$build" -DCMAKE_BUILD_TYPE=Release -DLS_BUILD_TESTS=OFF -DLS_BUILD_GATEWAY=ON >/dev/null
 cmake --build "$build" --target location-gateway -j "${JOBS:-2}" >/dev/null
-gateway="$build/tools/gateway/location-gateway"
+gateway="$build/gateway/location-gateway"
 
 rm -rf "$work"
 mkdir -p "$work"

@@ -1,10 +1,10 @@
-#include "Redirector.h"
+#include "redirect/Redirector.h"
 
 #include <vector>
 
 #include "CBlob.h"
-#include "Exchange.h"
 #include "LS_IRegistrationInbound.h"
+#include "sip/Exchange.h"
 
 void Redirector::handle(Exchange& exchange) {
   CNameAddr target;
@@ -30,7 +30,8 @@ void Redirector::handle(Exchange& exchange) {
   for (CNameAddr const& contact : found) {
     CBlob text;
     contact.Serialize(text);
-    contacts += "Contact: " + std::string(reinterpret_cast<char const*>(text.GetData()), text.GetSize()) + "\r\n";
+    contacts +=
+        "Contact: " + std::string(reinterpret_cast<char const*>(text.GetData()), text.GetSize()) + "\r\n";
   }
   if (contacts.empty())
     return exchange.answer(480, "Temporarily Unavailable");

@@ -1,4 +1,4 @@
-#include "RequestLog.h"
+#include "sip/RequestLog.h"
 
 #include <cstdio>
 

@@ -27,10 +27,10 @@
 
 #include "LS_IIdentity.h"
 #include "LS_IRegistrationOutbound.h"
-#include "Libre.h"
-#include "LibraryClock.h"
 #include "RefPtr.h"
 #include "ScriptSession.h"
+#include "metrics/LibraryClock.h"
+#include "sip/Libre.h"
 
 class TrunkRegistrations {
  public:

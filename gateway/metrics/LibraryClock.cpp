@@ -1,4 +1,4 @@
-#include "LibraryClock.h"
+#include "metrics/LibraryClock.h"
 
 #include <time.h>
 
@@ -26,6 +26,7 @@ std::string LibraryClock::summary() const {
   double const total = threadSeconds();
   double const share = total > 0 ? 100.0 * m_librarySeconds / total : 0.0;
   char text[128];
-  std::snprintf(text, sizeof text, "CPU %.3f s, in the library %.3f s (%.1f%%)", total, m_librarySeconds, share);
+  std::snprintf(text, sizeof text, "CPU %.3f s, in the library %.3f s (%.1f%%)", total, m_librarySeconds,
+                share);
   return text;
 }

@@ -10,11 +10,11 @@
 #include <string>
 
 #include "LS_IIdentity.h"
-#include "Libre.h"
-#include "LibraryClock.h"
 #include "RefPtr.h"
-#include "RequestLog.h"
 #include "ScriptSession.h"
+#include "metrics/LibraryClock.h"
+#include "sip/Libre.h"
+#include "sip/RequestLog.h"
 
 class Exchange {
  public:

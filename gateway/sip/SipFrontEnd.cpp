@@ -1,8 +1,8 @@
-#include "SipFrontEnd.h"
+#include "sip/SipFrontEnd.h"
 
 #include <cstring>
 
-#include "Exchange.h"
+#include "sip/Exchange.h"
 
 namespace {
 

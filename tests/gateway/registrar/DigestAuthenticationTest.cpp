@@ -1,8 +1,8 @@
-#include "DigestAuthentication.h"
+#include "registrar/DigestAuthentication.h"
 
 #include <gtest/gtest.h>
 
-#include "NonceGenerator.h"
+#include "registrar/NonceGenerator.h"
 
 namespace {
 
@@ -21,7 +21,8 @@ struct Vector {
 
 Vector const kVectors[] = {
     {"Rfc2617",
-     "Digest username=\"Mufasa\", realm=\"testrealm@host.com\", nonce=\"dcd98b7102dd2f0e8b11d0f600bfb0c093\", "
+     "Digest username=\"Mufasa\", realm=\"testrealm@host.com\", "
+     "nonce=\"dcd98b7102dd2f0e8b11d0f600bfb0c093\", "
      "uri=\"/dir/index.html\", qop=auth, nc=00000001, cnonce=\"0a4f113b\", "
      "response=\"6629fae49393a05397450978507c4ef1\", opaque=\"5ccc069c403ebaf9f0171e9517f40e41\"",
      "Circle Of Life"},
@@ -55,7 +56,9 @@ TEST_P(PublishedDigest, RefusesAResponseWithoutQop) {
   EXPECT_FALSE(digestResponseMatches(m_response, m_get, GetParam().password));
 }
 
-INSTANTIATE_TEST_SUITE_P(Vectors, PublishedDigest, testing::ValuesIn(kVectors),
+INSTANTIATE_TEST_SUITE_P(Vectors,
+                         PublishedDigest,
+                         testing::ValuesIn(kVectors),
                          [](testing::TestParamInfo<Vector> const& info) { return info.param.name; });
 
 TEST(NonceGenerator, HoldsForItsRealmAndLifetimeOnly) {

@@ -8,7 +8,7 @@
 
 #include <string>
 
-#include "Libre.h"
+#include "sip/Libre.h"
 
 // The value of one WWW-Authenticate header.
 std::string digestChallenge(pl const& realm, std::string const& nonce, bool stale);

@@ -17,7 +17,7 @@
 #include <cstdint>
 #include <string>
 
-#include "Libre.h"
+#include "sip/Libre.h"
 
 class NonceGenerator {
  public:

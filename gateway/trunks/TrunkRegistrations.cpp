@@ -1,4 +1,4 @@
-#include "TrunkRegistrations.h"
+#include "trunks/TrunkRegistrations.h"
 
 #include <algorithm>
 #include <cctype>
@@ -85,15 +85,16 @@ void TrunkRegistrations::findTrunk(LS_IIdentity* identity, std::string const& pa
 
 void TrunkRegistrations::registerTrunk(Trunk& trunk) {
   char const* routes[] = {trunk.route.c_str()};
-  int const error = sipreg_register(&trunk.registration, &m_stack, trunk.registrarUri.c_str(),
-                                    trunk.addressOfRecord.c_str(), nullptr, trunk.addressOfRecord.c_str(),
-                                    trunk.lifetime, trunk.user.c_str(), trunk.route.empty() ? nullptr : routes,
-                                    trunk.route.empty() ? 0 : 1, 0, onChallenge, &trunk, false, onResponse, &trunk,
-                                    nullptr, nullptr);
+  int const error =
+      sipreg_register(&trunk.registration, &m_stack, trunk.registrarUri.c_str(),
+                      trunk.addressOfRecord.c_str(), nullptr, trunk.addressOfRecord.c_str(), trunk.lifetime,
+                      trunk.user.c_str(), trunk.route.empty() ? nullptr : routes, trunk.route.empty() ? 0 : 1,
+                      0, onChallenge, &trunk, false, onResponse, &trunk, nullptr, nullptr);
   if (error == 0)
     return;
   report("trunk " + trunk.path + " cannot register at " + trunk.registrarUri + ": " + std::strerror(error));
-  trunk.retryMs = uint64_t{m_clock.measure([&] { return trunk.face->getRetryTimeoutOnSystemError(); })} * 1000;
+  trunk.retryMs =
+      uint64_t{m_clock.measure([&] { return trunk.face->getRetryTimeoutOnSystemError(); })} * 1000;
   tmr_start(&trunk.timer, trunk.retryMs, onRetry, &trunk);
 }
 
@@ -106,8 +107,9 @@ int TrunkRegistrations::onChallenge(char** user, char** password, char const* re
   CNameAddr addressOfRecord;
   addressOfRecord.Parse(trunk.addressOfRecord.data(), trunk.addressOfRecord.size());
   XCode const found = owner.m_clock.measure([&] {
-    return LS_getOutboundAuthenticationCredentials(error, userName, secret, trunk.identity.get(), addressOfRecord,
-                                                   LS_AuthenticationProtocol::HTTP, realm, nullptr);
+    return LS_getOutboundAuthenticationCredentials(error, userName, secret, trunk.identity.get(),
+                                                   addressOfRecord, LS_AuthenticationProtocol::HTTP, realm,
+                                                   nullptr);
   });
   if (found.isFailure()) {
     owner.report("trunk " + trunk.path + " has no credentials for realm \"" + realm + "\"");
@@ -150,8 +152,8 @@ void TrunkRegistrations::onResponse(int error, sip_msg const* response, void* ar
     seconds = clock.measure([&] { return trunk.face->getRetryTimeoutOnClientError(); });
     cause = std::to_string(response->scode);
   }
-  owner.report("trunk " + trunk.path + " failed to register (" + cause + "), retrying in " + std::to_string(seconds) +
-         " s");
+  owner.report("trunk " + trunk.path + " failed to register (" + cause + "), retrying in " +
+               std::to_string(seconds) + " s");
   trunk.retryMs = uint64_t{seconds} * 1000;
   tmr_start(&trunk.timer, 0, onDropFailed, &trunk);
 }

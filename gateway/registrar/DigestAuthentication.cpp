@@ -1,4 +1,4 @@
-#include "DigestAuthentication.h"
+#include "registrar/DigestAuthentication.h"
 
 std::string digestChallenge(pl const& realm, std::string const& nonce, bool stale) {
   std::string value = "Digest realm=\"";

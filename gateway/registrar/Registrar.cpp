@@ -1,14 +1,14 @@
-#include "Registrar.h"
+#include "registrar/Registrar.h"
 
 #include <algorithm>
 #include <vector>
 
-#include "DigestAuthentication.h"
-#include "Exchange.h"
 #include "LS_CredentialLookup.h"
 #include "LS_ILocationService.h"
 #include "LS_IdentityResolution.h"
 #include "LS_IdentityType.h"
+#include "registrar/DigestAuthentication.h"
+#include "sip/Exchange.h"
 
 namespace {
 
@@ -90,9 +90,9 @@ RefPtr<LS_IIdentity> Registrar::registering(LS_IIdentity* resolved, CNameAddr co
     RefPtr<LS_ILocationService> service;
     RefPtr<LS_IIdentity> identity;
     if (LS_splitNameAddr(error, user, host, to).isFailure() ||
-        adoptInterface(service, [&](UUID const& iid, void** raw) {
-          return resolved->getLocationServiceIf(iid, raw);
-        }).isFailure() ||
+        adoptInterface(service,
+                       [&](UUID const& iid, void** raw) { return resolved->getLocationServiceIf(iid, raw); })
+            .isFailure() ||
         adoptInterface(identity, [&](UUID const& iid, void** raw) {
           return service->createDynamicIdentityIf(user, iid, raw);
         }).isFailure())
@@ -117,7 +117,8 @@ void Registrar::forgetIfUnbound(LS_IIdentity* identity, bool created) {
     return;
   m_clock.measure([&] {
     RefPtr<LS_ILocationService> service;
-    adoptInterface(service, [&](UUID const& iid, void** raw) { return identity->getLocationServiceIf(iid, raw); });
+    adoptInterface(service,
+                   [&](UUID const& iid, void** raw) { return identity->getLocationServiceIf(iid, raw); });
     if (service)
       service->removeDynamicIdentity(identity->getName());
   });
@@ -160,7 +161,8 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
     CNameAddr contact;
     if (requests.size() == kMaximumContacts || sip_addr_decode(&address, &value) != 0 ||
         !contact.Parse(address.auri.p, address.auri.l) ||
-        (msg_param_decode(&address.params, "expires", &parameter) == 0 && !parseSeconds(parameter, expires))) {
+        (msg_param_decode(&address.params, "expires", &parameter) == 0 &&
+         !parseSeconds(parameter, expires))) {
       malformed = true;
       return false;
     }
@@ -219,7 +221,8 @@ bool Registrar::authenticated(Exchange& exchange, LS_IIdentity* identity, CNameA
     httpauth_digest_resp response;
     if (++looked > kMaximumAuthorizations)
       return false;
-    if (httpauth_digest_response_decode(&response, &header.val) != 0 || response.username.l > kMaximumUserName)
+    if (httpauth_digest_response_decode(&response, &header.val) != 0 ||
+        response.username.l > kMaximumUserName)
       return true;
     auto const realm = std::find_if(realms.begin(), realms.end(), [&](LS_ProtocolRealm const& candidate) {
       return pl_strcmp(&response.realm, candidate.realm.c_str()) == 0;
@@ -259,7 +262,9 @@ bool Registrar::authenticated(Exchange& exchange, LS_IIdentity* identity, CNameA
   return false;
 }
 
-void Registrar::add(Bindings& bindings, ContactRequest const& request, std::string const& callId,
+void Registrar::add(Bindings& bindings,
+                    ContactRequest const& request,
+                    std::string const& callId,
                     CHostPort const& received) {
   XCode const added = m_clock.measure([&] {
     return bindings.face->addContact(callId.c_str(), request.contact, received, "", "", 0, request.expires);
@@ -311,7 +316,8 @@ std::string Registrar::bindingHeaders(Bindings const& bindings) {
   std::string headers;
   for (auto const& entry : bindings.byContact) {
     uint64_t const remainingMs = entry.second->expiresAtMs > now ? entry.second->expiresAtMs - now : 0;
-    headers += "Contact: <" + entry.first + ">;expires=" + std::to_string((remainingMs + 999) / 1000) + "\r\n";
+    headers +=
+        "Contact: <" + entry.first + ">;expires=" + std::to_string((remainingMs + 999) / 1000) + "\r\n";
   }
   return headers;
 }

@@ -7,7 +7,7 @@
 
 #include <string>
 
-#include "Libre.h"
+#include "sip/Libre.h"
 
 class RequestLog {
  public:

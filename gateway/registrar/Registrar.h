@@ -40,10 +40,10 @@
 #include "CNameAddr.h"
 #include "LS_IIdentity.h"
 #include "LS_IRegistrationInbound.h"
-#include "Libre.h"
-#include "LibraryClock.h"
-#include "NonceGenerator.h"
 #include "RefPtr.h"
+#include "metrics/LibraryClock.h"
+#include "registrar/NonceGenerator.h"
+#include "sip/Libre.h"
 
 class Exchange;
 
@@ -101,7 +101,10 @@ class Registrar {
   // Whether the request carries valid credentials; answers 401 or 403
   // itself when not.
   bool authenticated(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to);
-  void add(Bindings& bindings, ContactRequest const& request, std::string const& callId, CHostPort const& received);
+  void add(Bindings& bindings,
+           ContactRequest const& request,
+           std::string const& callId,
+           CHostPort const& received);
   // Leaves telling the identity to the caller.
   void removeAll(Bindings& bindings);
   // Removes one binding from its face and the table; tells the identity when

@@ -1,4 +1,4 @@
-#include "Exchange.h"
+#include "sip/Exchange.h"
 
 namespace {
 
@@ -39,8 +39,8 @@ void Exchange::answer(uint16_t code, char const* reason, std::string const& head
   } else {
     // The stack owns the transaction once it has answered.
     sip_strans* transaction = nullptr;
-    sip_treplyf(&transaction, nullptr, &m_stack, &m_request, false, code, reason, "%sContent-Length: 0\r\n\r\n",
-                headers.c_str());
+    sip_treplyf(&transaction, nullptr, &m_stack, &m_request, false, code, reason,
+                "%sContent-Length: 0\r\n\r\n", headers.c_str());
   }
   m_log.write(m_request, m_result, code);
   m_session.flushDebugLines();

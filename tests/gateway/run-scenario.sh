@@ -1,15 +1,16 @@
 #!/usr/bin/env bash
 # Runs one end-to-end scenario of location-gateway against SIPp on loopback:
 #
-#   run-scenario.sh phone|carrier GATEWAY SIPP WORK-DIR [EMULATOR...]
+#   run-scenario.sh FOLDER/NAME GATEWAY SIPP WORK-DIR [EMULATOR...]
 #
-# phone:   the gateway serves subscribers.script; SIPp plays the phone of
-#          phone.xml against it, and the gateway's request lines must be
-#          exactly phone.out.
-# carrier: SIPp plays the carrier's registrar of carrier.xml; the gateway
-#          serves trunk.script with SIPp's address added as the proxy, must
-#          retry after the registrar's 503, report the trunk registered
-#          there, and on SIGTERM unregister it.
+# NAME's files are in FOLDER (the part of the gateway it checks):
+# registrar/phone: the gateway serves subscribers.script; SIPp plays the
+#          phone of phone.xml against it, and the gateway's request lines
+#          must be exactly phone.out.
+# trunks/carrier: SIPp plays the carrier's registrar of carrier.xml; the
+#          gateway serves trunk.script with SIPp's address added as the
+#          proxy, must retry after the registrar's 503, report the trunk
+#          registered there, and on SIGTERM unregister it.
 #
 # The gateway runs through EMULATOR when one is given (qemu-user for a
 # cross build); SIPp always runs natively. Every process is bounded in time,
@@ -17,13 +18,13 @@
 # printed stays in WORK-DIR.
 set -u
 
-scenario=$1
+here=$(cd "$(dirname "$0")" && pwd)/$(dirname "$1")
+scenario=$(basename "$1")
 gateway=$2
 sipp=$3
 work=$4
 shift 4
 emulator=("$@")
-here=$(cd "$(dirname "$0")" && pwd)
 # Start-up under an emulator is slow; a scenario itself takes seconds.
 wait_limit=30
 sipp_limit=20

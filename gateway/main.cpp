@@ -17,12 +17,12 @@
 #include <vector>
 
 #include "CommandTable.h"
-#include "Libre.h"
-#include "LibraryClock.h"
 #include "ScriptLanguage.h"
 #include "ScriptRunner.h"
 #include "ScriptSession.h"
-#include "SipFrontEnd.h"
+#include "metrics/LibraryClock.h"
+#include "sip/Libre.h"
+#include "sip/SipFrontEnd.h"
 
 namespace {
 

@@ -14,17 +14,18 @@
 #include <memory>
 #include <string>
 
-#include "Libre.h"
-#include "LibraryClock.h"
-#include "Redirector.h"
-#include "Registrar.h"
-#include "RequestLog.h"
 #include "ScriptSession.h"
-#include "TrunkRegistrations.h"
+#include "metrics/LibraryClock.h"
+#include "redirect/Redirector.h"
+#include "registrar/Registrar.h"
+#include "sip/Libre.h"
+#include "sip/RequestLog.h"
+#include "trunks/TrunkRegistrations.h"
 
 class SipFrontEnd {
  public:
-  SipFrontEnd(ScriptSession& session, LibraryClock& clock) : m_session(session), m_clock(clock), m_registrar(clock) {}
+  SipFrontEnd(ScriptSession& session, LibraryClock& clock)
+      : m_session(session), m_clock(clock), m_registrar(clock) {}
   ~SipFrontEnd();
   SipFrontEnd(SipFrontEnd const&) = delete;
   SipFrontEnd& operator=(SipFrontEnd const&) = delete;

@@ -1,4 +1,4 @@
-#include "NonceGenerator.h"
+#include "registrar/NonceGenerator.h"
 
 #include <cstdio>
 
@@ -48,7 +48,8 @@ std::string NonceGenerator::signature(uint64_t madeMs, pl const& realm) const {
   data += ':';
   data.append(realm.p, realm.l);
   uint8_t mac[20];
-  hmac_sha1(m_key.data(), m_key.size(), reinterpret_cast<uint8_t const*>(data.data()), data.size(), mac, sizeof mac);
+  hmac_sha1(m_key.data(), m_key.size(), reinterpret_cast<uint8_t const*>(data.data()), data.size(), mac,
+            sizeof mac);
   return time + hex(mac, sizeof mac);
 }
 
