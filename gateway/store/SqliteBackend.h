@@ -1,0 +1,51 @@
+// SqliteBackend: the binding store in one SQLite file, the gateway's
+// default. The file is opened in WAL mode with synchronous=NORMAL: a
+// process killed at any point leaves the file readable with every batch
+// committed before it, and a batch costs one append to the log, not a sync
+// of the database.
+//
+// A file that exists is only read until it has shown itself to be a store
+// of ours, intact (quick_check) and not newer: a file of another kind, a
+// truncated store or a newer one is refused with a message naming it, and
+// is left as it was. A missing or empty file becomes a new store.
+//
+// Not shared: only this process writes the file, so it has no
+// notifications. Single-threaded use, see StoreBackend.
+#pragma once
+
+#include <string>
+#include <vector>
+
+#include "store/StoreBackend.h"
+
+struct sqlite3;
+struct sqlite3_stmt;
+
+class SqliteBackend : public StoreBackend {
+ public:
+  explicit SqliteBackend(std::string path) : m_path(std::move(path)) {}
+  ~SqliteBackend() override;
+  SqliteBackend(SqliteBackend const&) = delete;
+  SqliteBackend& operator=(SqliteBackend const&) = delete;
+
+  bool connect(std::string& error) override;
+  bool read(IdentityName const* identity, std::vector<StoredBinding>& bindings, std::string& error) override;
+  bool deleteExpired(std::string& error) override;
+  bool write(std::vector<StoreChange> const& changes, std::string& error) override;
+
+ private:
+  // Whether the open file is ours, intact and readable by this version;
+  // creates the schema when it holds no table at all.
+  bool adopt(std::string& error);
+  bool execute(std::string const& sql, std::string& error);
+  sqlite3_stmt* prepare(std::string const& sql, std::string& error);
+  std::string failure(char const* what) const;
+  std::string unreadable() const;
+  void close();
+
+  std::string m_path;
+  sqlite3* m_database = nullptr;
+  // Prepared once, kept for every batch.
+  sqlite3_stmt* m_upsert = nullptr;
+  sqlite3_stmt* m_delete = nullptr;
+};

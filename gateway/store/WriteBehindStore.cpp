@@ -1,0 +1,284 @@
+#include "store/WriteBehindStore.h"
+
+#include <fcntl.h>
+#include <poll.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cstdio>
+
+namespace {
+
+void say(std::string const& line) {
+  // One write a line: the thread and the loop both log.
+  std::string const text = "location-gateway: " + line + "\n";
+  std::fwrite(text.data(), 1, text.size(), stderr);
+  std::fflush(stderr);
+}
+
+}  // namespace
+
+WriteBehindStore::WriteBehindStore(std::unique_ptr<StoreBackend> backend, std::string name)
+    : m_backend(std::move(backend)), m_name(std::move(name)) {
+  int ends[2];
+  if (pipe2(ends, O_CLOEXEC | O_NONBLOCK) == 0) {
+    m_wakeRead = ends[0];
+    m_wakeWrite = ends[1];
+  }
+}
+
+WriteBehindStore::~WriteBehindStore() {
+  close();
+  if (m_wakeRead >= 0) {
+    ::close(m_wakeRead);
+    ::close(m_wakeWrite);
+  }
+}
+
+bool WriteBehindStore::connect(std::string& error) {
+  if (m_wakeRead < 0) {
+    error = "the store " + m_name + " cannot start its writer: no pipe";
+    return false;
+  }
+  if (!m_backend->connect(error))
+    return false;
+  m_shared = m_backend->notificationSocket() >= 0;
+  return true;
+}
+
+bool WriteBehindStore::load(std::vector<StoredBinding>& bindings, std::string& error) {
+  return m_backend->deleteExpired(error) && m_backend->read(nullptr, bindings, error);
+}
+
+void WriteBehindStore::start(UpdateHandler handler) {
+  m_handler = std::move(handler);
+  if (mqueue_alloc(&m_toLoop, onLearnt, this) != 0)
+    m_toLoop = nullptr;
+  m_writer = std::thread([this] { run(); });
+}
+
+void WriteBehindStore::record(StoreChange::Kind kind, StoredBinding const& binding) {
+  if (m_closed)
+    return;
+  uint64_t const sequence = ++m_sequence;
+  if (m_shared)
+    m_lastChange[IdentityName(binding.service, binding.identity)] = sequence;
+  bool first = false;
+  {
+    std::lock_guard<std::mutex> lock(m_mutex);
+    first = m_queue.empty();
+    if (m_queue.size() >= kQueueLimit) {
+      auto const refresh = std::find_if(m_queue.begin(), m_queue.end(), [](Queued const& queued) {
+        return queued.change.kind == StoreChange::Kind::REFRESHED;
+      });
+      if (refresh != m_queue.end()) {
+        m_queue.erase(refresh);
+        ++m_dropped;
+      } else if (kind == StoreChange::Kind::REFRESHED) {
+        ++m_dropped;
+        return;
+      }
+    }
+    m_queue.push_back(Queued{sequence, StoreChange{kind, binding}});
+  }
+  if (first)
+    wake();
+}
+
+void WriteBehindStore::close() {
+  if (m_closed)
+    return;
+  m_closed = true;
+  if (m_writer.joinable()) {
+    {
+      std::lock_guard<std::mutex> lock(m_mutex);
+      m_closing = true;
+    }
+    wake();
+    m_writer.join();
+  }
+  m_toLoop = static_cast<mqueue*>(mem_deref(m_toLoop));
+  m_learnt.clear();
+}
+
+void WriteBehindStore::wake() {
+  char const byte = 0;
+  // A full pipe already holds a wake-up.
+  [[maybe_unused]] ssize_t const written = ::write(m_wakeWrite, &byte, 1);
+}
+
+void WriteBehindStore::run() {
+  uint64_t backoff = kFirstBackoffMs;
+  bool catchUp = false;
+  for (;;) {
+    if (!m_up) {
+      if (!reconnect()) {
+        bool notified = false;
+        // Woken early by changes too: those only wait for the next try.
+        uint64_t const until = tmr_jiffies() + backoff;
+        for (uint64_t now = tmr_jiffies(); now < until; now = tmr_jiffies()) {
+          wait(static_cast<int>(until - now), notified);
+          std::lock_guard<std::mutex> lock(m_mutex);
+          if (m_closing)
+            break;
+        }
+        backoff = std::min(backoff * 2, kMaxBackoffMs);
+        std::lock_guard<std::mutex> lock(m_mutex);
+        if (!m_closing)
+          continue;
+        if (!m_queue.empty())
+          say("the store " + m_name + " is away: " + std::to_string(m_queue.size()) +
+              " changes not written at exit");
+        return;
+      }
+      backoff = kFirstBackoffMs;
+      catchUp = m_shared;
+    }
+    if (!flush())
+      continue;
+    if (catchUp) {
+      if (!learn(nullptr))
+        continue;
+      catchUp = false;
+    }
+    {
+      std::lock_guard<std::mutex> lock(m_mutex);
+      if (m_closing)
+        return;
+    }
+    bool notified = false;
+    if (wait(-1, notified))
+      // The batch's window: later changes join the first one's write.
+      wait(static_cast<int>(kBatchWindowMs), notified);
+    if (!notified)
+      continue;
+    std::vector<StoreBackend::IdentityName> changed;
+    std::string error;
+    if (!m_backend->takeNotifications(changed, error)) {
+      lost(error);
+      continue;
+    }
+    // Our own writes first, so that what is read includes them.
+    if (!flush())
+      continue;
+    for (StoreBackend::IdentityName const& identity : changed)
+      if (!learn(&identity))
+        break;
+  }
+}
+
+bool WriteBehindStore::reconnect() {
+  std::string error;
+  if (!m_backend->connect(error))
+    return false;
+  m_up = true;
+  size_t dropped = 0;
+  size_t queued = 0;
+  {
+    std::lock_guard<std::mutex> lock(m_mutex);
+    dropped = m_dropped;
+    queued = m_queue.size();
+    m_dropped = 0;
+  }
+  say("the store " + m_name + " is back; writing " + std::to_string(queued) + " queued changes" +
+      (dropped ? "; " + std::to_string(dropped) + " refreshes were dropped while it was away" : ""));
+  return true;
+}
+
+void WriteBehindStore::lost(std::string const& error) {
+  if (m_up)
+    say(error + "; answering from memory and queueing changes until it is back");
+  m_up = false;
+}
+
+bool WriteBehindStore::flush() {
+  for (;;) {
+    std::vector<StoreChange> batch;
+    uint64_t last = 0;
+    {
+      std::lock_guard<std::mutex> lock(m_mutex);
+      size_t const count = std::min(m_queue.size(), kBatchLimit);
+      if (count == 0)
+        return true;
+      batch.reserve(count);
+      for (size_t i = 0; i < count; ++i)
+        batch.push_back(m_queue[i].change);
+      last = m_queue[count - 1].sequence;
+    }
+    std::string error;
+    if (!m_backend->write(batch, error)) {
+      lost(error);
+      return false;
+    }
+    std::lock_guard<std::mutex> lock(m_mutex);
+    // Only record() changes the queue meanwhile, at its back, or drops a
+    // refresh: everything up to last is what was written.
+    while (!m_queue.empty() && m_queue.front().sequence <= last)
+      m_queue.pop_front();
+    m_written = last;
+  }
+}
+
+bool WriteBehindStore::learn(IdentityName const* identity) {
+  uint64_t written = 0;
+  {
+    std::lock_guard<std::mutex> lock(m_mutex);
+    written = m_written;
+  }
+  Learnt learnt{Update(), written};
+  learnt.update.everything = identity == nullptr;
+  if (identity)
+    learnt.update.identity = *identity;
+  std::string error;
+  if (!m_backend->read(identity, learnt.update.bindings, error)) {
+    lost(error);
+    return false;
+  }
+  {
+    std::lock_guard<std::mutex> lock(m_mutex);
+    m_learnt.push_back(std::move(learnt));
+  }
+  if (m_toLoop)
+    mqueue_push(m_toLoop, 0, nullptr);
+  return true;
+}
+
+bool WriteBehindStore::wait(int timeoutMs, bool& notified) {
+  pollfd watched[2] = {{m_wakeRead, POLLIN, 0}, {m_backend->notificationSocket(), POLLIN, 0}};
+  nfds_t const count = watched[1].fd >= 0 ? 2 : 1;
+  if (poll(watched, count, timeoutMs) <= 0)
+    return false;
+  notified = notified || (count == 2 && (watched[1].revents & (POLLIN | POLLHUP | POLLERR)));
+  if (!(watched[0].revents & POLLIN))
+    return false;
+  char drained[64];
+  while (::read(m_wakeRead, drained, sizeof drained) > 0) {
+  }
+  return true;
+}
+
+void WriteBehindStore::onLearnt(int, void*, void* argument) {
+  WriteBehindStore& store = *static_cast<WriteBehindStore*>(argument);
+  std::vector<Learnt> learnt;
+  {
+    std::lock_guard<std::mutex> lock(store.m_mutex);
+    learnt.swap(store.m_learnt);
+  }
+  for (Learnt& entry : learnt) {
+    Update& update = entry.update;
+    // Identities changed here after the read hold a newer state than it.
+    for (auto last = store.m_lastChange.begin(); last != store.m_lastChange.end();) {
+      if (last->second <= entry.writtenBefore) {
+        last = store.m_lastChange.erase(last);
+        continue;
+      }
+      if (update.everything)
+        update.untouched.insert(last->first);
+      ++last;
+    }
+    if (!update.everything && store.m_lastChange.count(update.identity))
+      continue;
+    if (store.m_handler)
+      store.m_handler(update);
+  }
+}
