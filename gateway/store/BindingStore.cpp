@@ -1,7 +1,29 @@
 #include "store/BindingStore.h"
 
+#include "store/PostgresBackend.h"
 #include "store/SqliteBackend.h"
 #include "store/WriteBehindStore.h"
+
+namespace {
+
+bool isDatabaseUri(std::string const& where) {
+  return where.rfind("postgresql://", 0) == 0 || where.rfind("postgres://", 0) == 0;
+}
+
+// The URI as messages show it: a password in its user part replaced.
+std::string withoutPassword(std::string const& uri) {
+  size_t const start = uri.find("://") + 3;
+  size_t const at = uri.find('@', start);
+  size_t const slash = uri.find('/', start);
+  if (at == std::string::npos || (slash != std::string::npos && slash < at))
+    return uri;
+  size_t const colon = uri.find(':', start);
+  if (colon == std::string::npos || colon > at)
+    return uri;
+  return uri.substr(0, colon + 1) + "***" + uri.substr(at);
+}
+
+}  // namespace
 
 bool BindingStore::open(std::string const& where, std::unique_ptr<BindingStore>& store, std::string& error) {
   store.reset();
@@ -11,7 +33,13 @@ bool BindingStore::open(std::string const& where, std::unique_ptr<BindingStore>&
     error = "the store needs a file, a postgresql:// URI or none";
     return false;
   }
-  auto opened = std::make_unique<WriteBehindStore>(std::make_unique<SqliteBackend>(where), where);
+  std::unique_ptr<WriteBehindStore> opened;
+  if (isDatabaseUri(where)) {
+    std::string const name = withoutPassword(where);
+    opened = std::make_unique<WriteBehindStore>(std::make_unique<PostgresBackend>(where, name), name);
+  } else {
+    opened = std::make_unique<WriteBehindStore>(std::make_unique<SqliteBackend>(where), where);
+  }
   if (!opened->connect(error))
     return false;
   store = std::move(opened);
