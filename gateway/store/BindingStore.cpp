@@ -1,7 +1,9 @@
 #include "store/BindingStore.h"
 
-#include "store/PostgresBackend.h"
 #include "store/SqliteBackend.h"
+#ifdef LS_GATEWAY_POSTGRESQL
+#include "store/PostgresBackend.h"
+#endif
 #include "store/WriteBehindStore.h"
 
 namespace {
@@ -36,7 +38,12 @@ bool BindingStore::open(std::string const& where, std::unique_ptr<BindingStore>&
   std::unique_ptr<WriteBehindStore> opened;
   if (isDatabaseUri(where)) {
     std::string const name = withoutPassword(where);
+#ifdef LS_GATEWAY_POSTGRESQL
     opened = std::make_unique<WriteBehindStore>(std::make_unique<PostgresBackend>(where, name), name);
+#else
+    error = "the store " + name + " needs PostgreSQL, which this location-gateway was built without";
+    return false;
+#endif
   } else {
     opened = std::make_unique<WriteBehindStore>(std::make_unique<SqliteBackend>(where), where);
   }

@@ -1,14 +1,18 @@
 # A PostgreSQL server of the test's own, for the tests to source:
 #
-#   postgres_start DIR   initdb into DIR and start the server on a free port
-#                        of 127.0.0.1 (its socket in DIR too); sets
-#                        postgres_uri. False when it cannot.
-#   postgres_stop        stops it (fast shutdown, bounded), waits for it.
+#   postgres_start       initdb into a new directory under /tmp and start
+#                        the server on a free port of 127.0.0.1 (its socket
+#                        there too); sets postgres_uri. False when it
+#                        cannot, its logs then in postgres_dir.
+#   postgres_stop        stops it (fast shutdown, bounded), waits for it,
+#                        and removes the directory.
 #   postgres_pause / postgres_resume
 #                        stop and start the same cluster on the same port.
 #
-# The server refuses to run as root, so under root (as in CI) DIR is given
-# to the postgres user and every server command runs as that user.
+# The server refuses to run as root, so under root (as in CI) the directory
+# is given to the postgres user and every server command runs as that user;
+# it is under /tmp so that the user can reach it whatever the checkout's
+# permissions.
 postgres_bin=${POSTGRES_BIN:-/usr/lib/postgresql/15/bin}
 postgres_dir=
 postgres_port=
@@ -23,9 +27,8 @@ postgres_as() {
 }
 
 postgres_start() {
-  postgres_dir=$1/postgres
-  mkdir -p "$postgres_dir" || return 1
-  ((EUID == 0)) && chown postgres: "$1" "$postgres_dir"
+  postgres_dir=$(mktemp -d /tmp/gateway-postgres.XXXXXX) || return 1
+  if ((EUID == 0)); then chown postgres: "$postgres_dir" || return 1; fi
   postgres_as "$postgres_bin/initdb" -D "$postgres_dir/data" -A trust -U gateway --no-sync \
     >"$postgres_dir/initdb.log" 2>&1 || return 1
   local attempt
@@ -51,4 +54,6 @@ postgres_pause() {
 postgres_stop() {
   [[ -n $postgres_port ]] && postgres_pause
   postgres_port=
+  [[ -n $postgres_dir ]] && rm -rf "$postgres_dir"
+  postgres_dir=
 }
