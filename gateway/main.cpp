@@ -13,6 +13,7 @@
 #include <cstring>
 #include <fstream>
 #include <iostream>
+#include <memory>
 #include <string>
 #include <vector>
 
@@ -23,11 +24,13 @@
 #include "metrics/LibraryClock.h"
 #include "sip/Libre.h"
 #include "sip/SipFrontEnd.h"
+#include "store/BindingReplay.h"
+#include "store/BindingStore.h"
 
 namespace {
 
 char const kUsage[] =
-    "usage: location-gateway [--listen ADDR:PORT] [--debug] [--statistics] SCRIPT...\n"
+    "usage: location-gateway [--listen ADDR:PORT] [--store WHERE] [--debug] [--statistics] SCRIPT...\n"
     "\n"
     "Configures the library from the scripts (the console's language), then\n"
     "answers SIP requests on ADDR:PORT (default 127.0.0.1:5060, UDP and TCP;\n"
@@ -35,12 +38,16 @@ char const kUsage[] =
     "answered on standard output: method, request URI, identity or the\n"
     "library's error text, response code.\n"
     "\n"
+    "  --store WHERE where registrations outlive the process: a file (SQLite;\n"
+    "                default location-gateway.sqlite), a postgresql:// URI\n"
+    "                (gateways sharing it learn each other's), or none\n"
     "  --debug       show the library's debug lines\n"
     "  --statistics  at exit, the requests answered and the CPU time spent\n"
     "                in the library's calls\n"
     "\n"
-    "Exit status: 0 after a signal, 1 when a script line fails or the\n"
-    "address cannot be bound, 2 for a usage error or an unreadable script.\n";
+    "Exit status: 0 after a signal, 1 when a script line fails, the address\n"
+    "cannot be bound or the store cannot be opened, 2 for a usage error or an\n"
+    "unreadable script.\n";
 
 void onSignal(int) {
   re_cancel();
@@ -48,6 +55,7 @@ void onSignal(int) {
 
 struct Options {
   std::string listen = "127.0.0.1:5060";
+  std::string store = "location-gateway.sqlite";
   bool debug = false;
   bool statistics = false;
   std::vector<std::string> scripts;
@@ -59,6 +67,8 @@ bool parse(int argc, char** argv, Options& options) {
     std::string const argument = argv[i];
     if (argument == "--listen" && i + 1 < argc)
       options.listen = argv[++i];
+    else if (argument == "--store" && i + 1 < argc)
+      options.store = argv[++i];
     else if (argument == "--debug")
       options.debug = true;
     else if (argument == "--statistics")
@@ -91,9 +101,20 @@ int runScripts(ScriptSession& session, std::vector<std::string> const& scripts) 
 
 int serve(ScriptSession& session, Options const& options) {
   LibraryClock clock(options.statistics);
-  SipFrontEnd frontEnd(session, clock);
-  std::string bound;
   std::string error;
+  // Outlives the front-end, whose registrar reports to it.
+  std::unique_ptr<BindingStore> store;
+  if (!BindingStore::open(options.store, store, error)) {
+    std::cerr << "location-gateway: " << error << "\n";
+    return 1;
+  }
+  SipFrontEnd frontEnd(session, clock);
+  BindingReplay replay(session, frontEnd.registrar(), clock);
+  if (store && !replay.restore(*store, error)) {
+    std::cerr << "location-gateway: " << error << "\n";
+    return 1;
+  }
+  std::string bound;
   if (!frontEnd.start(options.listen, bound, error)) {
     std::cerr << "location-gateway: " << error << "\n";
     return 1;
@@ -101,6 +122,8 @@ int serve(ScriptSession& session, Options const& options) {
   std::cerr << "location-gateway: listening on udp:" << bound << std::endl;
   re_main(onSignal);
   frontEnd.shutDown();
+  if (store)
+    store->close();
   if (options.statistics)
     std::cerr << "location-gateway: " << frontEnd.requests() << " requests, " << clock.summary() << std::endl;
   return 0;

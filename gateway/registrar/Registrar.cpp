@@ -48,17 +48,32 @@ void forEachHeader(sip_msg const& message, sip_hdrid id, Visit visit) {
   }
 }
 
-CHostPort sourceOf(sip_msg const& message) {
+std::string sourceOf(sip_msg const& message) {
   char address[64];
   re_snprintf(address, sizeof address, "%J", &message.src);
-  CHostPort source;
-  source.Parse(address, std::char_traits<char>::length(address));
-  return source;
+  return address;
+}
+
+CHostPort hostPortOf(std::string const& text) {
+  CHostPort hostPort;
+  hostPort.Parse(text.data(), text.size());
+  return hostPort;
+}
+
+// One of libre's static transport names for a stored one, so that a
+// binding holds no string of its own for it.
+char const* transportName(std::string const& stored) {
+  for (sip_transp transport : {SIP_TRANSP_UDP, SIP_TRANSP_TCP, SIP_TRANSP_TLS})
+    if (stored == sip_transp_param(transport))
+      return sip_transp_param(transport);
+  return sip_transp_param(SIP_TRANSP_UDP);
 }
 
 }  // namespace
 
 Registrar::~Registrar() {
+  // The bindings go with the process, not from the store.
+  m_store = nullptr;
   for (auto& entry : m_bindings) {
     size_t const before = entry.second.byContact.size();
     removeAll(entry.second);
@@ -124,14 +139,39 @@ void Registrar::forgetIfUnbound(LS_IIdentity* identity, bool created) {
   });
 }
 
-void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity, bool created) {
-  sip_msg const& message = exchange.request();
+RefPtr<LS_IRegistrationInbound> Registrar::faceOf(LS_IIdentity* identity) {
   RefPtr<LS_IRegistrationInbound> face;
   m_clock.measure([&] {
     adoptInterface(face, [&](UUID const& iid, void** raw) {
       return identity->createDynamicFaceIf(LS_IdentityFace::REGISTRATION_INBOUND, iid, raw);
     });
   });
+  return face;
+}
+
+Registrar::Bindings& Registrar::entryOf(RefPtr<LS_IIdentity> const& identity,
+                                        RefPtr<LS_IRegistrationInbound> const& face,
+                                        bool dynamic) {
+  Bindings& bindings = m_bindings[identity.get()];
+  bindings.dynamic = bindings.dynamic || dynamic;
+  bindings.face = face;
+  if (bindings.identity)
+    return bindings;
+  bindings.identity = identity;
+  m_clock.measure([&] {
+    bindings.identityName = identity->getName().str();
+    RefPtr<LS_ILocationService> service;
+    adoptInterface(service,
+                   [&](UUID const& iid, void** raw) { return identity->getLocationServiceIf(iid, raw); });
+    if (service)
+      bindings.serviceName = service->getName().str();
+  });
+  return bindings;
+}
+
+void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity, bool created) {
+  sip_msg const& message = exchange.request();
+  RefPtr<LS_IRegistrationInbound> const face = faceOf(identity.get());
   if (!face)
     return exchange.answer(500, "No Registration Face");
   unsigned int minimum = 0;
@@ -166,7 +206,8 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
       malformed = true;
       return false;
     }
-    requests.push_back(ContactRequest{contact, text(address.auri), std::min<uint32_t>(expires, maximum)});
+    requests.push_back(
+        ContactRequest{contact, text(address.auri), text(header.val), std::min<uint32_t>(expires, maximum)});
     return true;
   });
   if (malformed)
@@ -177,10 +218,7 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
   for (ContactRequest const& request : requests)
     if (request.expires != 0 && request.expires < minimum)
       return exchange.answer(423, "Interval Too Brief", "Min-Expires: " + std::to_string(minimum) + "\r\n");
-  Bindings& bindings = m_bindings[identity.get()];
-  bindings.identity = identity;
-  bindings.dynamic = bindings.dynamic || created;
-  bindings.face = face;
+  Bindings& bindings = entryOf(identity, face, created);
   size_t const before = bindings.byContact.size();
   size_t added = 0;
   for (ContactRequest const& request : requests)
@@ -190,11 +228,11 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
 
   if (wildcard)
     removeAll(bindings);
-  std::string const callId = text(message.callid);
-  CHostPort const received = sourceOf(message);
+  Origin const origin{text(message.callid), message.cseq.num, sourceOf(message),
+                      sip_transp_param(message.tp)};
   for (ContactRequest const& request : requests) {
     if (request.expires != 0) {
-      add(bindings, request, callId, received);
+      add(bindings, request, origin);
       continue;
     }
     auto const found = bindings.byContact.find(request.key);
@@ -264,28 +302,102 @@ bool Registrar::authenticated(Exchange& exchange, LS_IIdentity* identity, CNameA
 
 void Registrar::add(Bindings& bindings,
                     ContactRequest const& request,
-                    std::string const& callId,
-                    CHostPort const& received) {
+                    Origin const& origin,
+                    uint64_t expiresAtMs) {
+  CHostPort const received = hostPortOf(origin.source);
   XCode const added = m_clock.measure([&] {
-    return bindings.face->addContact(callId.c_str(), request.contact, received, "", "", 0, request.expires);
+    return bindings.face->addContact(origin.callId.c_str(), request.contact, received, "", "", 0,
+                                     request.expires);
   });
   // A contact configured statically on the face stands as registered already.
   if (added.isFailure())
     return;
   std::unique_ptr<Binding>& slot = bindings.byContact[request.key];
-  if (!slot) {
+  bool const fresh = !slot;
+  if (fresh) {
     slot = std::make_unique<Binding>();
     slot->owner = &bindings;
     slot->contact = request.contact;
   } else {
     unschedule(*slot);
   }
-  slot->callId = callId;
-  slot->expiresAtMs = tmr_jiffies() + uint64_t{request.expires} * 1000;
+  slot->contactText = request.text;
+  slot->callId = origin.callId;
+  slot->cseq = origin.cseq;
+  slot->source = origin.source;
+  slot->transport = origin.transport;
+  slot->expiresAtMs = expiresAtMs ? expiresAtMs : tmr_jiffies() + uint64_t{request.expires} * 1000;
   schedule(*slot);
+  record(fresh ? StoreChange::Kind::ADDED : StoreChange::Kind::REFRESHED, *slot);
+}
+
+void Registrar::record(StoreChange::Kind kind, Binding const& binding) {
+  if (!m_store || m_replacing)
+    return;
+  Bindings const& bindings = *binding.owner;
+  StoredBinding stored;
+  stored.service = bindings.serviceName;
+  stored.identity = bindings.identityName;
+  for (auto const& entry : bindings.byContact)
+    if (entry.second.get() == &binding)
+      stored.uri = entry.first;
+  if (kind != StoreChange::Kind::REMOVED) {
+    stored.contact = binding.contactText;
+    stored.callId = binding.callId;
+    stored.cseq = binding.cseq;
+    stored.source = binding.source;
+    stored.transport = binding.transport;
+    stored.expiresAtMs = binding.expiresAtMs;
+    stored.dynamic = bindings.dynamic;
+  }
+  m_store->record(kind, stored);
+}
+
+bool Registrar::replace(RefPtr<LS_IIdentity> const& identity,
+                        bool dynamic,
+                        std::vector<StoredBinding> const& stored) {
+  RefPtr<LS_IRegistrationInbound> const face = faceOf(identity.get());
+  if (!face)
+    return false;
+  Bindings& bindings = entryOf(identity, face, dynamic);
+  size_t const before = bindings.byContact.size();
+  m_replacing = true;
+  for (auto entry = bindings.byContact.begin(); entry != bindings.byContact.end();) {
+    std::string const& key = entry->first;
+    Binding& binding = *(entry++)->second;
+    bool const kept = std::any_of(stored.begin(), stored.end(),
+                                  [&](StoredBinding const& wanted) { return wanted.uri == key; });
+    if (!kept)
+      remove(binding);
+  }
+  uint64_t const now = tmr_jiffies();
+  for (StoredBinding const& wanted : stored) {
+    ContactRequest request;
+    if (wanted.expiresAtMs <= now || !request.contact.Parse(wanted.uri.data(), wanted.uri.size()))
+      continue;
+    request.key = wanted.uri;
+    request.text = wanted.contact;
+    request.expires =
+        static_cast<uint32_t>(std::min<uint64_t>((wanted.expiresAtMs - now + 999) / 1000, UINT32_MAX));
+    add(bindings, request, Origin{wanted.callId, wanted.cseq, wanted.source, transportName(wanted.transport)},
+        wanted.expiresAtMs);
+  }
+  m_replacing = false;
+  reportTransition(bindings, before);
+  forgetIfUnbound(identity.get(), dynamic);
+  return true;
+}
+
+std::vector<BindingStore::IdentityName> Registrar::boundIdentities() const {
+  std::vector<BindingStore::IdentityName> names;
+  for (auto const& entry : m_bindings)
+    if (!entry.second.byContact.empty())
+      names.emplace_back(entry.second.serviceName, entry.second.identityName);
+  return names;
 }
 
 void Registrar::remove(Binding& binding) {
+  record(StoreChange::Kind::REMOVED, binding);
   unschedule(binding);
   Bindings& bindings = *binding.owner;
   m_clock.measure([&] { bindings.face->removeContact(binding.contact, binding.callId.c_str()); });
@@ -297,8 +409,10 @@ void Registrar::remove(Binding& binding) {
 }
 
 void Registrar::removeAll(Bindings& bindings) {
-  for (auto& entry : bindings.byContact)
+  for (auto& entry : bindings.byContact) {
+    record(StoreChange::Kind::REMOVED, *entry.second);
     unschedule(*entry.second);
+  }
   bindings.byContact.clear();
   m_clock.measure([&] { bindings.face->removeContacts(); });
 }

@@ -28,6 +28,11 @@
 // - A registration whose Call-ID differs from the binding's replaces it; CSeq
 //   ordering is not checked (libre's transactions already drop duplicates).
 //
+// - Every binding added, refreshed or removed (by a REGISTER or by running
+//   out) is reported to the binding store when there is one; what the store
+//   hands back (at start, or another gateway's changes) comes in through
+//   replace(), which reports nothing back.
+//
 // Owns the bindings' timers: destroying the registrar removes every binding
 // from its face first, so that the global count of registered contacts
 // comes back to where it started. Everything runs on libre's thread.
@@ -36,6 +41,7 @@
 #include <map>
 #include <memory>
 #include <string>
+#include <vector>
 
 #include "CNameAddr.h"
 #include "LS_IIdentity.h"
@@ -44,6 +50,7 @@
 #include "metrics/LibraryClock.h"
 #include "registrar/NonceGenerator.h"
 #include "sip/Libre.h"
+#include "store/BindingStore.h"
 
 class Exchange;
 
@@ -59,6 +66,18 @@ class Registrar {
 
   void handle(Exchange& exchange);
 
+  // Borrowed; null for none. Set before the first request, cleared (or
+  // closed) before the registrar dies.
+  void setStore(BindingStore* store) { m_store = store; }
+  // Makes the identity's bindings exactly these (on the loop's clock),
+  // without reporting to the store; dynamic: the identity was created for
+  // them. False when the identity has no registration face to hold them.
+  bool replace(RefPtr<LS_IIdentity> const& identity,
+               bool dynamic,
+               std::vector<StoredBinding> const& bindings);
+  // The identities holding bindings, as (service, identity) names.
+  std::vector<BindingStore::IdentityName> boundIdentities() const;
+
  private:
   struct Bindings;
   struct Binding;
@@ -71,7 +90,11 @@ class Registrar {
   struct Binding {
     Bindings* owner;
     CNameAddr contact;
+    std::string contactText;  // the Contact value as received, parameters included
     std::string callId;
+    uint32_t cseq;
+    std::string source;     // "ADDR:PORT" the REGISTER came from
+    char const* transport;  // "udp", "tcp", "tls": libre's static names
     uint64_t expiresAtMs;
     Expiries::iterator expiry;  // its entry in m_expiries
   };
@@ -81,12 +104,23 @@ class Registrar {
     bool dynamic = false;  // created by this registrar for a "DEFAULT" user
     RefPtr<LS_IRegistrationInbound> face;
     std::map<std::string, std::unique_ptr<Binding>> byContact;
+    // The names the store files the bindings under, read once.
+    std::string serviceName;
+    std::string identityName;
   };
   // One Contact of a REGISTER, checked and with its expiry worked out.
   struct ContactRequest {
     CNameAddr contact;
     std::string key;
+    std::string text;  // the whole Contact value
     uint32_t expires;
+  };
+  // Where a binding came from: the REGISTER's, or a stored one's.
+  struct Origin {
+    std::string callId;
+    uint32_t cseq;
+    std::string source;
+    char const* transport;
   };
 
   // The identity whose face takes the contacts: resolved itself, or for a
@@ -101,10 +135,16 @@ class Registrar {
   // Whether the request carries valid credentials; answers 401 or 403
   // itself when not.
   bool authenticated(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to);
-  void add(Bindings& bindings,
-           ContactRequest const& request,
-           std::string const& callId,
-           CHostPort const& received);
+  // The identity's registration face, made when it has none; null when it
+  // cannot have one.
+  RefPtr<LS_IRegistrationInbound> faceOf(LS_IIdentity* identity);
+  // The table entry for identity, made with its face and names when new.
+  Bindings& entryOf(RefPtr<LS_IIdentity> const& identity,
+                    RefPtr<LS_IRegistrationInbound> const& face,
+                    bool dynamic);
+  // expiresAtMs: 0 for request.expires from now.
+  void add(Bindings& bindings, ContactRequest const& request, Origin const& origin, uint64_t expiresAtMs = 0);
+  void record(StoreChange::Kind kind, Binding const& binding);
   // Leaves telling the identity to the caller.
   void removeAll(Bindings& bindings);
   // Removes one binding from its face and the table; tells the identity when
@@ -123,6 +163,8 @@ class Registrar {
   static void onSweep(void* registrar);
 
   LibraryClock& m_clock;
+  BindingStore* m_store = nullptr;
+  bool m_replacing = false;  // in replace(): changes come from the store
   NonceGenerator m_nonces;
   std::map<LS_IIdentity*, Bindings> m_bindings;
   Expiries m_expiries;

@@ -38,6 +38,7 @@ class SipFrontEnd {
   void shutDown();
 
   unsigned long requests() const { return m_log.requests(); }
+  Registrar& registrar() { return m_registrar; }
 
   static constexpr uint64_t kShutDownMs = 2000;
 

@@ -69,7 +69,8 @@ bool PostgresBackend::connect(std::string& error) {
   }
   // The server's notices (its shutdown among them) would go to standard
   // error line by line; the failures they explain are logged once instead.
-  PQsetNoticeProcessor(m_connection, [](void*, char const*) {}, nullptr);
+  PQsetNoticeProcessor(
+      m_connection, [](void*, char const*) {}, nullptr);
   std::string const listen = std::string("LISTEN ") + kChannel;
   if (!adopt(error) || !run(listen, {}, error) ||
       !prepare(kUpsertName, StoreSchema::withClock(StoreSchema::kUpsert, kNow), error) ||

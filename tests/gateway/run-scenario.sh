@@ -61,7 +61,7 @@ await_line() {
 }
 
 start_gateway() {
-  "${emulator[@]}" "$gateway" --listen 127.0.0.1:0 "$@" >"$scenario".gateway.out 2>"$scenario".gateway.err &
+  "${emulator[@]}" "$gateway" --listen 127.0.0.1:0 --store none "$@" >"$scenario".gateway.out 2>"$scenario".gateway.err &
   gateway_pid=$!
   await_line "$scenario".gateway.err "listening on udp:" || fail "the gateway did not start"
   gateway_port=$(sed -n 's/.*listening on udp:127\.0\.0\.1:\([0-9]*\).*/\1/p' "$scenario".gateway.err)
