@@ -20,6 +20,12 @@
 # freed memory stays with the process), and the share of its CPU time spent in the library's calls (from its
 # --statistics line, over the time it served: loading the script left out).
 # Exits with 1 when a phase was not sustained at any rate tried.
+#
+# STORE picks where the gateway keeps its bindings: sqlite (the default: a
+# file in the work directory), postgresql (a server the run starts itself,
+# as the store's tests do) or none. With a store, the gateway is started
+# once more at the end on the bindings it stored, and the report gives the
+# time it took to restore them.
 set -euo pipefail
 root="$(cd "$(dirname "$0")/../.." && pwd)"
 here="$root/bench/gateway"
@@ -29,7 +35,8 @@ probe_seconds=${PROBE_SECONDS:-3}
 build=${BUILD:-"$root/build-gateway-bench"}
 work="$build/bench-gateway"
 
-bash "$root/tools/install-missing-packages.sh" cmake make g++ pkg-config libre2-dev libre-dev sip-tester >&2
+bash "$root/tools/install-missing-packages.sh" cmake make g++ pkg-config libre2-dev libre-dev sip-tester \
+  libsqlite3-dev libpq-dev postgresql >&2
 cmake -S "$root" -B "$build" -DCMAKE_BUILD_TYPE=Release -DLS_BUILD_TESTS=OFF -DLS_BUILD_GATEWAY=ON >/dev/null
 cmake --build "$build" --target location-gateway -j "${JOBS:-2}" >/dev/null
 gateway="$build/gateway/location-gateway"
@@ -38,6 +45,17 @@ rm -rf "$work"
 mkdir -p "$work"
 cd "$work"
 bash "$here/generate.sh" "$subscribers" .
+
+source "$root/tests/gateway/store/postgres.sh"
+case ${STORE:-sqlite} in
+  sqlite) store=$work/bindings.sqlite ;;
+  none) store=none ;;
+  postgresql)
+    postgres_start || { echo "PostgreSQL did not start" >&2; exit 1; }
+    store=$postgres_uri
+    ;;
+  *) echo "STORE is sqlite, postgresql or none" >&2; exit 2 ;;
+esac
 
 ticks_per_second=$(getconf CLK_TCK)
 gateway_pid=""
@@ -53,7 +71,7 @@ stop_gateway() {
   wait "$gateway_pid" || true
   gateway_pid=""
 }
-trap stop_gateway EXIT
+trap 'stop_gateway; postgres_stop' EXIT
 
 # The gateway's CPU time (user and system) so far, in clock ticks.
 gateway_ticks() {
@@ -129,7 +147,7 @@ run_phase() {
   echo "$name: no run passed; the figures below are of the last, at $rate/s; the logs are in $work" >&2
 }
 
-"$gateway" --listen 127.0.0.1:0 --statistics subscribers.script >gateway.out 2>gateway.err &
+"$gateway" --listen 127.0.0.1:0 --store "$store" --statistics subscribers.script >gateway.out 2>gateway.err &
 gateway_pid=$!
 load_start=$SECONDS
 address=""
@@ -159,6 +177,22 @@ serve_ticks=$(($(gateway_ticks) - load_ticks))
 rss_peak=$(awk '/^VmHWM:/ { print $2 }' "/proc/$gateway_pid/status")
 stop_gateway
 statistics=$(sed -n 's/^location-gateway: \([0-9]* requests, CPU .*\)$/\1/p' gateway.err)
+restored="no store"
+if [ "$store" != none ]; then
+  "$gateway" --listen 127.0.0.1:0 --store "$store" subscribers.script >restart.out 2>restart.err &
+  gateway_pid=$!
+  load_start=$SECONDS
+  until grep -q "listening on udp:" restart.err; do
+    if ! kill -0 "$gateway_pid" 2>/dev/null || [ $((SECONDS - load_start)) -gt 600 ]; then
+      echo "the gateway did not start again on its store:" >&2
+      cat restart.err >&2
+      exit 1
+    fi
+    sleep 0.2
+  done
+  stop_gateway
+  restored=$(sed -n 's/^location-gateway: \([0-9]* bindings restored .*\)$/\1/p' restart.err)
+fi
 library_seconds=$(sed -n 's/.* in the library \([0-9.]*\) s .*/\1/p' <<<"$statistics")
 
 microseconds() { # TICKS REQUESTS
@@ -179,6 +213,7 @@ verdict() { # SUSTAINED
   printf 'gateway VmRSS: %d KiB loaded, %d KiB with %d bindings (transactions at their peak included), peak %d KiB\n' \
     "$rss_loaded" "$rss_bound" "$subscribers" "$rss_peak"
   echo "gateway --statistics: $statistics"
+  echo "store: ${STORE:-sqlite}; started again: $restored"
   awk -v l="$library_seconds" -v t="$serve_ticks" -v hz="$ticks_per_second" 'BEGIN {
     printf "serving only (probes included, loading the script left out): CPU %.2f s, in the library %.2f s (%.1f%%)\n",
       t / hz, l, 100 * l * hz / t }'

@@ -1,12 +1,15 @@
 #include "store/BindingReplay.h"
 
 #include <algorithm>
+#include <chrono>
+#include <iomanip>
 #include <iostream>
 
 #include "LS_IMasterLocationService.h"
 #include "LS_IdentityType.h"
 
 bool BindingReplay::restore(BindingStore& store, std::string& error) {
+  auto const start = std::chrono::steady_clock::now();
   std::vector<StoredBinding> loaded;
   if (!store.load(loaded, error))
     return false;
@@ -21,8 +24,10 @@ bool BindingReplay::restore(BindingStore& store, std::string& error) {
     for (StoredBinding const& binding : entry.second)
       store.record(StoreChange::Kind::REMOVED, binding);
   }
+  std::chrono::duration<double> const took = std::chrono::steady_clock::now() - start;
   std::cerr << "location-gateway: " << restored << (restored == 1 ? " binding" : " bindings")
-            << " restored from the store" << std::endl;
+            << " restored from the store in " << std::fixed << std::setprecision(2) << took.count() << " s"
+            << std::endl;
   if (deleted)
     std::cerr << "location-gateway: " << deleted << (deleted == 1 ? " stored binding" : " stored bindings")
               << " of identities no longer configured deleted" << std::endl;
