@@ -1,6 +1,7 @@
 #include "registrar/Registrar.h"
 
 #include <algorithm>
+#include <cstring>
 #include <vector>
 
 #include "LS_CredentialLookup.h"
@@ -206,8 +207,10 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
       malformed = true;
       return false;
     }
-    requests.push_back(
-        ContactRequest{contact, text(address.auri), text(header.val), std::min<uint32_t>(expires, maximum)});
+    pl end;
+    requests.push_back(ContactRequest{contact, text(address.auri), text(header.val),
+                                      std::min<uint32_t>(expires, maximum),
+                                      msg_param_exists(&address.params, "reg-id", &end) == 0});
     return true;
   });
   if (malformed)
@@ -326,13 +329,14 @@ void Registrar::add(Bindings& bindings,
   slot->cseq = origin.cseq;
   slot->source = origin.source;
   slot->transport = origin.transport;
+  slot->flowBound = request.outbound && std::strcmp(origin.transport, sip_transp_param(SIP_TRANSP_UDP)) != 0;
   slot->expiresAtMs = expiresAtMs ? expiresAtMs : tmr_jiffies() + uint64_t{request.expires} * 1000;
   schedule(*slot);
   record(fresh ? StoreChange::Kind::ADDED : StoreChange::Kind::REFRESHED, *slot);
 }
 
 void Registrar::record(StoreChange::Kind kind, Binding const& binding) {
-  if (!m_store || m_replacing)
+  if (!m_store || m_replacing || (binding.flowBound && kind != StoreChange::Kind::REMOVED))
     return;
   Bindings const& bindings = *binding.owner;
   StoredBinding stored;
@@ -377,6 +381,7 @@ bool Registrar::replace(RefPtr<LS_IIdentity> const& identity,
       continue;
     request.key = wanted.uri;
     request.text = wanted.contact;
+    request.outbound = false;
     request.expires =
         static_cast<uint32_t>(std::min<uint64_t>((wanted.expiresAtMs - now + 999) / 1000, UINT32_MAX));
     add(bindings, request, Origin{wanted.callId, wanted.cseq, wanted.source, transportName(wanted.transport)},

@@ -95,6 +95,9 @@ class Registrar {
     uint32_t cseq;
     std::string source;     // "ADDR:PORT" the REGISTER came from
     char const* transport;  // "udp", "tcp", "tls": libre's static names
+    // Lives only as long as its connection (an outbound flow over TCP or
+    // TLS): never stored, since the connection dies with the process.
+    bool flowBound;
     uint64_t expiresAtMs;
     Expiries::iterator expiry;  // its entry in m_expiries
   };
@@ -114,6 +117,7 @@ class Registrar {
     std::string key;
     std::string text;  // the whole Contact value
     uint32_t expires;
+    bool outbound;  // it has a reg-id: an RFC 5626 flow when over a connection
   };
   // Where a binding came from: the REGISTER's, or a stored one's.
   struct Origin {
