@@ -67,19 +67,13 @@ void WriteBehindStore::record(StoreChange::Kind kind, StoredBinding const& bindi
   {
     std::lock_guard<std::mutex> lock(m_mutex);
     first = m_queue.empty();
-    if (m_queue.size() >= kQueueLimit) {
-      auto const refresh = std::find_if(m_queue.begin(), m_queue.end(), [](Queued const& queued) {
-        return queued.change.kind == StoreChange::Kind::REFRESHED;
-      });
-      if (refresh != m_queue.end()) {
-        m_queue.erase(refresh);
-        ++m_dropped;
-      } else if (kind == StoreChange::Kind::REFRESHED) {
-        ++m_dropped;
-        return;
-      }
+    if (m_queue.size() >= kQueueLimit && m_queue.refreshes.empty() && kind == StoreChange::Kind::REFRESHED) {
+      ++m_dropped;
+      return;
     }
-    m_queue.push_back(Queued{sequence, StoreChange{kind, binding}});
+    bound(1);
+    auto& list = kind == StoreChange::Kind::REFRESHED ? m_queue.refreshes : m_queue.others;
+    list.push_back(Queued{sequence, StoreChange{kind, binding}});
   }
   if (first)
     wake();
@@ -126,8 +120,8 @@ void WriteBehindStore::run() {
         std::lock_guard<std::mutex> lock(m_mutex);
         if (!m_closing)
           continue;
-        if (!m_queue.empty())
-          say("the store " + m_name + " is away: " + std::to_string(m_queue.size()) +
+        if (!m_queue.empty() || m_dropped)
+          say("the store " + m_name + " is away: " + std::to_string(m_queue.size() + m_dropped) +
               " changes not written at exit");
         return;
       }
@@ -191,32 +185,52 @@ void WriteBehindStore::lost(std::string const& error) {
   m_up = false;
 }
 
-bool WriteBehindStore::flush() {
-  for (;;) {
-    std::vector<StoreChange> batch;
-    uint64_t last = 0;
-    {
-      std::lock_guard<std::mutex> lock(m_mutex);
-      size_t const count = std::min(m_queue.size(), kBatchLimit);
-      if (count == 0)
-        return true;
-      batch.reserve(count);
-      for (size_t i = 0; i < count; ++i)
-        batch.push_back(m_queue[i].change);
-      last = m_queue[count - 1].sequence;
-    }
-    std::string error;
-    if (!m_backend->write(batch, error)) {
-      lost(error);
-      return false;
-    }
-    std::lock_guard<std::mutex> lock(m_mutex);
-    // Only record() changes the queue meanwhile, at its back, or drops a
-    // refresh: everything up to last is what was written.
-    while (!m_queue.empty() && m_queue.front().sequence <= last)
-      m_queue.pop_front();
-    m_written = last;
+void WriteBehindStore::bound(size_t room) {
+  while (m_queue.size() + room > kQueueLimit && !m_queue.refreshes.empty()) {
+    m_queue.refreshes.pop_front();
+    ++m_dropped;
   }
+}
+
+bool WriteBehindStore::flush() {
+  Queue taken;
+  {
+    std::lock_guard<std::mutex> lock(m_mutex);
+    std::swap(taken, m_queue);
+  }
+  if (taken.empty())
+    return true;
+  std::vector<StoreChange> batch;
+  batch.reserve(taken.size());
+  auto refresh = taken.refreshes.begin();
+  auto other = taken.others.begin();
+  uint64_t last = 0;
+  while (refresh != taken.refreshes.end() || other != taken.others.end()) {
+    bool const refreshFirst = other == taken.others.end() ||
+                              (refresh != taken.refreshes.end() && refresh->sequence < other->sequence);
+    Queued const& next = refreshFirst ? *refresh++ : *other++;
+    batch.push_back(next.change);
+    last = std::max(last, next.sequence);
+  }
+  std::string error;
+  bool const written = m_backend->write(batch, error);
+  {
+    std::lock_guard<std::mutex> lock(m_mutex);
+    if (written) {
+      m_written = last;
+      return true;
+    }
+    // What came meanwhile goes behind what was taken: only that much is
+    // moved under the mutex.
+    for (Queued& queued : m_queue.refreshes)
+      taken.refreshes.push_back(std::move(queued));
+    for (Queued& queued : m_queue.others)
+      taken.others.push_back(std::move(queued));
+    std::swap(taken, m_queue);
+    bound(0);
+  }
+  lost(error);
+  return false;
 }
 
 bool WriteBehindStore::learn(IdentityName const* identity) {

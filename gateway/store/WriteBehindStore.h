@@ -15,7 +15,12 @@
 //   the queue keeps the changes meanwhile, bounded by kQueueLimit: past it
 //   the oldest queued refresh is dropped (its binding's earlier row stays
 //   in the store), never an addition or a removal, and the count dropped
-//   is logged when the store is back. The thread connects again after
+//   is logged when the store is back. Refreshes queue apart from the other
+//   changes, so that dropping one costs the loop O(1); the writer merges
+//   both by sequence number, which keeps every binding's changes in order.
+// - The writer takes the whole queue at once (a swap under the mutex) and
+//   builds its batch outside it, so the loop never waits while rows are
+//   copied or written. The thread connects again after
 //   1 s, doubling up to kMaxBackoffMs; once back it writes the queue, then
 //   reads the whole store for the loop when others share it.
 // - A change the loop queued after the thread read an identity is newer
@@ -46,7 +51,6 @@
 class WriteBehindStore : public BindingStore {
  public:
   static constexpr uint64_t kBatchWindowMs = 50;
-  static constexpr size_t kBatchLimit = 4096;
   static constexpr size_t kQueueLimit = 100000;
   static constexpr uint64_t kFirstBackoffMs = 1000;
   static constexpr uint64_t kMaxBackoffMs = 5000;
@@ -68,6 +72,14 @@ class WriteBehindStore : public BindingStore {
     uint64_t sequence;
     StoreChange change;
   };
+  // The changes not yet written, each list in sequence order.
+  struct Queue {
+    std::deque<Queued> refreshes;
+    std::deque<Queued> others;  // additions and removals
+
+    size_t size() const { return refreshes.size() + others.size(); }
+    bool empty() const { return refreshes.empty() && others.empty(); }
+  };
   struct Learnt {
     Update update;
     uint64_t writtenBefore;  // every change up to this one was written first
@@ -76,8 +88,12 @@ class WriteBehindStore : public BindingStore {
   void run();
   // Connects, logging the first failure of an outage; false while away.
   bool reconnect();
-  // Writes the queue in batches; false when the store went away.
+  // Writes the queue; false when the store went away, the queue then put
+  // back in front of what came meanwhile.
   bool flush();
+  // Drops the oldest refreshes while the queue is over its bound; with the
+  // mutex held.
+  void bound(size_t room);
   // Reads for the loop: one identity, or every one when identity is null.
   bool learn(IdentityName const* identity);
   // Waits for a change, a notification, close(), or timeoutMs (-1: none).
@@ -96,7 +112,7 @@ class WriteBehindStore : public BindingStore {
   int m_wakeWrite = -1;
 
   std::mutex m_mutex;  // guards the members up to m_closing
-  std::deque<Queued> m_queue;
+  Queue m_queue;
   std::vector<Learnt> m_learnt;
   uint64_t m_written = 0;  // the sequence of the last change written
   size_t m_dropped = 0;    // refreshes dropped since the store went away
