@@ -22,6 +22,8 @@ constexpr char kDeleteName[] = "delete";
 // Separates the origin, the service and the identity in a notification;
 // neither name can hold it.
 constexpr char kSeparator = '\t';
+// Statements sent before their answers are read, in one write.
+constexpr size_t kPipelineDepth = 256;
 
 }  // namespace
 
@@ -112,21 +114,6 @@ bool PostgresBackend::run(std::string const& sql,
   return true;
 }
 
-bool PostgresBackend::runPrepared(char const* name,
-                                  std::vector<std::string> const& parameters,
-                                  std::string& error) {
-  std::vector<char const*> values;
-  for (std::string const& parameter : parameters)
-    values.push_back(parameter.c_str());
-  PGresult* const result =
-      PQexecPrepared(m_connection, name, static_cast<int>(values.size()), values.data(), nullptr, nullptr, 0);
-  bool const done = PQresultStatus(result) == PGRES_COMMAND_OK;
-  if (!done)
-    error = failure("cannot be written");
-  PQclear(result);
-  return done;
-}
-
 bool PostgresBackend::adopt(std::string& error) {
   std::string const table = std::string("SELECT to_regclass('") + StoreSchema::kMetaTable + "') IS NOT NULL";
   PGresult* exists = nullptr;
@@ -195,30 +182,77 @@ bool PostgresBackend::deleteExpired(std::string& error) {
 }
 
 bool PostgresBackend::write(std::vector<StoreChange> const& changes, std::string& error) {
-  if (!m_connection || !run("BEGIN", {}, error))
+  if (!m_connection)
     return false;
+  if (!PQenterPipelineMode(m_connection)) {
+    error = failure("cannot be written");
+    return false;
+  }
   uint64_t const now = tmr_jiffies();
   std::set<IdentityName> touched;
-  for (StoreChange const& change : changes) {
-    StoredBinding const& binding = change.binding;
-    touched.emplace(binding.service, binding.identity);
-    bool const written =
-        change.kind == StoreChange::Kind::REMOVED
-            ? runPrepared(kDeleteName, {binding.service, binding.identity, binding.uri}, error)
-            : runPrepared(kUpsertName, StoreSchema::upsertParameters(binding, now), error);
-    if (!written) {
-      std::string ignored;
-      run("ROLLBACK", {}, ignored);
+  size_t pending = 0;
+  // Sends one statement; every kPipelineDepth, waits for the answers so
+  // far, so that neither side's buffers fill while the other only writes.
+  auto send = [&](char const* prepared, char const* sql, std::vector<std::string> const& parameters) -> bool {
+    std::vector<char const*> values;
+    for (std::string const& parameter : parameters)
+      values.push_back(parameter.c_str());
+    int const count = static_cast<int>(values.size());
+    int const sent =
+        prepared ? PQsendQueryPrepared(m_connection, prepared, count, values.data(), nullptr, nullptr, 0)
+                 : PQsendQueryParams(m_connection, sql, count, nullptr, values.data(), nullptr, nullptr, 0);
+    if (!sent) {
+      error = failure("cannot be written");
       return false;
+    }
+    return ++pending < kPipelineDepth || answered(pending, error);
+  };
+  bool written = send(nullptr, "BEGIN", {});
+  for (auto change = changes.begin(); written && change != changes.end(); ++change) {
+    StoredBinding const& binding = change->binding;
+    touched.emplace(binding.service, binding.identity);
+    written = change->kind == StoreChange::Kind::REMOVED
+                  ? send(kDeleteName, nullptr, {binding.service, binding.identity, binding.uri})
+                  : send(kUpsertName, nullptr, StoreSchema::upsertParameters(binding, now));
+  }
+  for (auto identity = touched.begin(); written && identity != touched.end(); ++identity)
+    written =
+        send(nullptr, kNotify, {m_origin + kSeparator + identity->first + kSeparator + identity->second});
+  written = written && send(nullptr, "COMMIT", {}) && answered(pending, error);
+  PQexitPipelineMode(m_connection);
+  if (!written) {
+    std::string ignored;
+    run("ROLLBACK", {}, ignored);
+  }
+  return written;
+}
+
+bool PostgresBackend::answered(size_t& pending, std::string& error) {
+  if (pending == 0)
+    return true;
+  if (!PQpipelineSync(m_connection)) {
+    error = failure("cannot be written");
+    return false;
+  }
+  // Every statement's results (a statement after a failure reports being
+  // aborted), then the synchronisation point itself.
+  bool succeeded = true;
+  for (; pending > 0; --pending) {
+    while (PGresult* result = PQgetResult(m_connection)) {
+      ExecStatusType const status = PQresultStatus(result);
+      if (status != PGRES_COMMAND_OK && status != PGRES_TUPLES_OK && succeeded) {
+        error = failure("cannot be written");
+        succeeded = false;
+      }
+      PQclear(result);
     }
   }
-  for (IdentityName const& identity : touched)
-    if (!run(kNotify, {m_origin + kSeparator + identity.first + kSeparator + identity.second}, error)) {
-      std::string ignored;
-      run("ROLLBACK", {}, ignored);
-      return false;
-    }
-  return run("COMMIT", {}, error);
+  PGresult* const sync = PQgetResult(m_connection);
+  bool const synchronised = PQresultStatus(sync) == PGRES_PIPELINE_SYNC;
+  PQclear(sync);
+  if (!synchronised && succeeded)
+    error = failure("cannot be written");
+  return succeeded && synchronised;
 }
 
 int PostgresBackend::notificationSocket() const {

@@ -14,6 +14,9 @@
 // - Blocking libpq calls, on the writer thread only: the event loop never
 //   waits on the server. A connection attempt gives up after 5 s unless the
 //   URI says otherwise.
+// - A batch is sent in pipeline mode, its answers read every 256
+//   statements: a round trip per 256 rows rather than per row, which is
+//   what a storm of REGISTERs needs from a server across a network.
 #pragma once
 
 #include <string>
@@ -49,7 +52,9 @@ class PostgresBackend : public StoreBackend {
            std::string& error,
            pg_result** result = nullptr);
   bool prepare(char const* name, std::string const& sql, std::string& error);
-  bool runPrepared(char const* name, std::vector<std::string> const& parameters, std::string& error);
+  // Synchronises the pipeline and reads the answers of the pending
+  // statements; false when one failed.
+  bool answered(size_t& pending, std::string& error);
   std::string failure(char const* what) const;
   void disconnect();
 
