@@ -336,7 +336,8 @@ void Registrar::add(Bindings& bindings,
 }
 
 void Registrar::record(StoreChange::Kind kind, Binding const& binding) {
-  if (!m_store || m_replacing || (binding.flowBound && kind != StoreChange::Kind::REMOVED))
+  bool const kept = kind == StoreChange::Kind::ADDED || kind == StoreChange::Kind::REFRESHED;
+  if (!m_store || m_replacing || (binding.flowBound && kept))
     return;
   Bindings const& bindings = *binding.owner;
   StoredBinding stored;
@@ -345,7 +346,7 @@ void Registrar::record(StoreChange::Kind kind, Binding const& binding) {
   for (auto const& entry : bindings.byContact)
     if (entry.second.get() == &binding)
       stored.uri = entry.first;
-  if (kind != StoreChange::Kind::REMOVED) {
+  if (kept) {
     stored.contact = binding.contactText;
     stored.callId = binding.callId;
     stored.cseq = binding.cseq;
@@ -401,8 +402,8 @@ std::vector<BindingStore::IdentityName> Registrar::boundIdentities() const {
   return names;
 }
 
-void Registrar::remove(Binding& binding) {
-  record(StoreChange::Kind::REMOVED, binding);
+void Registrar::remove(Binding& binding, StoreChange::Kind why) {
+  record(why, binding);
   unschedule(binding);
   Bindings& bindings = *binding.owner;
   m_clock.measure([&] { bindings.face->removeContact(binding.contact, binding.callId.c_str()); });
@@ -468,7 +469,7 @@ void Registrar::onSweep(void* argument) {
     Binding& binding = *registrar.m_expiries.begin()->second;
     Bindings& bindings = *binding.owner;
     LS_IIdentity* const identity = bindings.identity.get();
-    registrar.remove(binding);
+    registrar.remove(binding, StoreChange::Kind::EXPIRED);
     registrar.reportTransition(bindings, 1);
     registrar.forgetIfUnbound(identity, false);
   }

@@ -151,9 +151,9 @@ class Registrar {
   void record(StoreChange::Kind kind, Binding const& binding);
   // Leaves telling the identity to the caller.
   void removeAll(Bindings& bindings);
-  // Removes one binding from its face and the table; tells the identity when
-  // it was its last. Invalidates binding.
-  void remove(Binding& binding);
+  // Removes one binding from its face and the table, reporting why to the
+  // store (REMOVED or EXPIRED). Invalidates binding.
+  void remove(Binding& binding, StoreChange::Kind why = StoreChange::Kind::REMOVED);
   // Tells the identity when its first binding came or its last went.
   void reportTransition(Bindings& bindings, size_t before);
   static std::string bindingHeaders(Bindings const& bindings);

@@ -19,6 +19,7 @@ constexpr char kSchemaLock[] = "SELECT pg_advisory_xact_lock(4242001)";
 constexpr char kNotify[] = "SELECT pg_notify('location_gateway', $1)";
 constexpr char kUpsertName[] = "upsert";
 constexpr char kDeleteName[] = "delete";
+constexpr char kDeleteIfExpiredName[] = "delete_if_expired";
 // Separates the origin, the service and the identity in a notification;
 // neither name can hold it.
 constexpr char kSeparator = '\t';
@@ -76,7 +77,8 @@ bool PostgresBackend::connect(std::string& error) {
   std::string const listen = std::string("LISTEN ") + kChannel;
   if (!adopt(error) || !run(listen, {}, error) ||
       !prepare(kUpsertName, StoreSchema::withClock(StoreSchema::kUpsert, kNow), error) ||
-      !prepare(kDeleteName, StoreSchema::kDelete, error)) {
+      !prepare(kDeleteName, StoreSchema::kDelete, error) ||
+      !prepare(kDeleteIfExpiredName, StoreSchema::withClock(StoreSchema::kDeleteIfExpired, kNow), error)) {
     disconnect();
     return false;
   }
@@ -211,9 +213,10 @@ bool PostgresBackend::write(std::vector<StoreChange> const& changes, std::string
   for (auto change = changes.begin(); written && change != changes.end(); ++change) {
     StoredBinding const& binding = change->binding;
     touched.emplace(binding.service, binding.identity);
-    written = change->kind == StoreChange::Kind::REMOVED
-                  ? send(kDeleteName, nullptr, {binding.service, binding.identity, binding.uri})
-                  : send(kUpsertName, nullptr, StoreSchema::upsertParameters(binding, now));
+    char const* const deletion =
+        change->kind == StoreChange::Kind::EXPIRED ? kDeleteIfExpiredName : kDeleteName;
+    written = change->removal() ? send(deletion, nullptr, {binding.service, binding.identity, binding.uri})
+                                : send(kUpsertName, nullptr, StoreSchema::upsertParameters(binding, now));
   }
   for (auto identity = touched.begin(); written && identity != touched.end(); ++identity)
     written =

@@ -29,7 +29,8 @@ SqliteBackend::~SqliteBackend() {
 void SqliteBackend::close() {
   sqlite3_finalize(m_upsert);
   sqlite3_finalize(m_delete);
-  m_upsert = m_delete = nullptr;
+  sqlite3_finalize(m_deleteIfExpired);
+  m_upsert = m_delete = m_deleteIfExpired = nullptr;
   // Closing the last connection checkpoints the log into the file and
   // removes it.
   sqlite3_close_v2(m_database);
@@ -72,7 +73,8 @@ bool SqliteBackend::connect(std::string& error) {
   }
   std::string const upsert = StoreSchema::withClock(StoreSchema::kUpsert, kNow);
   if (!execute("PRAGMA journal_mode=WAL", error) || !execute("PRAGMA synchronous=NORMAL", error) ||
-      !(m_upsert = prepare(upsert, error)) || !(m_delete = prepare(StoreSchema::kDelete, error))) {
+      !(m_upsert = prepare(upsert, error)) || !(m_delete = prepare(StoreSchema::kDelete, error)) ||
+      !(m_deleteIfExpired = prepare(StoreSchema::withClock(StoreSchema::kDeleteIfExpired, kNow), error))) {
     close();
     return false;
   }
@@ -206,8 +208,10 @@ bool SqliteBackend::write(std::vector<StoreChange> const& changes, std::string& 
   uint64_t const now = tmr_jiffies();
   for (StoreChange const& change : changes) {
     StoredBinding const& binding = change.binding;
-    bool const removal = change.kind == StoreChange::Kind::REMOVED;
-    sqlite3_stmt* const statement = removal ? m_delete : m_upsert;
+    bool const removal = change.removal();
+    sqlite3_stmt* const statement = !removal                                    ? m_upsert
+                                    : change.kind == StoreChange::Kind::EXPIRED ? m_deleteIfExpired
+                                                                                : m_delete;
     bool const bound = removal ? bindAll(statement, {binding.service, binding.identity, binding.uri})
                                : bindAll(statement, StoreSchema::upsertParameters(binding, now));
     if (!bound || sqlite3_step(statement) != SQLITE_DONE) {
@@ -220,5 +224,6 @@ bool SqliteBackend::write(std::vector<StoreChange> const& changes, std::string& 
   }
   sqlite3_reset(m_upsert);
   sqlite3_reset(m_delete);
+  sqlite3_reset(m_deleteIfExpired);
   return execute("COMMIT", error);
 }

@@ -48,4 +48,5 @@ class SqliteBackend : public StoreBackend {
   // Prepared once, kept for every batch.
   sqlite3_stmt* m_upsert = nullptr;
   sqlite3_stmt* m_delete = nullptr;
+  sqlite3_stmt* m_deleteIfExpired = nullptr;
 };

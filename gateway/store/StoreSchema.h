@@ -47,6 +47,11 @@ constexpr char kUpsert[] =
     "call_id = excluded.call_id, cseq = excluded.cseq, source = excluded.source, "
     "transport = excluded.transport, expires = excluded.expires, dynamic = excluded.dynamic";
 constexpr char kDelete[] = "DELETE FROM bindings WHERE service = $1 AND identity = $2 AND uri = $3";
+// A binding that ran out on a gateway's clock: deleted unless the row lives
+// on for more than the 2 s the clocks may differ by (another gateway
+// refreshed it).
+constexpr char kDeleteIfExpired[] =
+    "DELETE FROM bindings WHERE service = $1 AND identity = $2 AND uri = $3 AND expires <= {now} + 2000";
 constexpr char kDeleteExpired[] = "DELETE FROM bindings WHERE expires <= {now}";
 // Columns in StoredBinding's order; the ninth is the remaining milliseconds.
 constexpr char kSelectLive[] =

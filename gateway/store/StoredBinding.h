@@ -36,7 +36,11 @@ struct StoreChange {
     ADDED,      // a binding the store did not have
     REFRESHED,  // a binding the store has, with a new expiry or Call-ID
     REMOVED,
+    // Ran out here: removed only when the store's row has run out too, so
+    // that a refresh another gateway wrote just before is not undone.
+    EXPIRED,
   };
+  bool removal() const { return kind == Kind::REMOVED || kind == Kind::EXPIRED; }
   Kind kind;
   StoredBinding binding;
 };
