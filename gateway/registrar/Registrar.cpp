@@ -249,6 +249,7 @@ bool Registrar::authenticated(Exchange& exchange, LS_IIdentity* identity, CNameA
   if (verdict > 0)
     return true;
   if (verdict < 0) {
+    ++m_failedAuthentications;
     exchange.answer(403, "Forbidden");
     return false;
   }
@@ -260,6 +261,39 @@ bool Registrar::authenticated(Exchange& exchange, LS_IIdentity* identity, CNameA
   }
   exchange.answer(401, "Unauthorized", challenges);
   return false;
+}
+
+void Registrar::dropRemoved(std::vector<LS_IIdentity const*> const& removed, bool checkAll) {
+  for (LS_IIdentity const* identity : removed) {
+    auto const found = m_bindings.find(const_cast<LS_IIdentity*>(identity));
+    if (found != m_bindings.end())
+      drop(found);
+  }
+  if (!checkAll)
+    return;
+  for (auto entry = m_bindings.begin(); entry != m_bindings.end();) {
+    auto const next = std::next(entry);
+    LS_IIdentity* const identity = entry->first;
+    bool const present = m_clock.measure([&] {
+      RefPtr<LS_ILocationService> service;
+      RefPtr<LS_IIdentity> found;
+      adoptInterface(service,
+                     [&](UUID const& iid, void** raw) { return identity->getLocationServiceIf(iid, raw); });
+      return service && LS_getIdentityIf(service.get(), identity->getName(), found).isSuccess() &&
+             found.get() == identity;
+    });
+    if (!present)
+      drop(entry);
+    entry = next;
+  }
+}
+
+void Registrar::drop(std::map<LS_IIdentity*, Bindings>::iterator entry) {
+  size_t const before = entry->second.byContact.size();
+  m_bindingsDropped += before;
+  removeAll(entry->second);
+  reportTransition(entry->second, before);
+  m_bindings.erase(entry);
 }
 
 void Registrar::add(Bindings& bindings,

@@ -36,6 +36,7 @@
 #include <map>
 #include <memory>
 #include <string>
+#include <vector>
 
 #include "CNameAddr.h"
 #include "LS_IIdentity.h"
@@ -58,6 +59,15 @@ class Registrar {
   Registrar& operator=(Registrar const&) = delete;
 
   void handle(Exchange& exchange);
+
+  size_t bindingCount() const { return m_expiries.size(); }
+  uint64_t failedAuthentications() const { return m_failedAuthentications; }
+  uint64_t bindingsDropped() const { return m_bindingsDropped; }
+  // Lets go of the bindings of identities a change removed (counted in
+  // bindingsDropped): those listed, or, when checkAll (a whole location
+  // service went), every identity no longer found under its name in its
+  // service. Bindings of identities that remain are kept as they are.
+  void dropRemoved(std::vector<LS_IIdentity const*> const& removed, bool checkAll);
 
  private:
   struct Bindings;
@@ -119,6 +129,8 @@ class Registrar {
   void unschedule(Binding& binding);
   // Sets the stack timer for the earliest expiry, or stops it.
   void rearm();
+  // Drops every binding of the table entry's identity, and the entry.
+  void drop(std::map<LS_IIdentity*, Bindings>::iterator entry);
   // Removes every binding whose time has run out.
   static void onSweep(void* registrar);
 
@@ -127,4 +139,6 @@ class Registrar {
   std::map<LS_IIdentity*, Bindings> m_bindings;
   Expiries m_expiries;
   tmr m_sweep;
+  uint64_t m_failedAuthentications = 0;
+  uint64_t m_bindingsDropped = 0;
 };

@@ -30,6 +30,41 @@ TrunkRegistrations::~TrunkRegistrations() {
 }
 
 void TrunkRegistrations::start() {
+  m_trunks = findTrunks();
+  for (std::unique_ptr<Trunk> const& trunk : m_trunks)
+    registerTrunk(*trunk);
+}
+
+void TrunkRegistrations::follow() {
+  std::vector<std::unique_ptr<Trunk>> found = findTrunks();
+  auto const same = [](Trunk const& a, Trunk const& b) {
+    return a.path == b.path && a.registrarUri == b.registrarUri && a.addressOfRecord == b.addressOfRecord &&
+           a.route == b.route && a.lifetime == b.lifetime;
+  };
+  std::vector<std::unique_ptr<Trunk>> kept;
+  for (std::unique_ptr<Trunk>& trunk : m_trunks) {
+    auto const match = std::find_if(found.begin(), found.end(), [&](std::unique_ptr<Trunk> const& candidate) {
+      return candidate && same(*trunk, *candidate);
+    });
+    if (match == found.end()) {
+      unregisterTrunk(*trunk);
+      m_retired.push_back(std::move(trunk));
+      continue;
+    }
+    match->reset();
+    kept.push_back(std::move(trunk));
+  }
+  for (std::unique_ptr<Trunk>& trunk : found) {
+    if (!trunk)
+      continue;
+    kept.push_back(std::move(trunk));
+    registerTrunk(*kept.back());
+  }
+  m_trunks = std::move(kept);
+}
+
+std::vector<std::unique_ptr<TrunkRegistrations::Trunk>> TrunkRegistrations::findTrunks() {
+  std::vector<std::unique_ptr<Trunk>> trunks;
   m_clock.measure([&] {
     LS_IMasterLocationService* const master = m_session.locationMaster();
     Vector<String> services;
@@ -42,25 +77,27 @@ void TrunkRegistrations::start() {
       service->getIdentities(identities);
       for (String const& name : identities) {
         RefPtr<LS_IIdentity> identity;
-        if (LS_getIdentityIf(service.get(), name, identity).isSuccess())
-          findTrunk(identity.get(), serviceName.str() + "/" + name.str());
+        if (LS_getIdentityIf(service.get(), name, identity).isFailure())
+          continue;
+        if (std::unique_ptr<Trunk> trunk = findTrunk(identity.get(), serviceName.str() + "/" + name.str()))
+          trunks.push_back(std::move(trunk));
       }
     }
   });
-  for (std::unique_ptr<Trunk> const& trunk : m_trunks)
-    registerTrunk(*trunk);
+  return trunks;
 }
 
-void TrunkRegistrations::findTrunk(LS_IIdentity* identity, std::string const& path) {
+std::unique_ptr<TrunkRegistrations::Trunk> TrunkRegistrations::findTrunk(LS_IIdentity* identity,
+                                                                         std::string const& path) {
   if (identity->getIdentityType() != LS_IdentityType::IDENTITY)
-    return;
+    return nullptr;
   RefPtr<LS_IRegistrationOutbound> face;
   LS_getFaceIf(identity, LS_IdentityFace::REGISTRATION_OUTBOUND, face);
   CHostPort registrar;
   CHostPort tlsRegistrar;
   if (!face || (face->getRegistrar(registrar, tlsRegistrar).isFailure() &&
                 face->getDynamicRegistrar(registrar).isFailure()))
-    return;
+    return nullptr;
   auto trunk = std::make_unique<Trunk>();
   trunk->owner = this;
   trunk->identity = identity;
@@ -80,7 +117,7 @@ void TrunkRegistrations::findTrunk(LS_IIdentity* identity, std::string const& pa
       outbound->getProxy(0, proxy, tlsProxy, strictRoute).isSuccess() && !proxy.GetHost().isEmpty())
     trunk->route = scheme + hostPortText(proxy);
   tmr_init(&trunk->timer);
-  m_trunks.push_back(std::move(trunk));
+  return trunk;
 }
 
 void TrunkRegistrations::registerTrunk(Trunk& trunk) {
@@ -169,12 +206,15 @@ void TrunkRegistrations::onRetry(void* argument) {
   trunk.owner->registerTrunk(trunk);
 }
 
+void TrunkRegistrations::unregisterTrunk(Trunk& trunk) {
+  tmr_cancel(&trunk.timer);
+  if (trunk.registered)
+    report("trunk " + trunk.path + " unregistering");
+  trunk.registered = false;
+  trunk.registration = static_cast<sipreg*>(mem_deref(trunk.registration));
+}
+
 void TrunkRegistrations::stop() {
-  for (std::unique_ptr<Trunk> const& trunk : m_trunks) {
-    tmr_cancel(&trunk->timer);
-    if (trunk->registered)
-      report("trunk " + trunk->path + " unregistering");
-    trunk->registered = false;
-    trunk->registration = static_cast<sipreg*>(mem_deref(trunk->registration));
-  }
+  for (std::unique_ptr<Trunk> const& trunk : m_trunks)
+    unregisterTrunk(*trunk);
 }

@@ -15,6 +15,14 @@
 // registrar's address (where the 2xx came from) is recorded with
 // setRegistrarAddr. Progress goes to standard error, one line per event.
 //
+// follow() makes the registrations follow the model after a change made
+// while serving: a trunk that is new registers, one that is gone (or no
+// longer has a registrar) unregisters, one whose registrar, address of
+// record, route or lifetime changed unregisters and registers anew, and
+// the rest are left alone, registered as they are. It looks at every
+// identity, since a face's registrar is set without an event a service
+// announces; the operator's change is rare, a request is not.
+//
 // stop() unregisters: it drops every sipreg, which sends its REGISTER with
 // expiry 0 and lives on inside libre until answered; the caller then lets the
 // stack run for a bounded time. Owned by the front-end; everything runs on
@@ -41,7 +49,15 @@ class TrunkRegistrations {
   TrunkRegistrations& operator=(TrunkRegistrations const&) = delete;
 
   void start();
+  void follow();
   void stop();
+
+  // Each trunk's "service/identity" path and whether it is registered now.
+  template <class Visit>
+  void forEach(Visit visit) const {
+    for (std::unique_ptr<Trunk> const& trunk : m_trunks)
+      visit(trunk->path, trunk->registered);
+  }
 
  private:
   struct Trunk {
@@ -63,8 +79,11 @@ class TrunkRegistrations {
     uint64_t retryMs = 0;
   };
 
-  void findTrunk(LS_IIdentity* identity, std::string const& path);
+  // Every trunk the model describes now, none registering yet.
+  std::vector<std::unique_ptr<Trunk>> findTrunks();
+  std::unique_ptr<Trunk> findTrunk(LS_IIdentity* identity, std::string const& path);
   void registerTrunk(Trunk& trunk);
+  void unregisterTrunk(Trunk& trunk);
   // One progress line on standard error, after the library's debug lines.
   void report(std::string const& line);
   static int onChallenge(char** user, char** password, char const* realm, void* trunk);
@@ -76,4 +95,8 @@ class TrunkRegistrations {
   ScriptSession& m_session;
   LibraryClock& m_clock;
   std::vector<std::unique_ptr<Trunk>> m_trunks;
+  // Trunks follow() unregistered: their sipreg lives on inside libre until
+  // the unregistration is answered, and may still ask its challenge
+  // handler for credentials with the trunk as argument.
+  std::vector<std::unique_ptr<Trunk>> m_retired;
 };
