@@ -17,6 +17,7 @@ void writeToken(pl const& token) {
 
 void RequestLog::write(sip_msg const& request, std::string const& result, uint16_t code) {
   ++m_requests;
+  m_answers.count(request.met, code);
   writeToken(request.met);
   std::putchar(' ');
   writeToken(request.ruri);

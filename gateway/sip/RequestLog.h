@@ -7,13 +7,16 @@
 
 #include <string>
 
+#include "metrics/AnswerCounters.h"
 #include "sip/Libre.h"
 
 class RequestLog {
  public:
   void write(sip_msg const& request, std::string const& result, uint16_t code);
   unsigned long requests() const { return m_requests; }
+  AnswerCounters const& answers() const { return m_answers; }
 
  private:
   unsigned long m_requests = 0;
+  AnswerCounters m_answers;
 };

@@ -2,6 +2,7 @@
 
 #include <cstring>
 
+#include "SipStatistics.h"
 #include "sip/Exchange.h"
 
 namespace {
@@ -24,6 +25,7 @@ void stopLoop(void*) {
 }  // namespace
 
 SipFrontEnd::~SipFrontEnd() {
+  m_removals.reset();
   mem_deref(m_listener);
   // Forced: a registrar that never answered the unregistration must not
   // keep a registration alive that points at a trunk about to die.
@@ -61,7 +63,36 @@ bool SipFrontEnd::start(std::string const& listen, std::string& bound, std::stri
   m_session.stack().localHostPorts.add(own);
   m_trunks = std::make_unique<TrunkRegistrations>(*m_stack, m_session, m_clock);
   m_trunks->start();
+  m_removals = std::make_unique<IdentityRemovals>(*m_session.locationMaster());
   return true;
+}
+
+void SipFrontEnd::beginChange() {
+  m_removals->begin();
+}
+
+// Every line is followed, questions and failed lines too: telling them
+// apart would take knowing every command, and following a model that did
+// not change changes nothing.
+void SipFrontEnd::endChange() {
+  m_removals->end();
+  m_registrar.dropRemoved(m_removals->identities(), m_removals->anyServiceRemoved());
+  m_trunks->follow();
+}
+
+GatewayStatistics SipFrontEnd::statistics() const {
+  GatewayStatistics statistics;
+  statistics.answers = m_log.answers().counts();
+  statistics.failedAuthentications = m_registrar.failedAuthentications();
+  statistics.bindings = m_registrar.bindingCount();
+  statistics.bindingsDropped = m_registrar.bindingsDropped();
+  statistics.registeredContacts = s_sipStatistics.getInboundRegistrations();
+  m_trunks->forEach([&](std::string const& path, bool registered) {
+    statistics.trunks.push_back(GatewayStatistics::Trunk{path, registered});
+  });
+  statistics.cpuSeconds = LibraryClock::cpuSeconds();
+  statistics.librarySeconds = m_clock.librarySeconds();
+  return statistics;
 }
 
 void SipFrontEnd::shutDown() {

@@ -15,6 +15,8 @@
 #include <string>
 
 #include "ScriptSession.h"
+#include "control/IdentityRemovals.h"
+#include "metrics/GatewayStatistics.h"
 #include "metrics/LibraryClock.h"
 #include "redirect/Redirector.h"
 #include "registrar/Registrar.h"
@@ -39,6 +41,13 @@ class SipFrontEnd {
 
   unsigned long requests() const { return m_log.requests(); }
 
+  // Around a change made while serving (a control line): the registrar
+  // drops the bindings of identities it removed, the trunks follow.
+  void beginChange();
+  void endChange();
+  GatewayStatistics statistics() const;
+  Registrar const& registrar() const { return m_registrar; }
+
   static constexpr uint64_t kShutDownMs = 2000;
 
  private:
@@ -53,4 +62,5 @@ class SipFrontEnd {
   sip* m_stack = nullptr;
   sip_lsnr* m_listener = nullptr;
   std::unique_ptr<TrunkRegistrations> m_trunks;
+  std::unique_ptr<IdentityRemovals> m_removals;
 };
