@@ -13,6 +13,7 @@
 #include "ControlAnswer.h"
 #include "ModelWatcher.h"
 #include "ScriptLine.h"
+#include "ScriptRunner.h"
 
 namespace {
 

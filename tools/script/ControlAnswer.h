@@ -22,7 +22,7 @@
 #include <cstddef>
 #include <string>
 
-#include "ScriptRunner.h"
+#include "LineOutcome.h"
 
 namespace ControlAnswer {
 

@@ -13,20 +13,12 @@
 
 #include <functional>
 #include <istream>
-#include <optional>
 #include <ostream>
 #include <string>
 
 #include "CommandTable.h"
-#include "ScriptLine.h"
+#include "LineOutcome.h"
 #include "ScriptSession.h"
-
-// What one line printed (its events and debug lines included, even when it
-// failed: they happened) and, when it could not be applied, why.
-struct LineOutcome {
-  std::string printed;
-  std::optional<CommandError> failure;
-};
 
 // Runs one line on a local session.
 LineOutcome runScriptLine(ScriptSession& session, CommandTable const& table, std::string const& text);
