@@ -77,7 +77,7 @@ void SipFrontEnd::beginChange() {
 void SipFrontEnd::endChange() {
   m_removals->end();
   m_registrar.dropRemoved(m_removals->identities(), m_removals->anyServiceRemoved());
-  m_trunks->follow();
+  m_trunks->followSoon();
 }
 
 GatewayStatistics SipFrontEnd::statistics() const {

@@ -42,7 +42,8 @@ class SipFrontEnd {
   unsigned long requests() const { return m_log.requests(); }
 
   // Around a change made while serving (a control line): the registrar
-  // drops the bindings of identities it removed, the trunks follow.
+  // drops the bindings of identities it removed at once, the trunks follow
+  // soon after (see TrunkRegistrations::followSoon).
   void beginChange();
   void endChange();
   GatewayStatistics statistics() const;

@@ -35,7 +35,21 @@ void TrunkRegistrations::start() {
     registerTrunk(*trunk);
 }
 
+void TrunkRegistrations::followSoon() {
+  uint64_t const now = tmr_jiffies();
+  if (m_firstChangeMs == 0)
+    m_firstChangeMs = now;
+  uint64_t const latest = m_firstChangeMs + kFollowLatestMs;
+  tmr_start(&m_follow, std::min(kFollowQuietMs, latest > now ? latest - now : 0), onFollow, this);
+}
+
+void TrunkRegistrations::onFollow(void* registrations) {
+  static_cast<TrunkRegistrations*>(registrations)->follow();
+}
+
 void TrunkRegistrations::follow() {
+  m_firstChangeMs = 0;
+  tmr_cancel(&m_follow);
   std::vector<std::unique_ptr<Trunk>> found = findTrunks();
   auto const same = [](Trunk const& a, Trunk const& b) {
     return a.path == b.path && a.registrarUri == b.registrarUri && a.addressOfRecord == b.addressOfRecord &&
@@ -215,6 +229,8 @@ void TrunkRegistrations::unregisterTrunk(Trunk& trunk) {
 }
 
 void TrunkRegistrations::stop() {
+  tmr_cancel(&m_follow);
+  m_firstChangeMs = 0;
   for (std::unique_ptr<Trunk> const& trunk : m_trunks)
     unregisterTrunk(*trunk);
 }

@@ -12,6 +12,9 @@
 #            dump; /metrics, read by the Prometheus client's parser, must
 #            count what SIPp did; removing a registered subscriber must drop
 #            and count its binding.
+# trunk:     the trunk of ../trunks/trunk.script added over the socket must
+#            register with SIPp's carrier registrar (../trunks/carrier.xml),
+#            and removed over the socket must unregister there.
 # bad-input: bad-input.py's clients, then the gateway must still answer SIP.
 #
 # The gateway and the console run through EMULATOR when one is given; SIPp
@@ -44,8 +47,10 @@ fail() {
 
 gateway_pid=
 watch_pid=
+sipp_pid=
 cleanup() {
   [[ -n $watch_pid ]] && kill -KILL "$watch_pid" 2>/dev/null
+  [[ -n $sipp_pid ]] && kill -KILL "$sipp_pid" 2>/dev/null
   [[ -n $gateway_pid ]] && kill -KILL "$gateway_pid" 2>/dev/null
   exec 7>&- 2>/dev/null
 }
@@ -146,6 +151,34 @@ case $case in
     "$python" "$here/check-metrics.py" "$metrics_url" 'location_gateway_bindings=1' \
       'location_gateway_registered_contacts=1' 'location_gateway_bindings_dropped_total=1' ||
       fail "erin's binding was not dropped"
+    stop_gateway
+    ;;
+  trunk)
+    start_gateway "$here/operated.script"
+    # SIPp's registrar needs a port the trunk's proxy line can name.
+    for attempt in 1 2 3 4 5; do
+      port=$((20000 + RANDOM % 30000))
+      timeout 60 "$sipp" -sf "$here/../trunks/carrier.xml" -i 127.0.0.1 -p "$port" -m 2 -timeout 50s \
+        -timeout_error -nostdin -trace_err >sipp.log 2>&1 &
+      sipp_pid=$!
+      sleep 0.5
+      kill -0 "$sipp_pid" 2>/dev/null && break
+      wait "$sipp_pid"
+      sipp_pid=
+    done
+    [[ -n $sipp_pid ]] || fail "SIPp found no free port"
+    { grep -v '^location-service' "$here/../trunks/trunk.script"
+      echo "face example.com trunk registration-outbound proxy insert 0 127.0.0.1:$port loose"; } >trunk.script
+    console --connect control.sock trunk.script >trunk.out 2>trunk.err || fail "adding the trunk: $(cat trunk.err)"
+    await_line gateway.err "trunk example.com/trunk registered at udp:127.0.0.1:$port" ||
+      fail "the trunk added over the socket did not register"
+    console --connect control.sock - >remove.out 2>remove.err <<<"identity example.com trunk remove" ||
+      fail "removing the trunk: $(cat remove.err)"
+    await_line gateway.err "trunk example.com/trunk unregistering" || fail "the removed trunk did not unregister"
+    status=0
+    wait "$sipp_pid" || status=$?
+    sipp_pid=
+    ((status == 0)) || fail "SIPp's registrar failed ($status): no unregistration"
     stop_gateway
     ;;
   bad-input)
