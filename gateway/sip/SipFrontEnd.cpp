@@ -25,7 +25,7 @@ void stopLoop(void*) {
 }  // namespace
 
 SipFrontEnd::~SipFrontEnd() {
-  m_removals.reset();
+  m_changes.reset();
   mem_deref(m_listener);
   // Forced: a registrar that never answered the unregistration must not
   // keep a registration alive that points at a trunk about to die.
@@ -63,21 +63,21 @@ bool SipFrontEnd::start(std::string const& listen, std::string& bound, std::stri
   m_session.stack().localHostPorts.add(own);
   m_trunks = std::make_unique<TrunkRegistrations>(*m_stack, m_session, m_clock);
   m_trunks->start();
-  m_removals = std::make_unique<IdentityRemovals>(*m_session.locationMaster());
+  m_changes = std::make_unique<ModelChanges>(*m_session.locationMaster());
   return true;
 }
 
 void SipFrontEnd::beginChange() {
-  m_removals->begin();
+  m_changes->begin();
 }
 
-// Every line is followed, questions and failed lines too: telling them
-// apart would take knowing every command, and following a model that did
-// not change changes nothing.
 void SipFrontEnd::endChange() {
-  m_removals->end();
-  m_registrar.dropRemoved(m_removals->identities(), m_removals->anyServiceRemoved());
-  m_trunks->followSoon();
+  m_changes->end();
+  m_registrar.dropRemoved(m_changes->removed(), m_changes->anyServiceChanged());
+  if (m_changes->anyServiceChanged())
+    m_trunks->followAll();
+  else
+    m_trunks->follow(m_changes->touched(), m_changes->removed());
 }
 
 GatewayStatistics SipFrontEnd::statistics() const {

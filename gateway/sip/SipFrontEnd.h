@@ -15,7 +15,7 @@
 #include <string>
 
 #include "ScriptSession.h"
-#include "control/IdentityRemovals.h"
+#include "control/ModelChanges.h"
 #include "metrics/GatewayStatistics.h"
 #include "metrics/LibraryClock.h"
 #include "redirect/Redirector.h"
@@ -42,8 +42,7 @@ class SipFrontEnd {
   unsigned long requests() const { return m_log.requests(); }
 
   // Around a change made while serving (a control line): the registrar
-  // drops the bindings of identities it removed at once, the trunks follow
-  // soon after (see TrunkRegistrations::followSoon).
+  // drops the bindings of identities it removed, the trunks follow.
   void beginChange();
   void endChange();
   GatewayStatistics statistics() const;
@@ -63,5 +62,5 @@ class SipFrontEnd {
   sip* m_stack = nullptr;
   sip_lsnr* m_listener = nullptr;
   std::unique_ptr<TrunkRegistrations> m_trunks;
-  std::unique_ptr<IdentityRemovals> m_removals;
+  std::unique_ptr<ModelChanges> m_changes;
 };

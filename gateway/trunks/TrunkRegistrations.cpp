@@ -35,26 +35,43 @@ void TrunkRegistrations::start() {
     registerTrunk(*trunk);
 }
 
-void TrunkRegistrations::followSoon() {
-  uint64_t const now = tmr_jiffies();
-  if (m_firstChangeMs == 0)
-    m_firstChangeMs = now;
-  uint64_t const latest = m_firstChangeMs + kFollowLatestMs;
-  tmr_start(&m_follow, std::min(kFollowQuietMs, latest > now ? latest - now : 0), onFollow, this);
+void TrunkRegistrations::follow(std::vector<RefPtr<LS_IIdentity>> const& touched,
+                                std::vector<LS_IIdentity const*> const& removed) {
+  for (LS_IIdentity const* identity : removed)
+    replace(identity, nullptr);
+  for (RefPtr<LS_IIdentity> const& identity : touched) {
+    if (std::find(removed.begin(), removed.end(), identity.get()) != removed.end())
+      continue;
+    std::unique_ptr<Trunk> candidate =
+        m_clock.measure([&] { return findTrunk(identity.get(), ScriptSession::pathOf(identity.get())); });
+    replace(identity.get(), std::move(candidate));
+  }
 }
 
-void TrunkRegistrations::onFollow(void* registrations) {
-  static_cast<TrunkRegistrations*>(registrations)->follow();
+void TrunkRegistrations::replace(LS_IIdentity const* identity, std::unique_ptr<Trunk> candidate) {
+  auto const existing =
+      std::find_if(m_trunks.begin(), m_trunks.end(),
+                   [&](std::unique_ptr<Trunk> const& trunk) { return trunk->identity.get() == identity; });
+  if (existing != m_trunks.end()) {
+    if (candidate && same(**existing, *candidate))
+      return;
+    unregisterTrunk(**existing);
+    m_retired.push_back(std::move(*existing));
+    m_trunks.erase(existing);
+  }
+  if (!candidate)
+    return;
+  m_trunks.push_back(std::move(candidate));
+  registerTrunk(*m_trunks.back());
 }
 
-void TrunkRegistrations::follow() {
-  m_firstChangeMs = 0;
-  tmr_cancel(&m_follow);
+bool TrunkRegistrations::same(Trunk const& a, Trunk const& b) {
+  return a.path == b.path && a.registrarUri == b.registrarUri && a.addressOfRecord == b.addressOfRecord &&
+         a.route == b.route && a.lifetime == b.lifetime;
+}
+
+void TrunkRegistrations::followAll() {
   std::vector<std::unique_ptr<Trunk>> found = findTrunks();
-  auto const same = [](Trunk const& a, Trunk const& b) {
-    return a.path == b.path && a.registrarUri == b.registrarUri && a.addressOfRecord == b.addressOfRecord &&
-           a.route == b.route && a.lifetime == b.lifetime;
-  };
   std::vector<std::unique_ptr<Trunk>> kept;
   for (std::unique_ptr<Trunk>& trunk : m_trunks) {
     auto const match = std::find_if(found.begin(), found.end(), [&](std::unique_ptr<Trunk> const& candidate) {
@@ -229,8 +246,6 @@ void TrunkRegistrations::unregisterTrunk(Trunk& trunk) {
 }
 
 void TrunkRegistrations::stop() {
-  tmr_cancel(&m_follow);
-  m_firstChangeMs = 0;
   for (std::unique_ptr<Trunk> const& trunk : m_trunks)
     unregisterTrunk(*trunk);
 }

@@ -15,17 +15,14 @@
 // registrar's address (where the 2xx came from) is recorded with
 // setRegistrarAddr. Progress goes to standard error, one line per event.
 //
-// follow() makes the registrations follow the model after a change made
-// while serving: a trunk that is new registers, one that is gone (or no
-// longer has a registrar) unregisters, one whose registrar, address of
-// record, route or lifetime changed unregisters and registers anew, and
-// the rest are left alone, registered as they are. It looks at every
-// identity, since a face's registrar is set without an event a service
-// announces; with 100,000 subscribers that takes some 80 ms. So a change
-// asks for it with followSoon(), which runs it once the changes have
-// paused for kFollowQuietMs, and at the latest kFollowLatestMs after the
-// first: a script of many lines costs one look, not one a line, and a line
-// is answered without waiting for it.
+// After a change made while serving, the registrations follow the model:
+// a trunk that is new registers, one that is gone (or no longer has a
+// registrar) unregisters, one whose registrar, address of record, route or
+// lifetime changed unregisters and registers anew, and the rest are left
+// alone, registered as they are. follow() looks only at the identities the
+// change touched (see ModelChanges); followAll() at every identity, which
+// with 100,000 subscribers takes a quarter of a second, for the rare change
+// that adds or removes a whole location service.
 //
 // stop() unregisters: it drops every sipreg, which sends its REGISTER with
 // expiry 0 and lives on inside libre until answered; the caller then lets the
@@ -47,19 +44,15 @@
 class TrunkRegistrations {
  public:
   TrunkRegistrations(sip& stack, ScriptSession& session, LibraryClock& clock)
-      : m_stack(stack), m_session(session), m_clock(clock) {
-    tmr_init(&m_follow);
-  }
+      : m_stack(stack), m_session(session), m_clock(clock) {}
   ~TrunkRegistrations();
   TrunkRegistrations(TrunkRegistrations const&) = delete;
   TrunkRegistrations& operator=(TrunkRegistrations const&) = delete;
 
-  static constexpr uint64_t kFollowQuietMs = 100;
-  static constexpr uint64_t kFollowLatestMs = 1000;
-
   void start();
-  void followSoon();
-  void follow();
+  void follow(std::vector<RefPtr<LS_IIdentity>> const& touched,
+              std::vector<LS_IIdentity const*> const& removed);
+  void followAll();
   void stop();
 
   // Each trunk's "service/identity" path and whether it is registered now.
@@ -94,13 +87,16 @@ class TrunkRegistrations {
   std::unique_ptr<Trunk> findTrunk(LS_IIdentity* identity, std::string const& path);
   void registerTrunk(Trunk& trunk);
   void unregisterTrunk(Trunk& trunk);
+  // The identity's trunk becomes candidate (none when null): left alone
+  // when the same, else the old one retired and the new one registered.
+  void replace(LS_IIdentity const* identity, std::unique_ptr<Trunk> candidate);
+  static bool same(Trunk const& a, Trunk const& b);
   // One progress line on standard error, after the library's debug lines.
   void report(std::string const& line);
   static int onChallenge(char** user, char** password, char const* realm, void* trunk);
   static void onResponse(int error, sip_msg const* response, void* trunk);
   static void onDropFailed(void* trunk);
   static void onRetry(void* trunk);
-  static void onFollow(void* registrations);
 
   sip& m_stack;
   ScriptSession& m_session;
@@ -110,6 +106,4 @@ class TrunkRegistrations {
   // the unregistration is answered, and may still ask its challenge
   // handler for credentials with the trunk as argument.
   std::vector<std::unique_ptr<Trunk>> m_retired;
-  tmr m_follow;
-  uint64_t m_firstChangeMs = 0;  // of the changes not yet followed; 0: none
 };
