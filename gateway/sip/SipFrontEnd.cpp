@@ -9,12 +9,11 @@ namespace {
 char const kAllow[] = "Allow: REGISTER, INVITE, ACK, CANCEL, MESSAGE, SUBSCRIBE, OPTIONS\r\n";
 
 // Hash table sizes of the stack: client transactions, server transactions,
-// TCP connections. A server transaction outlives its answer by 32 s over
-// UDP, so a registrar answering thousands of requests a second holds some
-// hundred thousand at once; the table (8 bytes a bucket on 32-bit) keeps
-// their chains short.
+// TCP connections. Every request is answered statelessly (see
+// Exchange::answer), so the server-transaction table stays empty; the stack
+// still looks each request up in it.
 constexpr uint32_t kClientTransactions = 64;
-constexpr uint32_t kServerTransactions = 32768;
+constexpr uint32_t kServerTransactions = 16;
 constexpr uint32_t kConnections = 64;
 
 void stopLoop(void*) {
@@ -78,8 +77,8 @@ void SipFrontEnd::shutDown() {
 bool SipFrontEnd::onRequest(sip_msg const* request, void* argument) {
   SipFrontEnd& frontEnd = *static_cast<SipFrontEnd*>(argument);
   sip_msg const& message = *request;
-  // An ACK gets no answer, the one for a 302 included (INVITEs are answered
-  // without a transaction, see Exchange::answer).
+  // An ACK gets no answer, the one for a 302 included (every request is
+  // answered without a transaction, see Exchange::answer).
   if (pl_strcmp(&message.met, "ACK") == 0)
     return true;
   Exchange exchange(*frontEnd.m_stack, message, frontEnd.m_session, frontEnd.m_log, frontEnd.m_clock);
