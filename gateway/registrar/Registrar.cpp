@@ -181,6 +181,14 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
   bindings.identity = identity;
   bindings.dynamic = bindings.dynamic || created;
   bindings.face = face;
+  switch (order(bindings, requests, wildcard, message.callid, message.cseq.num)) {
+    case Order::OUT_OF_ORDER:
+      return exchange.answer(400, "CSeq Out of Order");
+    case Order::RETRANSMITTED:
+      return exchange.answer(200, "OK", bindingHeaders(bindings));
+    case Order::NEW:
+      break;
+  }
   size_t const before = bindings.byContact.size();
   size_t added = 0;
   for (ContactRequest const& request : requests)
@@ -190,11 +198,10 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
 
   if (wildcard)
     removeAll(bindings);
-  std::string const callId = text(message.callid);
   CHostPort const received = sourceOf(message);
   for (ContactRequest const& request : requests) {
     if (request.expires != 0) {
-      add(bindings, request, callId, received);
+      add(bindings, request, message, received);
       continue;
     }
     auto const found = bindings.byContact.find(request.key);
@@ -262,10 +269,37 @@ bool Registrar::authenticated(Exchange& exchange, LS_IIdentity* identity, CNameA
   return false;
 }
 
+Registrar::Order Registrar::order(Bindings const& bindings,
+                                  std::vector<ContactRequest> const& requests,
+                                  bool wildcard,
+                                  pl const& callId,
+                                  uint32_t cseq) {
+  Order verdict = Order::NEW;
+  auto judge = [&](Binding const& binding) {
+    if (pl_strcmp(&callId, binding.callId.c_str()) != 0)
+      return;
+    if (cseq < binding.cseq)
+      verdict = Order::OUT_OF_ORDER;
+    else if (cseq == binding.cseq && verdict == Order::NEW)
+      verdict = Order::RETRANSMITTED;
+  };
+  if (wildcard) {
+    for (auto const& entry : bindings.byContact)
+      judge(*entry.second);
+  }
+  for (ContactRequest const& request : requests) {
+    auto const found = bindings.byContact.find(request.key);
+    if (found != bindings.byContact.end())
+      judge(*found->second);
+  }
+  return verdict;
+}
+
 void Registrar::add(Bindings& bindings,
                     ContactRequest const& request,
-                    std::string const& callId,
+                    sip_msg const& message,
                     CHostPort const& received) {
+  std::string const callId = text(message.callid);
   XCode const added = m_clock.measure([&] {
     return bindings.face->addContact(callId.c_str(), request.contact, received, "", "", 0, request.expires);
   });
@@ -281,6 +315,9 @@ void Registrar::add(Bindings& bindings,
     unschedule(*slot);
   }
   slot->callId = callId;
+  slot->cseq = message.cseq.num;
+  slot->source = message.src;
+  slot->transport = message.tp;
   slot->expiresAtMs = tmr_jiffies() + uint64_t{request.expires} * 1000;
   schedule(*slot);
 }

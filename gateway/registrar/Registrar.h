@@ -25,8 +25,13 @@
 // - A digest response to a nonce this process did not make counts as no
 //   credentials (a fresh 401), one to an expired nonce gets 401 with
 //   stale=true; only a wrong password on a valid nonce gets 403.
-// - A registration whose Call-ID differs from the binding's replaces it; CSeq
-//   ordering is not checked (libre's transactions already drop duplicates).
+// - Stateless, as RFC 3261 section 10.3 lets a registrar be: nothing is kept
+//   for a request until it is authenticated, and its answer leaves without a
+//   server transaction. A contact whose binding has the request's Call-ID
+//   is checked against the binding's CSeq: the same CSeq is a retransmission,
+//   answered again with the bindings in effect and changing nothing; a lower
+//   one fails the whole request with 400 (the section says only that it
+//   fails; 400 is what peers answer). Another Call-ID replaces the binding.
 //
 // Owns the bindings' timers: destroying the registrar removes every binding
 // from its face first, so that the global count of registered contacts
@@ -36,6 +41,7 @@
 #include <map>
 #include <memory>
 #include <string>
+#include <vector>
 
 #include "CNameAddr.h"
 #include "LS_IIdentity.h"
@@ -68,11 +74,15 @@ class Registrar {
   // make every transaction's own timers cost as many steps as there are
   // bindings.
   using Expiries = std::multimap<uint64_t, Binding*>;
+  // What a binding holds: what the registration said and where it came from.
   struct Binding {
     Bindings* owner;
     CNameAddr contact;
     std::string callId;
-    uint64_t expiresAtMs;
+    uint32_t cseq;
+    uint64_t expiresAtMs;       // on the stack's clock, tmr_jiffies()
+    sa source;                  // where the REGISTER came from
+    sip_transp transport;       // and over what
     Expiries::iterator expiry;  // its entry in m_expiries
   };
   // One identity's bindings, by contact text.
@@ -101,9 +111,17 @@ class Registrar {
   // Whether the request carries valid credentials; answers 401 or 403
   // itself when not.
   bool authenticated(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to);
+  // What the request's CSeq makes of it against the bindings it names (all
+  // of them for a wildcard) that carry its Call-ID.
+  enum class Order { NEW, RETRANSMITTED, OUT_OF_ORDER };
+  static Order order(Bindings const& bindings,
+                     std::vector<ContactRequest> const& requests,
+                     bool wildcard,
+                     pl const& callId,
+                     uint32_t cseq);
   void add(Bindings& bindings,
            ContactRequest const& request,
-           std::string const& callId,
+           sip_msg const& message,
            CHostPort const& received);
   // Leaves telling the identity to the caller.
   void removeAll(Bindings& bindings);
