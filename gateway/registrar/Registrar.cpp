@@ -183,7 +183,7 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
   bindings.face = face;
   switch (order(bindings, requests, wildcard, message.callid, message.cseq.num)) {
     case Order::OUT_OF_ORDER:
-      return exchange.answer(400, "CSeq Out of Order");
+      return exchange.answer(400, "Out of Order");
     case Order::RETRANSMITTED:
       return exchange.answer(200, "OK", bindingHeaders(bindings));
     case Order::NEW:
