@@ -15,6 +15,15 @@ void writeToken(pl const& token) {
 
 }  // namespace
 
+RequestLog::~RequestLog() {
+  tmr_cancel(&m_flush);
+  std::fflush(stdout);
+}
+
+void RequestLog::onFlush(void*) {
+  std::fflush(stdout);
+}
+
 void RequestLog::write(sip_msg const& request, std::string const& result, uint16_t code) {
   ++m_requests;
   m_answers.count(request.met, code);
@@ -22,5 +31,6 @@ void RequestLog::write(sip_msg const& request, std::string const& result, uint16
   std::putchar(' ');
   writeToken(request.ruri);
   std::printf(" %s %u\n", result.c_str(), static_cast<unsigned int>(code));
-  std::fflush(stdout);
+  if (!tmr_isrunning(&m_flush))
+    tmr_start(&m_flush, kFlushMs, onFlush, this);
 }

@@ -4,9 +4,9 @@
 #   run-scenario.sh FOLDER/NAME GATEWAY SIPP WORK-DIR [EMULATOR...]
 #
 # NAME's files are in FOLDER (the part of the gateway it checks):
-# registrar/phone: the gateway serves subscribers.script; SIPp plays the
-#          phone of phone.xml against it, and the gateway's request lines
-#          must be exactly phone.out.
+# registrar/phone, registrar/retransmission: the gateway serves
+#          subscribers.script; SIPp plays the phone of NAME.xml against it,
+#          and the gateway's request lines must be exactly NAME.out.
 # trunks/carrier: SIPp plays the carrier's registrar of carrier.xml; the
 #          gateway serves trunk.script with SIPp's address added as the
 #          proxy, must retry after the registrar's 503, report the trunk
@@ -81,11 +81,11 @@ run_sipp() {
 }
 
 case $scenario in
-  phone)
+  phone | retransmission)
     start_gateway "$here/subscribers.script"
     run_sipp -m 1 127.0.0.1:"$gateway_port" || fail "SIPp's phone failed"
     stop_gateway
-    diff -u "$here/phone.out" "$scenario".gateway.out >"$scenario".diff || fail "request lines differ: $(cat "$scenario".diff)"
+    diff -u "$here/$scenario.out" "$scenario".gateway.out >"$scenario".diff || fail "request lines differ: $(cat "$scenario".diff)"
     ;;
   carrier)
     # SIPp needs a port the gateway's script can name: try a few random

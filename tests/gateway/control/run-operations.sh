@@ -195,7 +195,7 @@ case $case in
     timeout 120 "$python" "$here/bad-input.py" "$PWD/control.sock" || fail "bad input on the control socket"
     # phone.xml's first request names erin, whom only changes.script adds.
     run_sipp 2
-    grep -q '^REGISTER sip:example.com ".*" 404$' gateway.out || fail "the gateway no longer answers SIP"
+    await_line gateway.out '^REGISTER sip:example.com ".*" 404$' || fail "the gateway no longer answers SIP"
     stop_gateway
     ;;
   *)
