@@ -1,6 +1,7 @@
 #include "registrar/Registrar.h"
 
 #include <algorithm>
+#include <cctype>
 #include <vector>
 
 #include "LS_CredentialLookup.h"
@@ -263,6 +264,27 @@ void Registrar::dropRemoved(std::vector<LS_IIdentity const*> const& removed, boo
       drop(entry);
     entry = next;
   }
+}
+
+std::vector<Registrar::BindingView> Registrar::bindings(LS_IIdentity const* identity) const {
+  uint64_t const now = tmr_jiffies();
+  std::vector<BindingView> views;
+  for (auto const& entry : m_bindings) {
+    if (identity && entry.first != identity)
+      continue;
+    for (auto const& held : entry.second.byContact) {
+      Binding const& binding = *held.second;
+      char source[80];
+      re_snprintf(source, sizeof source, "%s:%J", sip_transp_name(binding.transport), &binding.source);
+      std::string text = source;
+      std::transform(text.begin(), text.end(), text.begin(),
+                     [](char c) { return static_cast<char>(std::tolower(static_cast<unsigned char>(c))); });
+      views.push_back(BindingView{entry.first, held.first,
+                                  binding.expiresAtMs > now ? binding.expiresAtMs - now : 0, binding.callId,
+                                  std::move(text)});
+    }
+  }
+  return views;
 }
 
 void Registrar::drop(std::map<LS_IIdentity*, Bindings>::iterator entry) {

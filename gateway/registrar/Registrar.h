@@ -76,6 +76,17 @@ class Registrar {
   // service. Bindings of identities that remain are kept as they are.
   void dropRemoved(std::vector<LS_IIdentity const*> const& removed, bool checkAll);
 
+  // One binding as the bindings question shows it.
+  struct BindingView {
+    LS_IIdentity const* identity;
+    std::string contact;  // as the REGISTER wrote it
+    uint64_t remainingMs;
+    std::string callId;
+    std::string source;  // "udp:ADDR:PORT": where the REGISTER came from
+  };
+  // The bindings held now; only the identity's when one is given.
+  std::vector<BindingView> bindings(LS_IIdentity const* identity) const;
+
  private:
   struct Bindings;
   struct Binding;

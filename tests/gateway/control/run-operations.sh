@@ -129,6 +129,12 @@ case $case in
     grep -q "^event: example.com/erin registered inbound$" watch.out || fail "the watcher saw no registration"
     grep -q "^event: example.com/alice registered inbound$" watch.out || fail "the watcher missed alice"
 
+    # The bindings question: erin's contact, with what it came with.
+    console --connect control.sock - >bindings.out 2>bindings.err <<<"bindings example.com erin" ||
+      fail "bindings failed: $(cat bindings.err)"
+    grep -Eq '^example.com/erin <sip:erin@127.0.0.1:[0-9]+> expires in (1[01][0-9]|120) s, Call-ID [^,]+, from udp:127.0.0.1:[0-9]+$' \
+      bindings.out || fail "erin's binding is not shown: $(cat bindings.out)"
+
     # The autosave (at most a second after the change) rebuilds the dump.
     sleep 1.5
     printf 'dump\n' >dump.script
