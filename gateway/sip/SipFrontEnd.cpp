@@ -70,8 +70,11 @@ bool SipFrontEnd::start(std::string const& listen, std::string& bound, std::stri
   m_session.stack().localHostPorts.add(own);
   m_trunks = std::make_unique<TrunkRegistrations>(*m_stack, m_session, m_clock);
   m_trunks->start();
-  m_changes = std::make_unique<ModelChanges>(*m_session.locationMaster());
   return true;
+}
+
+void SipFrontEnd::followChanges() {
+  m_changes = std::make_unique<ModelChanges>(*m_session.locationMaster());
 }
 
 void SipFrontEnd::beginChange() {

@@ -42,8 +42,12 @@ class SipFrontEnd {
 
   unsigned long requests() const { return m_log.requests(); }
 
-  // Around a change made while serving (a control line): the registrar
-  // drops the bindings of identities it removed, the trunks follow.
+  // Makes the gateway ready for changes while it serves (--control): from
+  // then on it observes every identity, which a gateway never changed
+  // need not pay for. Around each change (a control line), beginChange()
+  // and endChange(): the registrar drops the bindings of identities it
+  // removed, the trunks follow.
+  void followChanges();
   void beginChange();
   void endChange();
   GatewayStatistics statistics() const;
