@@ -140,7 +140,7 @@ while [ -z "$address" ]; do
     exit 1
   fi
   sleep 0.2
-  address=$(sed -n 's/^location-gateway: listening on udp:\(.*\)$/\1/p' gateway.err)
+  address=$(sed -n 's/^location-gateway: listening on udp:\([^ ]*\).*$/\1/p' gateway.err)
 done
 load_seconds=$((SECONDS - load_start))
 load_ticks=$(gateway_ticks)

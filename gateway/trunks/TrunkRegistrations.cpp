@@ -11,6 +11,18 @@
 
 namespace {
 
+// Why a request of the trunk found no registrar: libre reports a name
+// without any address as "destination address required".
+std::string failureCause(int error, std::string const& host) {
+  sa numeric;
+  bool const named = !host.empty() && host[0] != '[' && sa_set_str(&numeric, host.c_str(), 0) != 0;
+  if (named && error == EDESTADDRREQ)
+    return host + " does not resolve";
+  if (named)
+    return "resolving " + host + ": " + std::strerror(error);
+  return std::strerror(error);
+}
+
 std::string hostPortText(CHostPort const& hostPort) {
   std::string text = hostPort.GetHost().c_str();
   if (hostPort.GetPort() != 0)
@@ -23,6 +35,13 @@ std::string hostPortText(CHostPort const& hostPort) {
 void TrunkRegistrations::report(std::string const& line) {
   m_session.flushDebugLines();
   std::cerr << "location-gateway: " << line << std::endl;
+}
+
+void TrunkRegistrations::reportFailure(Trunk& trunk, std::string const& failure, unsigned int seconds) {
+  if (failure == trunk.lastFailure)
+    return;
+  trunk.lastFailure = failure;
+  report(failure + ", retrying in " + std::to_string(seconds) + " s");
 }
 
 TrunkRegistrations::~TrunkRegistrations() {
@@ -69,6 +88,7 @@ void TrunkRegistrations::findTrunk(LS_IIdentity* identity, std::string const& pa
   trunk->user = identity->getName().str();
   char const* const scheme = face->getUriScheme() == LS_UriScheme::SIPS ? "sips:" : "sip:";
   trunk->registrarUri = scheme + hostPortText(registrar);
+  trunk->nextHop = registrar.GetHost().c_str();
   trunk->addressOfRecord = scheme + trunk->user + "@" + registrar.GetHost().c_str();
   trunk->lifetime = face->getLifetime();
   RefPtr<LS_IOutbound> outbound;
@@ -77,8 +97,10 @@ void TrunkRegistrations::findTrunk(LS_IIdentity* identity, std::string const& pa
   CHostPort tlsProxy;
   bool strictRoute = false;
   if (outbound && outbound->getNumberOfProxies() != 0 &&
-      outbound->getProxy(0, proxy, tlsProxy, strictRoute).isSuccess() && !proxy.GetHost().isEmpty())
+      outbound->getProxy(0, proxy, tlsProxy, strictRoute).isSuccess() && !proxy.GetHost().isEmpty()) {
     trunk->route = scheme + hostPortText(proxy);
+    trunk->nextHop = proxy.GetHost().c_str();
+  }
   tmr_init(&trunk->timer);
   m_trunks.push_back(std::move(trunk));
 }
@@ -92,9 +114,12 @@ void TrunkRegistrations::registerTrunk(Trunk& trunk) {
                       0, onChallenge, &trunk, false, onResponse, &trunk, nullptr, nullptr);
   if (error == 0)
     return;
-  report("trunk " + trunk.path + " cannot register at " + trunk.registrarUri + ": " + std::strerror(error));
-  trunk.retryMs =
-      uint64_t{m_clock.measure([&] { return trunk.face->getRetryTimeoutOnSystemError(); })} * 1000;
+  unsigned int const seconds = m_clock.measure([&] { return trunk.face->getRetryTimeoutOnSystemError(); });
+  reportFailure(trunk,
+                "trunk " + trunk.path + " cannot register at " + trunk.registrarUri + ": " +
+                    failureCause(error, trunk.nextHop),
+                seconds);
+  trunk.retryMs = uint64_t{seconds} * 1000;
   tmr_start(&trunk.timer, trunk.retryMs, onRetry, &trunk);
 }
 
@@ -132,6 +157,7 @@ void TrunkRegistrations::onResponse(int error, sip_msg const* response, void* ar
     registrar.Parse(address, std::char_traits<char>::length(address));
     clock.measure([&] { trunk.face->setRegistrarAddr(registrar); });
     trunk.registered = true;
+    trunk.lastFailure.clear();
     std::string transport = sip_transp_name(response->tp);
     std::transform(transport.begin(), transport.end(), transport.begin(),
                    [](char c) { return static_cast<char>(std::tolower(static_cast<unsigned char>(c))); });
@@ -144,7 +170,7 @@ void TrunkRegistrations::onResponse(int error, sip_msg const* response, void* ar
   std::string cause;
   if (error != 0 || !response) {
     seconds = clock.measure([&] { return trunk.face->getRetryTimeoutOnSystemError(); });
-    cause = std::strerror(error);
+    cause = failureCause(error, trunk.nextHop);
   } else if (response->scode >= 500 && response->scode < 600) {
     seconds = clock.measure([&] { return trunk.face->getRetryTimeoutOnServerError(); });
     cause = std::to_string(response->scode);
@@ -152,8 +178,7 @@ void TrunkRegistrations::onResponse(int error, sip_msg const* response, void* ar
     seconds = clock.measure([&] { return trunk.face->getRetryTimeoutOnClientError(); });
     cause = std::to_string(response->scode);
   }
-  owner.report("trunk " + trunk.path + " failed to register (" + cause + "), retrying in " +
-               std::to_string(seconds) + " s");
+  owner.reportFailure(trunk, "trunk " + trunk.path + " failed to register (" + cause + ")", seconds);
   trunk.retryMs = uint64_t{seconds} * 1000;
   tmr_start(&trunk.timer, 0, onDropFailed, &trunk);
 }

@@ -13,7 +13,14 @@
 // failure), server (5xx) or client (any other final failure, 4xx and 6xx),
 // instead of sipreg's own back-off, so that the configuration decides. The
 // registrar's address (where the 2xx came from) is recorded with
-// setRegistrarAddr. Progress goes to standard error, one line per event.
+// setRegistrarAddr. Progress goes to standard error, one line per event; a
+// failure like the one before it is not told again, so that a carrier whose
+// name does not resolve, retried every few seconds for days, leaves one line
+// and not thousands.
+//
+// A registrar or proxy named by host name is found by the stack's DNS client
+// (RFC 3263), anew for every REGISTER sipreg sends, refreshes included, so
+// that a carrier moving its servers is followed without a restart.
 //
 // stop() unregisters: it drops every sipreg, which sends its REGISTER with
 // expiry 0 and lives on inside libre until answered; the caller then lets the
@@ -54,6 +61,11 @@ class TrunkRegistrations {
     std::string registrarUri;
     std::string addressOfRecord;
     std::string route;
+    // The host the stack resolves: the proxy's when there is one, else the
+    // registrar's.
+    std::string nextHop;
+    // The last failure reported, empty once registered.
+    std::string lastFailure;
     uint32_t lifetime;
     sipreg* registration = nullptr;
     bool registered = false;
@@ -67,6 +79,8 @@ class TrunkRegistrations {
   void registerTrunk(Trunk& trunk);
   // One progress line on standard error, after the library's debug lines.
   void report(std::string const& line);
+  // failure, with the retry time, unless it is the trunk's last one.
+  void reportFailure(Trunk& trunk, std::string const& failure, unsigned int seconds);
   static int onChallenge(char** user, char** password, char const* realm, void* trunk);
   static void onResponse(int error, sip_msg const* response, void* trunk);
   static void onDropFailed(void* trunk);

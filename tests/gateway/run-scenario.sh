@@ -11,6 +11,12 @@
 #          gateway serves trunk.script with SIPp's address added as the
 #          proxy, must retry after the registrar's 503, report the trunk
 #          registered there, and on SIGTERM unregister it.
+# trunks/dns: SIPp plays the carrier's registrar of dns.xml, and dnsmasq
+#          the DNS server that alone tells where it is (NAPTR, SRV and A
+#          records for carrier.example); the gateway serves trunk.script and
+#          lost.script and asks only that server: the trunk must register by
+#          name, and the lost trunk's unresolvable name be told once though
+#          retried every second.
 #
 # The gateway runs through EMULATOR when one is given (qemu-user for a
 # cross build); SIPp always runs natively. Every process is bounded in time,
@@ -43,9 +49,11 @@ fail() {
 
 gateway_pid=
 sipp_pid=
+dns_pid=
 cleanup() {
   [[ -n $gateway_pid ]] && kill -KILL "$gateway_pid" 2>/dev/null
   [[ -n $sipp_pid ]] && kill -KILL "$sipp_pid" 2>/dev/null
+  [[ -n $dns_pid ]] && kill -KILL "$dns_pid" 2>/dev/null
 }
 trap cleanup EXIT
 
@@ -63,7 +71,7 @@ await_line() {
 start_gateway() {
   "${emulator[@]}" "$gateway" --listen 127.0.0.1:0 "$@" >"$scenario".gateway.out 2>"$scenario".gateway.err &
   gateway_pid=$!
-  await_line "$scenario".gateway.err "listening on udp:" || fail "the gateway did not start"
+  await_line "$scenario".gateway.err "listening on " || fail "the gateway did not start"
   gateway_port=$(sed -n 's/.*listening on udp:127\.0\.0\.1:\([0-9]*\).*/\1/p' "$scenario".gateway.err)
 }
 
@@ -80,6 +88,29 @@ run_sipp() {
     -timeout_error -nostdin -trace_err "$@" >"$scenario".sipp.log 2>&1
 }
 
+# Starts SIPp as the carrier's registrar on a port the gateway's script or
+# DNS can name, in port: tries a few random ones, since one may be taken.
+start_registrar() {
+  for attempt in 1 2 3 4 5; do
+    port=$((20000 + RANDOM % 30000))
+    run_sipp -m "$1" -p "$port" &
+    sipp_pid=$!
+    sleep 0.5
+    kill -0 "$sipp_pid" 2>/dev/null && return 0
+    wait "$sipp_pid"
+    sipp_pid=
+  done
+  fail "SIPp found no free port"
+}
+
+# Waits for SIPp's registrar to end its calls; it must pass.
+await_registrar() {
+  local status=0
+  wait "$sipp_pid" || status=$?
+  sipp_pid=
+  ((status == 0)) || fail "SIPp's registrar failed ($status)"
+}
+
 case $scenario in
   phone)
     start_gateway "$here/subscribers.script"
@@ -88,18 +119,7 @@ case $scenario in
     diff -u "$here/phone.out" "$scenario".gateway.out >"$scenario".diff || fail "request lines differ: $(cat "$scenario".diff)"
     ;;
   carrier)
-    # SIPp needs a port the gateway's script can name: try a few random
-    # ones, since one may be taken.
-    for attempt in 1 2 3 4 5; do
-      port=$((20000 + RANDOM % 30000))
-      run_sipp -m 2 -p "$port" &
-      sipp_pid=$!
-      sleep 0.5
-      kill -0 "$sipp_pid" 2>/dev/null && break
-      wait "$sipp_pid"
-      sipp_pid=
-    done
-    [[ -n $sipp_pid ]] || fail "SIPp found no free port"
+    start_registrar 2
     echo "face example.com trunk registration-outbound proxy insert 0 127.0.0.1:$port loose" >"$scenario".proxy.script
     start_gateway "$here/trunk.script" "$scenario".proxy.script
     await_line "$scenario".gateway.err "trunk example.com/trunk registered at udp:127.0.0.1:$port for 300 s" ||
@@ -108,10 +128,39 @@ case $scenario in
       fail "the trunk did not retry after the server error"
     stop_gateway
     grep -q "trunk example.com/trunk unregistering" "$scenario".gateway.err || fail "the trunk was not unregistered"
-    status=0
-    wait "$sipp_pid" || status=$?
-    sipp_pid=
-    ((status == 0)) || fail "SIPp's registrar failed ($status)"
+    await_registrar
+    ;;
+  dns)
+    start_registrar 1
+    # The DNS server on a free loopback port, knowing nothing but the
+    # carrier; as for SIPp, a few random ports.
+    for attempt in 1 2 3 4 5; do
+      dns_port=$((20000 + RANDOM % 30000))
+      "${DNSMASQ:-dnsmasq}" --keep-in-foreground --conf-file=/dev/null --no-resolv --no-hosts --pid-file= --user= \
+        --listen-address=127.0.0.1 --bind-interfaces --port="$dns_port" --local=/example/ \
+        --naptr-record=carrier.example,10,10,S,SIP+D2U,,_sip._udp.carrier.example \
+        --srv-host=_sip._udp.carrier.example,registrar.carrier.example,"$port" \
+        --host-record=registrar.carrier.example,127.0.0.1 >"$scenario".dns.log 2>&1 &
+      dns_pid=$!
+      sleep 0.5
+      kill -0 "$dns_pid" 2>/dev/null && break
+      wait "$dns_pid"
+      dns_pid=
+    done
+    [[ -n $dns_pid ]] || fail "dnsmasq found no free port"
+    start_gateway --dns-server 127.0.0.1:"$dns_port" "$here/trunk.script" "$here/lost.script"
+    await_line "$scenario".gateway.err "trunk example.com/trunk registered at udp:127.0.0.1:$port for 300 s" ||
+      fail "the trunk did not register by name"
+    lost="trunk example.com/lost failed to register (nowhere.example does not resolve), retrying in 1 s"
+    await_line "$scenario".gateway.err "$lost" || fail "the unresolvable name was not told"
+    # Two more retries at least.
+    sleep 2.5
+    stop_gateway
+    (($(grep -c -F "$lost" "$scenario".gateway.err) == 1)) || fail "the unresolvable name was told more than once"
+    await_registrar
+    kill -TERM "$dns_pid"
+    wait "$dns_pid"
+    dns_pid=
     ;;
   *)
     fail "no such scenario"
