@@ -33,6 +33,10 @@ class Exchange {
   // refuses, else 404.
   RefPtr<LS_IIdentity> resolveOrAnswer(pl const& uri, CNameAddr& nameAddr);
 
+  // What the log line says about the lookup, for a part that looked
+  // without resolveOrAnswer: "service/identity" or the error text in quotes.
+  void setResult(std::string result) { m_result = std::move(result); }
+
   // headers: complete header lines, each ending in CRLF.
   void answer(uint16_t code, char const* reason, std::string const& headers = std::string());
 

@@ -2,11 +2,10 @@
 
 #include <cstring>
 
+#include "sip/Capabilities.h"
 #include "sip/Exchange.h"
 
 namespace {
-
-char const kAllow[] = "Allow: REGISTER, INVITE, ACK, CANCEL, MESSAGE, SUBSCRIBE, OPTIONS\r\n";
 
 // Hash table sizes of the stack: client transactions, server transactions,
 // TCP connections. A server transaction outlives its answer by 32 s over
@@ -81,13 +80,10 @@ bool SipFrontEnd::onRequest(sip_msg const* request, void* argument) {
   if (pl_strcmp(&message.met, "ACK") == 0)
     return true;
   Exchange exchange(*frontEnd.m_stack, message, frontEnd.m_session, frontEnd.m_log, frontEnd.m_clock);
+  if (frontEnd.m_admission.answered(exchange))
+    return true;
   if (pl_strcmp(&message.met, "REGISTER") == 0) {
     frontEnd.m_registrar.handle(exchange);
-    return true;
-  }
-  bool const toUser = message.uri.user.l != 0;
-  if (pl_strcmp(&message.met, "OPTIONS") == 0 && !toUser) {
-    exchange.answer(200, "OK", kAllow);
     return true;
   }
   if (pl_strcmp(&message.met, "CANCEL") == 0) {
@@ -99,7 +95,7 @@ bool SipFrontEnd::onRequest(sip_msg const* request, void* argument) {
     frontEnd.m_redirector.handle(exchange);
     return true;
   }
-  exchange.answer(405, "Method Not Allowed", kAllow);
+  exchange.answer(405, "Method Not Allowed", Capabilities::kAllow);
   return true;
 }
 

@@ -1,8 +1,8 @@
 // SipFrontEnd: the SIP side of the gateway on libre: the stack with its
 // transports, the listener that hands each request to the part that answers
-// its method (Registrar for REGISTER, Redirector for requests to a user, 200
-// for OPTIONS to the gateway itself, 405 with Allow for the rest), and the
-// trunk registrations. Malformed messages never reach it: libre drops what it
+// it (Admission first, for what the gateway answers itself; then Registrar
+// for REGISTER, Redirector for requests to a user, 405 with Allow for the
+// rest), and the trunk registrations. Malformed messages never reach it: libre drops what it
 // cannot parse, and every length read here is bounded by the parts.
 //
 // Built after the scripts have run; every address listened on joins the
@@ -20,6 +20,7 @@
 #include "metrics/LibraryClock.h"
 #include "redirect/Redirector.h"
 #include "registrar/Registrar.h"
+#include "sip/Admission.h"
 #include "sip/DnsClient.h"
 #include "sip/Libre.h"
 #include "sip/Listeners.h"
@@ -29,7 +30,7 @@
 class SipFrontEnd {
  public:
   SipFrontEnd(ScriptSession& session, LibraryClock& clock)
-      : m_session(session), m_clock(clock), m_registrar(clock) {}
+      : m_session(session), m_clock(clock), m_registrar(clock), m_admission(m_listeners) {}
   ~SipFrontEnd();
   SipFrontEnd(SipFrontEnd const&) = delete;
   SipFrontEnd& operator=(SipFrontEnd const&) = delete;
@@ -65,6 +66,7 @@ class SipFrontEnd {
   Redirector m_redirector;
   DnsClient m_dns;
   Listeners m_listeners;
+  Admission m_admission;
   sip* m_stack = nullptr;
   sip_lsnr* m_listener = nullptr;
   std::unique_ptr<TrunkRegistrations> m_trunks;

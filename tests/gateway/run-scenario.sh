@@ -7,6 +7,10 @@
 # registrar/phone: the gateway serves subscribers.script; SIPp plays the
 #          phone of phone.xml against it, and the gateway's request lines
 #          must be exactly phone.out.
+# sip/protocol: the gateway serves protocol.script on IPv4 and IPv6
+#          loopback; SIPp plays protocol.xml over each in turn, and the
+#          gateway's request lines must be protocol.out twice, GATEWAY
+#          standing for its address of each run.
 # trunks/carrier: SIPp plays the carrier's registrar of carrier.xml; the
 #          gateway serves trunk.script with SIPp's address added as the
 #          proxy, must retry after the registrar's 503, report the trunk
@@ -68,11 +72,14 @@ await_line() {
   return 1
 }
 
+# Starts the gateway on a free IPv4 loopback port, gateway_port, and with
+# "--listen [::1]:0" among the arguments also an IPv6 one, gateway_port6.
 start_gateway() {
   "${emulator[@]}" "$gateway" --listen 127.0.0.1:0 "$@" >"$scenario".gateway.out 2>"$scenario".gateway.err &
   gateway_pid=$!
   await_line "$scenario".gateway.err "listening on " || fail "the gateway did not start"
-  gateway_port=$(sed -n 's/.*listening on udp:127\.0\.0\.1:\([0-9]*\).*/\1/p' "$scenario".gateway.err)
+  gateway_port=$(sed -n 's/.* udp:127\.0\.0\.1:\([0-9]*\).*/\1/p' "$scenario".gateway.err)
+  gateway_port6=$(sed -n 's/.* udp:\[::1\]:\([0-9]*\).*/\1/p' "$scenario".gateway.err)
 }
 
 stop_gateway() {
@@ -83,8 +90,10 @@ stop_gateway() {
   ((status == 0)) || fail "the gateway exited with $status after SIGTERM"
 }
 
+# SIPp's own address; ::1 for IPv6.
+sipp_address=127.0.0.1
 run_sipp() {
-  timeout $((sipp_limit + 5)) "$sipp" -sf "$here/$scenario.xml" -i 127.0.0.1 -timeout "${sipp_limit}s" \
+  timeout $((sipp_limit + 5)) "$sipp" -sf "$here/$scenario.xml" -i "$sipp_address" -timeout "${sipp_limit}s" \
     -timeout_error -nostdin -trace_err "$@" >"$scenario".sipp.log 2>&1
 }
 
@@ -117,6 +126,17 @@ case $scenario in
     run_sipp -m 1 127.0.0.1:"$gateway_port" || fail "SIPp's phone failed"
     stop_gateway
     diff -u "$here/phone.out" "$scenario".gateway.out >"$scenario".diff || fail "request lines differ: $(cat "$scenario".diff)"
+    ;;
+  protocol)
+    start_gateway --listen "[::1]:0" "$here/protocol.script"
+    [[ -n $gateway_port6 ]] || fail "the gateway does not listen on [::1]"
+    run_sipp -m 1 127.0.0.1:"$gateway_port" || fail "SIPp failed over IPv4"
+    sed "s/GATEWAY/127.0.0.1:$gateway_port/g" "$here/protocol.out" >"$scenario".expected
+    sipp_address=::1
+    run_sipp -m 1 "[::1]:$gateway_port6" || fail "SIPp failed over IPv6"
+    sed "s/GATEWAY/[::1]:$gateway_port6/g" "$here/protocol.out" >>"$scenario".expected
+    stop_gateway
+    diff -u "$scenario".expected "$scenario".gateway.out >"$scenario".diff || fail "request lines differ: $(cat "$scenario".diff)"
     ;;
   carrier)
     start_registrar 2
