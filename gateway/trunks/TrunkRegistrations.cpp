@@ -102,6 +102,7 @@ void TrunkRegistrations::findTrunk(LS_IIdentity* identity, std::string const& pa
     trunk->nextHop = proxy.GetHost().c_str();
   }
   tmr_init(&trunk->timer);
+  trunk->keepAlive = std::make_unique<TrunkKeepAlive>(m_stack, onKeepAliveFailed, trunk.get());
   m_trunks.push_back(std::move(trunk));
 }
 
@@ -163,9 +164,17 @@ void TrunkRegistrations::onResponse(int error, sip_msg const* response, void* ar
                    [](char c) { return static_cast<char>(std::tolower(static_cast<unsigned char>(c))); });
     owner.report("trunk " + trunk.path + " registered at " + transport + ":" + address + " for " +
                  std::to_string(trunk.lifetime) + " s");
+    LS_KeepAliveMethod::Type method = LS_KeepAliveMethod::NONE;
+    unsigned int interval = 0;
+    clock.measure([&] {
+      method = trunk.face->getKeepAliveMethod();
+      interval = trunk.face->getKeepAliveInterval();
+    });
+    trunk.keepAlive->start(*response, method, interval, trunk.registrarUri, trunk.addressOfRecord);
     return;
   }
   trunk.registered = false;
+  trunk.keepAlive->stop();
   unsigned int seconds;
   std::string cause;
   if (error != 0 || !response) {
@@ -189,6 +198,18 @@ void TrunkRegistrations::onDropFailed(void* argument) {
   tmr_start(&trunk.timer, trunk.retryMs, onRetry, &trunk);
 }
 
+void TrunkRegistrations::onKeepAliveFailed(int error, void* argument) {
+  Trunk& trunk = *static_cast<Trunk*>(argument);
+  TrunkRegistrations& owner = *trunk.owner;
+  unsigned int const seconds =
+      owner.m_clock.measure([&] { return trunk.face->getRetryTimeoutOnSystemError(); });
+  trunk.registered = false;
+  owner.reportFailure(trunk, "trunk " + trunk.path + " lost its registrar (" + std::strerror(error) + ")",
+                      seconds);
+  trunk.retryMs = uint64_t{seconds} * 1000;
+  tmr_start(&trunk.timer, 0, onDropFailed, &trunk);
+}
+
 void TrunkRegistrations::onRetry(void* argument) {
   Trunk& trunk = *static_cast<Trunk*>(argument);
   trunk.owner->registerTrunk(trunk);
@@ -197,6 +218,7 @@ void TrunkRegistrations::onRetry(void* argument) {
 void TrunkRegistrations::stop() {
   for (std::unique_ptr<Trunk> const& trunk : m_trunks) {
     tmr_cancel(&trunk->timer);
+    trunk->keepAlive->stop();
     if (trunk->registered)
       report("trunk " + trunk->path + " unregistering");
     trunk->registered = false;

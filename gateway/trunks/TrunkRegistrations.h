@@ -20,7 +20,10 @@
 //
 // A registrar or proxy named by host name is found by the stack's DNS client
 // (RFC 3263), anew for every REGISTER sipreg sends, refreshes included, so
-// that a carrier moving its servers is followed without a restart.
+// that a carrier moving its servers is followed without a restart. Between
+// registrations a TrunkKeepAlive keeps the path to the registrar open as
+// the face's keep-alive settings say; when it finds the registrar gone, the
+// trunk registers anew after the retry timeout for system errors.
 //
 // stop() unregisters: it drops every sipreg, which sends its REGISTER with
 // expiry 0 and lives on inside libre until answered; the caller then lets the
@@ -38,6 +41,7 @@
 #include "ScriptSession.h"
 #include "metrics/LibraryClock.h"
 #include "sip/Libre.h"
+#include "trunks/TrunkKeepAlive.h"
 
 class TrunkRegistrations {
  public:
@@ -73,6 +77,7 @@ class TrunkRegistrations {
     // retryMs and registers anew.
     tmr timer;
     uint64_t retryMs = 0;
+    std::unique_ptr<TrunkKeepAlive> keepAlive;
   };
 
   void findTrunk(LS_IIdentity* identity, std::string const& path);
@@ -84,6 +89,7 @@ class TrunkRegistrations {
   static int onChallenge(char** user, char** password, char const* realm, void* trunk);
   static void onResponse(int error, sip_msg const* response, void* trunk);
   static void onDropFailed(void* trunk);
+  static void onKeepAliveFailed(int error, void* trunk);
   static void onRetry(void* trunk);
 
   sip& m_stack;

@@ -18,8 +18,10 @@
 # trunks/dns: SIPp plays the carrier's registrar of dns.xml, and dnsmasq
 #          the DNS server that alone tells where it is (NAPTR, SRV and A
 #          records for carrier.example); the gateway serves trunk.script and
-#          lost.script and asks only that server: the trunk must register by
-#          name, and the lost trunk's unresolvable name be told once though
+#          by-name.script and asks only that server: the trunk must register
+#          by name and keep the path open with an OPTIONS a second (new
+#          calls to SIPp, which, held to one call, logs them unanswered),
+#          and the lost trunk's unresolvable name be told once though
 #          retried every second.
 #
 # The gateway runs through EMULATOR when one is given (qemu-user for a
@@ -99,10 +101,11 @@ run_sipp() {
 
 # Starts SIPp as the carrier's registrar on a port the gateway's script or
 # DNS can name, in port: tries a few random ones, since one may be taken.
+# Arguments: SIPp's.
 start_registrar() {
   for attempt in 1 2 3 4 5; do
     port=$((20000 + RANDOM % 30000))
-    run_sipp -m "$1" -p "$port" &
+    run_sipp "$@" -p "$port" &
     sipp_pid=$!
     sleep 0.5
     kill -0 "$sipp_pid" 2>/dev/null && return 0
@@ -139,7 +142,7 @@ case $scenario in
     diff -u "$scenario".expected "$scenario".gateway.out >"$scenario".diff || fail "request lines differ: $(cat "$scenario".diff)"
     ;;
   carrier)
-    start_registrar 2
+    start_registrar -m 2
     echo "face example.com trunk registration-outbound proxy insert 0 127.0.0.1:$port loose" >"$scenario".proxy.script
     start_gateway "$here/trunk.script" "$scenario".proxy.script
     await_line "$scenario".gateway.err "trunk example.com/trunk registered at udp:127.0.0.1:$port for 300 s" ||
@@ -151,7 +154,7 @@ case $scenario in
     await_registrar
     ;;
   dns)
-    start_registrar 1
+    start_registrar -m 1 -trace_msg -message_file "$scenario".messages.log
     # The DNS server on a free loopback port, knowing nothing but the
     # carrier; as for SIPp, a few random ports.
     for attempt in 1 2 3 4 5; do
@@ -168,7 +171,7 @@ case $scenario in
       dns_pid=
     done
     [[ -n $dns_pid ]] || fail "dnsmasq found no free port"
-    start_gateway --dns-server 127.0.0.1:"$dns_port" "$here/trunk.script" "$here/lost.script"
+    start_gateway --dns-server 127.0.0.1:"$dns_port" "$here/trunk.script" "$here/by-name.script"
     await_line "$scenario".gateway.err "trunk example.com/trunk registered at udp:127.0.0.1:$port for 300 s" ||
       fail "the trunk did not register by name"
     lost="trunk example.com/lost failed to register (nowhere.example does not resolve), retrying in 1 s"
@@ -178,6 +181,8 @@ case $scenario in
     stop_gateway
     (($(grep -c -F "$lost" "$scenario".gateway.err) == 1)) || fail "the unresolvable name was told more than once"
     await_registrar
+    (($(grep -c "^OPTIONS sip:carrier.example SIP/2.0" "$scenario".messages.log) >= 2)) ||
+      fail "the trunk sent no keep-alive every second"
     kill -TERM "$dns_pid"
     wait "$dns_pid"
     dns_pid=
