@@ -8,22 +8,6 @@ std::string text(pl const& value) {
   return std::string(value.p, value.l);
 }
 
-// A delta-seconds value; one beyond 32 bits saturates (RFC 3261 asks to
-// take such a value as the largest). False for anything but digits.
-bool parseSeconds(pl const& value, uint32_t& seconds) {
-  if (value.l == 0)
-    return false;
-  uint64_t total = 0;
-  for (size_t i = 0; i < value.l; ++i) {
-    char const c = value.p[i];
-    if (c < '0' || c > '9')
-      return false;
-    total = std::min<uint64_t>(total * 10 + static_cast<uint64_t>(c - '0'), UINT32_MAX);
-  }
-  seconds = static_cast<uint32_t>(total);
-  return true;
-}
-
 // qvalue = ( "0" [ "." 0*3DIGIT ] ) / ( "1" [ "." 0*3("0") ] ), in
 // thousandths.
 bool parseQ(pl const& value, unsigned int& thousandths) {
@@ -55,7 +39,7 @@ int readParameter(pl const* name, pl const* value, void* argument) {
   Reading& reading = *static_cast<Reading*>(argument);
   ContactHeader& contact = *reading.contact;
   if (pl_strcasecmp(name, "expires") == 0) {
-    reading.malformed = reading.malformed || !parseSeconds(*value, contact.expires);
+    reading.malformed = reading.malformed || !ContactHeader::parseSeconds(*value, contact.expires);
     contact.hasExpires = true;
     return 0;
   }
@@ -85,4 +69,18 @@ bool ContactHeader::parse(pl const& value, ContactHeader& contact) {
   if (pl_isset(&address.params) && uri_params_apply(&address.params, readParameter, &reading) != 0)
     return false;
   return !reading.malformed;
+}
+
+bool ContactHeader::parseSeconds(pl const& value, uint32_t& seconds) {
+  if (value.l == 0)
+    return false;
+  uint64_t total = 0;
+  for (size_t i = 0; i < value.l; ++i) {
+    char const c = value.p[i];
+    if (c < '0' || c > '9')
+      return false;
+    total = std::min<uint64_t>(total * 10 + static_cast<uint64_t>(c - '0'), UINT32_MAX);
+  }
+  seconds = static_cast<uint32_t>(total);
+  return true;
 }

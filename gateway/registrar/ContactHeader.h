@@ -38,4 +38,8 @@ struct ContactHeader {
   // value: one contact, as libre splits a Contact header at its commas.
   // False when it is malformed (see above).
   static bool parse(pl const& value, ContactHeader& contact);
+  // A delta-seconds value, as expires and the Expires header give it; one
+  // beyond 32 bits saturates (RFC 3261 asks to take such a value as the
+  // largest). False for anything but digits.
+  static bool parseSeconds(pl const& value, uint32_t& seconds);
 };
