@@ -181,6 +181,14 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
   bindings.identity = identity;
   bindings.dynamic = bindings.dynamic || created;
   bindings.face = face;
+  switch (order(bindings, requests, wildcard, message.callid, message.cseq.num)) {
+    case Order::OUT_OF_ORDER:
+      return exchange.answer(400, "Out of Order");
+    case Order::RETRANSMITTED:
+      return exchange.answer(200, "OK", bindingHeaders(bindings));
+    case Order::NEW:
+      break;
+  }
   size_t const before = bindings.byContact.size();
   size_t added = 0;
   for (ContactRequest const& request : requests)
@@ -190,11 +198,10 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
 
   if (wildcard)
     removeAll(bindings);
-  std::string const callId = text(message.callid);
   CHostPort const received = sourceOf(message);
   for (ContactRequest const& request : requests) {
     if (request.expires != 0) {
-      add(bindings, request, callId, received);
+      add(bindings, request, message, received);
       continue;
     }
     auto const found = bindings.byContact.find(request.key);
@@ -206,52 +213,22 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
 }
 
 bool Registrar::authenticated(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to) {
+  bool stale = false;
+  if (checkCredentials(exchange.request(), identity, to, nullptr, stale) > 0)
+    return true;
   String error;
   Vector<LS_ProtocolRealm> realms;
   m_clock.measure([&] { LS_getInboundAuthenticationChallenge(error, realms, identity, nullptr); });
   if (realms.isEmpty())
     return true;
-
-  sip_msg const& message = exchange.request();
-  uint64_t const now = tmr_jiffies();
-  bool stale = false;
-  unsigned int looked = 0;
-  int verdict = 0;  // 1 accepted, -1 refused, 0 no usable credentials
-  forEachHeader(message, SIP_HDR_AUTHORIZATION, [&](sip_hdr const& header) {
-    httpauth_digest_resp response;
-    if (++looked > kMaximumAuthorizations)
-      return false;
-    if (httpauth_digest_response_decode(&response, &header.val) != 0 ||
-        response.username.l > kMaximumUserName)
-      return true;
-    auto const realm = std::find_if(realms.begin(), realms.end(), [&](LS_ProtocolRealm const& candidate) {
-      return pl_strcmp(&response.realm, candidate.realm.c_str()) == 0;
-    });
-    if (realm == realms.end())
-      return true;
-    NonceGenerator::Check const check = m_nonces.check(response.nonce, response.realm, now);
-    if (check != NonceGenerator::Check::VALID) {
-      stale = stale || check == NonceGenerator::Check::STALE;
-      return true;
-    }
-    Vector<String> passwords;
-    String const user(response.username.p, response.username.l);
-    m_clock.measure([&] {
-      LS_getInboundAuthenticationResponse(error, passwords, identity, to, realm->protocol, realm->realm, user,
-                                          nullptr);
-    });
-    bool const matches = std::any_of(passwords.begin(), passwords.end(), [&](String const& password) {
-      return digestResponseMatches(response, message.met, password.c_str());
-    });
-    verdict = matches ? 1 : -1;
-    return false;
-  });
+  int const verdict = checkCredentials(exchange.request(), identity, to, &realms, stale);
   if (verdict > 0)
     return true;
   if (verdict < 0) {
     exchange.answer(403, "Forbidden");
     return false;
   }
+  uint64_t const now = tmr_jiffies();
   std::string challenges;
   for (LS_ProtocolRealm const& realm : realms) {
     pl name;
@@ -262,10 +239,82 @@ bool Registrar::authenticated(Exchange& exchange, LS_IIdentity* identity, CNameA
   return false;
 }
 
+int Registrar::checkCredentials(sip_msg const& message,
+                                LS_IIdentity* identity,
+                                CNameAddr const& to,
+                                Vector<LS_ProtocolRealm> const* realms,
+                                bool& stale) {
+  uint64_t const now = tmr_jiffies();
+  unsigned int looked = 0;
+  int verdict = 0;
+  forEachHeader(message, SIP_HDR_AUTHORIZATION, [&](sip_hdr const& header) {
+    httpauth_digest_resp response;
+    if (++looked > kMaximumAuthorizations)
+      return false;
+    if (httpauth_digest_response_decode(&response, &header.val) != 0 ||
+        response.username.l > kMaximumUserName)
+      return true;
+    LS_AuthenticationProtocol::Type protocol = LS_AuthenticationProtocol::HTTP;
+    if (realms) {
+      auto const realm = std::find_if(realms->begin(), realms->end(), [&](LS_ProtocolRealm const& candidate) {
+        return pl_strcmp(&response.realm, candidate.realm.c_str()) == 0;
+      });
+      if (realm == realms->end())
+        return true;
+      protocol = realm->protocol;
+    }
+    NonceGenerator::Check const check = m_nonces.check(response.nonce, response.realm, now);
+    if (check != NonceGenerator::Check::VALID) {
+      stale = stale || check == NonceGenerator::Check::STALE;
+      return true;
+    }
+    String error;
+    Vector<String> passwords;
+    String const user(response.username.p, response.username.l);
+    String const realm(response.realm.p, response.realm.l);
+    m_clock.measure([&] {
+      LS_getInboundAuthenticationResponse(error, passwords, identity, to, protocol, realm, user, nullptr);
+    });
+    bool const matches = std::any_of(passwords.begin(), passwords.end(), [&](String const& password) {
+      return digestResponseMatches(response, message.met, password.c_str());
+    });
+    verdict = matches ? 1 : -1;
+    return false;
+  });
+  return verdict;
+}
+
+Registrar::Order Registrar::order(Bindings const& bindings,
+                                  std::vector<ContactRequest> const& requests,
+                                  bool wildcard,
+                                  pl const& callId,
+                                  uint32_t cseq) {
+  Order verdict = Order::NEW;
+  auto judge = [&](Binding const& binding) {
+    if (pl_strcmp(&callId, binding.callId.c_str()) != 0)
+      return;
+    if (cseq < binding.cseq)
+      verdict = Order::OUT_OF_ORDER;
+    else if (cseq == binding.cseq && verdict == Order::NEW)
+      verdict = Order::RETRANSMITTED;
+  };
+  if (wildcard) {
+    for (auto const& entry : bindings.byContact)
+      judge(*entry.second);
+  }
+  for (ContactRequest const& request : requests) {
+    auto const found = bindings.byContact.find(request.key);
+    if (found != bindings.byContact.end())
+      judge(*found->second);
+  }
+  return verdict;
+}
+
 void Registrar::add(Bindings& bindings,
                     ContactRequest const& request,
-                    std::string const& callId,
+                    sip_msg const& message,
                     CHostPort const& received) {
+  std::string const callId = text(message.callid);
   XCode const added = m_clock.measure([&] {
     return bindings.face->addContact(callId.c_str(), request.contact, received, "", "", 0, request.expires);
   });
@@ -281,6 +330,9 @@ void Registrar::add(Bindings& bindings,
     unschedule(*slot);
   }
   slot->callId = callId;
+  slot->cseq = message.cseq.num;
+  slot->source = message.src;
+  slot->transport = message.tp;
   slot->expiresAtMs = tmr_jiffies() + uint64_t{request.expires} * 1000;
   schedule(*slot);
 }

@@ -25,8 +25,13 @@
 // - A digest response to a nonce this process did not make counts as no
 //   credentials (a fresh 401), one to an expired nonce gets 401 with
 //   stale=true; only a wrong password on a valid nonce gets 403.
-// - A registration whose Call-ID differs from the binding's replaces it; CSeq
-//   ordering is not checked (libre's transactions already drop duplicates).
+// - Stateless, as RFC 3261 section 10.3 lets a registrar be: nothing is kept
+//   for a request until it is authenticated, and its answer leaves without a
+//   server transaction. A contact whose binding has the request's Call-ID
+//   is checked against the binding's CSeq: the same CSeq is a retransmission,
+//   answered again with the bindings in effect and changing nothing; a lower
+//   one fails the whole request with 400 (the section says only that it
+//   fails; 400 is what peers answer). Another Call-ID replaces the binding.
 //
 // Owns the bindings' timers: destroying the registrar removes every binding
 // from its face first, so that the global count of registered contacts
@@ -36,11 +41,14 @@
 #include <map>
 #include <memory>
 #include <string>
+#include <vector>
 
 #include "CNameAddr.h"
 #include "LS_IIdentity.h"
 #include "LS_IRegistrationInbound.h"
+#include "LS_ProtocolRealm.h"
 #include "RefPtr.h"
+#include "Vector.h"
 #include "metrics/LibraryClock.h"
 #include "registrar/NonceGenerator.h"
 #include "sip/Libre.h"
@@ -68,11 +76,15 @@ class Registrar {
   // make every transaction's own timers cost as many steps as there are
   // bindings.
   using Expiries = std::multimap<uint64_t, Binding*>;
+  // What a binding holds: what the registration said and where it came from.
   struct Binding {
     Bindings* owner;
     CNameAddr contact;
     std::string callId;
-    uint64_t expiresAtMs;
+    uint32_t cseq;
+    uint64_t expiresAtMs;       // on the stack's clock, tmr_jiffies()
+    sa source;                  // where the REGISTER came from
+    sip_transp transport;       // and over what
     Expiries::iterator expiry;  // its entry in m_expiries
   };
   // One identity's bindings, by contact text.
@@ -99,11 +111,32 @@ class Registrar {
   // dynamic identity made for it with it.
   void forgetIfUnbound(LS_IIdentity* identity, bool created);
   // Whether the request carries valid credentials; answers 401 or 403
-  // itself when not.
+  // itself when not. Credentials the library takes for their realm are
+  // accepted before the realms to challenge with are asked for: that list
+  // only matters when they are missing or wrong, and asking for it was the
+  // library's largest cost of an authenticated REGISTER.
   bool authenticated(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to);
+  // The first Authorization header with a valid nonce checked against the
+  // library's passwords: 1 when one matches, -1 when none does, 0 when
+  // there is no such header. With realms, only a header for one of them
+  // counts; without, any realm, for HTTP digest. stale is set when a
+  // header's nonce has expired.
+  int checkCredentials(sip_msg const& message,
+                       LS_IIdentity* identity,
+                       CNameAddr const& to,
+                       Vector<LS_ProtocolRealm> const* realms,
+                       bool& stale);
+  // What the request's CSeq makes of it against the bindings it names (all
+  // of them for a wildcard) that carry its Call-ID.
+  enum class Order { NEW, RETRANSMITTED, OUT_OF_ORDER };
+  static Order order(Bindings const& bindings,
+                     std::vector<ContactRequest> const& requests,
+                     bool wildcard,
+                     pl const& callId,
+                     uint32_t cseq);
   void add(Bindings& bindings,
            ContactRequest const& request,
-           std::string const& callId,
+           sip_msg const& message,
            CHostPort const& received);
   // Leaves telling the identity to the caller.
   void removeAll(Bindings& bindings);

@@ -1,5 +1,6 @@
 #include "sip/SipFrontEnd.h"
 
+#include <algorithm>
 #include <cstring>
 
 #include "sip/Capabilities.h"
@@ -8,13 +9,19 @@
 namespace {
 
 // Hash table sizes of the stack: client transactions, server transactions,
-// TCP connections. A server transaction outlives its answer by 32 s over
-// UDP, so a registrar answering thousands of requests a second holds some
-// hundred thousand at once; the table (8 bytes a bucket on 32-bit) keeps
-// their chains short.
+// TCP connections. Every request is answered statelessly (see
+// Exchange::answer), so the server-transaction table stays empty; the stack
+// still looks each request up in it.
 constexpr uint32_t kClientTransactions = 64;
-constexpr uint32_t kServerTransactions = 32768;
+constexpr uint32_t kServerTransactions = 16;
 constexpr uint32_t kConnections = 64;
+
+// The receive (and send) buffer of each UDP socket. The kernel's default,
+// some 200 KiB, holds about a thousand requests: a burst of a storm that
+// arrives while the loop is busy or not scheduled overflows it, and the
+// phones retransmit. Kamailio enlarges its sockets likewise. The kernel
+// keeps the size within net.core.rmem_max.
+constexpr int kUdpBufferBytes = 4 * 1024 * 1024;
 
 void stopLoop(void*) {
   re_cancel();
@@ -75,10 +82,12 @@ void SipFrontEnd::shutDown() {
 bool SipFrontEnd::onRequest(sip_msg const* request, void* argument) {
   SipFrontEnd& frontEnd = *static_cast<SipFrontEnd*>(argument);
   sip_msg const& message = *request;
-  // An ACK gets no answer, the one for a 302 included (INVITEs are answered
-  // without a transaction, see Exchange::answer).
+  // An ACK gets no answer, the one for a 302 included (every request is
+  // answered without a transaction, see Exchange::answer).
   if (pl_strcmp(&message.met, "ACK") == 0)
     return true;
+  if (message.tp == SIP_TRANSP_UDP)
+    frontEnd.enlarge(message.sock);
   Exchange exchange(*frontEnd.m_stack, message, frontEnd.m_session, frontEnd.m_log, frontEnd.m_clock);
   if (frontEnd.m_admission.answered(exchange))
     return true;
@@ -97,6 +106,13 @@ bool SipFrontEnd::onRequest(sip_msg const* request, void* argument) {
   }
   exchange.answer(405, "Method Not Allowed", Capabilities::kAllow);
   return true;
+}
+
+void SipFrontEnd::enlarge(void* udpSocket) {
+  if (std::find(m_enlarged.begin(), m_enlarged.end(), udpSocket) != m_enlarged.end())
+    return;
+  m_enlarged.push_back(udpSocket);
+  udp_sockbuf_set(static_cast<udp_sock*>(udpSocket), kUdpBufferBytes);
 }
 
 void SipFrontEnd::onClosed(void*) {

@@ -58,6 +58,11 @@ class SipFrontEnd {
  private:
   static bool onRequest(sip_msg const* request, void* frontEnd);
   static void onClosed(void* frontEnd);
+  // Gives a UDP socket of the stack its larger buffers (kUdpBufferBytes)
+  // the first time a request arrives on it: the stack makes its sockets
+  // itself and hands them out only with what they received (sip_msg's
+  // sock, a udp_sock for UDP).
+  void enlarge(void* udpSocket);
 
   ScriptSession& m_session;
   LibraryClock& m_clock;
@@ -70,4 +75,5 @@ class SipFrontEnd {
   sip* m_stack = nullptr;
   sip_lsnr* m_listener = nullptr;
   std::unique_ptr<TrunkRegistrations> m_trunks;
+  std::vector<void*> m_enlarged;  // the UDP sockets enlarge() has seen
 };

@@ -4,9 +4,9 @@
 #   run-scenario.sh FOLDER/NAME GATEWAY SIPP WORK-DIR [EMULATOR...]
 #
 # NAME's files are in FOLDER (the part of the gateway it checks):
-# registrar/phone: the gateway serves subscribers.script; SIPp plays the
-#          phone of phone.xml against it, and the gateway's request lines
-#          must be exactly phone.out.
+# registrar/phone, registrar/retransmission: the gateway serves
+#          subscribers.script; SIPp plays the phone of NAME.xml against it,
+#          and the gateway's request lines must be exactly NAME.out.
 # sip/protocol: the gateway serves protocol.script on IPv4 and IPv6
 #          loopback; SIPp plays protocol.xml over each in turn, and the
 #          gateway's request lines must be protocol.out twice, GATEWAY
@@ -124,11 +124,11 @@ await_registrar() {
 }
 
 case $scenario in
-  phone)
+  phone | retransmission)
     start_gateway "$here/subscribers.script"
     run_sipp -m 1 127.0.0.1:"$gateway_port" || fail "SIPp's phone failed"
     stop_gateway
-    diff -u "$here/phone.out" "$scenario".gateway.out >"$scenario".diff || fail "request lines differ: $(cat "$scenario".diff)"
+    diff -u "$here/$scenario.out" "$scenario".gateway.out >"$scenario".diff || fail "request lines differ: $(cat "$scenario".diff)"
     ;;
   protocol)
     start_gateway --listen "[::1]:0" "$here/protocol.script"
