@@ -10,6 +10,8 @@
 // the library, not internally synchronised, needs), and brings server and
 // client transactions, registration client and digest helpers.
 
+#include <cerrno>
+#include <cstdlib>
 #include <cstring>
 #include <fstream>
 #include <iostream>
@@ -28,7 +30,8 @@ namespace {
 
 char const kUsage[] =
     "usage: location-gateway [--listen ADDR:PORT]... [--dns-server ADDR:PORT]...\n"
-    "                        [--debug] [--statistics] SCRIPT...\n"
+    "                        [--min-expires S] [--max-expires S] [--default-expires S]\n"
+    "                        [--nat-ping S] [--debug] [--statistics] SCRIPT...\n"
     "\n"
     "Configures the library from the scripts (the console's language), then\n"
     "answers SIP requests over UDP and TCP on every ADDR:PORT given (default\n"
@@ -39,6 +42,11 @@ char const kUsage[] =
     "\n"
     "  --dns-server  a DNS server to resolve names with instead of the\n"
     "                system's (/etc/resolv.conf)\n"
+    "  --min-expires, --max-expires, --default-expires\n"
+    "                the registration lifetimes in seconds for subscribers\n"
+    "                whose face gives no lifetime range (60, 3600, 3600)\n"
+    "  --nat-ping    OPTIONS every S seconds to phones registered from behind\n"
+    "                NAT over UDP; a phone missing three is unregistered\n"
     "  --debug       show the library's debug lines\n"
     "  --statistics  at exit, the requests answered and the CPU time spent\n"
     "                in the library's calls\n"
@@ -46,12 +54,23 @@ char const kUsage[] =
     "Exit status: 0 after a signal, 1 when a script line fails or a\n"
     "listener cannot be opened, 2 for a usage error or an unreadable script.\n";
 
+// A number of seconds, all digits, at least 1.
+bool seconds(char const* text, uint32_t& value) {
+  char* end = nullptr;
+  errno = 0;
+  unsigned long const parsed = std::strtoul(text, &end, 10);
+  if (*text < '0' || *text > '9' || *end != '\0' || errno != 0 || parsed == 0 || parsed > UINT32_MAX)
+    return false;
+  value = static_cast<uint32_t>(parsed);
+  return true;
+}
+
 void onSignal(int) {
   re_cancel();
 }
 
 struct Options {
-  SipFrontEnd::Settings network;
+  SipFrontEnd::Settings sip;
   bool debug = false;
   bool statistics = false;
   std::vector<std::string> scripts;
@@ -62,9 +81,18 @@ bool parse(int argc, char** argv, Options& options) {
   for (int i = 1; i < argc; ++i) {
     std::string const argument = argv[i];
     if (argument == "--listen" && i + 1 < argc)
-      options.network.listen.push_back(argv[++i]);
+      options.sip.listen.push_back(argv[++i]);
     else if (argument == "--dns-server" && i + 1 < argc)
-      options.network.dnsServers.push_back(argv[++i]);
+      options.sip.dnsServers.push_back(argv[++i]);
+    else if (argument == "--min-expires" && i + 1 < argc && seconds(argv[++i], options.sip.expiry.minimum))
+      continue;
+    else if (argument == "--max-expires" && i + 1 < argc && seconds(argv[++i], options.sip.expiry.maximum))
+      continue;
+    else if (argument == "--default-expires" && i + 1 < argc &&
+             seconds(argv[++i], options.sip.expiry.defaultLifetime))
+      continue;
+    else if (argument == "--nat-ping" && i + 1 < argc && seconds(argv[++i], options.sip.natPingSeconds))
+      continue;
     else if (argument == "--debug")
       options.debug = true;
     else if (argument == "--statistics")
@@ -74,8 +102,11 @@ bool parse(int argc, char** argv, Options& options) {
     else
       options.scripts.push_back(argument);
   }
-  if (options.network.listen.empty())
-    options.network.listen.push_back("127.0.0.1:5060");
+  ExpiryRange const& expiry = options.sip.expiry;
+  if (expiry.minimum > expiry.defaultLifetime || expiry.defaultLifetime > expiry.maximum)
+    return false;
+  if (options.sip.listen.empty())
+    options.sip.listen.push_back("127.0.0.1:5060");
   return !options.scripts.empty();
 }
 
@@ -101,7 +132,7 @@ int serve(ScriptSession& session, Options const& options) {
   LibraryClock clock(options.statistics);
   SipFrontEnd frontEnd(session, clock);
   std::string error;
-  if (!frontEnd.start(options.network, error)) {
+  if (!frontEnd.start(options.sip, error)) {
     std::cerr << "location-gateway: " << error << "\n";
     return 1;
   }

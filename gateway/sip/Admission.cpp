@@ -5,6 +5,7 @@
 #include "CHostPort.h"
 #include "LS_ServiceResolution.h"
 #include "sip/Capabilities.h"
+#include "sip/HeaderValues.h"
 
 namespace {
 
@@ -43,15 +44,13 @@ bool Admission::answered(Exchange& exchange) const {
 }
 
 bool Admission::unsupportedExtension(Exchange& exchange) const {
-  // libre splits a comma-separated Require into one header a tag.
   std::string unsupported;
-  for (le const* entry = list_head(&exchange.request().hdrl); entry; entry = entry->next) {
-    sip_hdr const* header = static_cast<sip_hdr const*>(entry->data);
-    if (header->id != SIP_HDR_REQUIRE || Capabilities::supports(header->val))
-      continue;
-    // A header of a kilobyte fits in the answer; the stack bounds a message.
-    unsupported += (unsupported.empty() ? "" : ", ") + text(header->val);
-  }
+  forEachHeaderValue(exchange.request(), SIP_HDR_REQUIRE, [&](sip_hdr const& header) {
+    // The stack bounds a message, and so the answer that lists its tags.
+    if (!Capabilities::supports(header.val))
+      unsupported += (unsupported.empty() ? "" : ", ") + text(header.val);
+    return true;
+  });
   if (unsupported.empty())
     return false;
   exchange.answer(420, "Bad Extension", "Unsupported: " + unsupported + "\r\n" + Capabilities::kSupported);

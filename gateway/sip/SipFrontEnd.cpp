@@ -50,6 +50,7 @@ bool SipFrontEnd::start(Settings const& settings, std::string& error) {
   }
   if (!m_listeners.open(*m_stack, settings.listen, error))
     return false;
+  m_registrar.start(*m_stack, settings.expiry, settings.natPingSeconds);
   if (sip_listen(&m_listener, m_stack, true, onRequest, this) != 0) {
     error = "the SIP stack cannot take requests";
     return false;

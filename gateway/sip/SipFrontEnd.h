@@ -19,6 +19,7 @@
 #include "ScriptSession.h"
 #include "metrics/LibraryClock.h"
 #include "redirect/Redirector.h"
+#include "registrar/ExpiryRange.h"
 #include "registrar/Registrar.h"
 #include "sip/Admission.h"
 #include "sip/DnsClient.h"
@@ -40,6 +41,11 @@ class SipFrontEnd {
     std::vector<std::string> listen;
     // "ADDR:PORT" each; empty for the system's (see DnsClient).
     std::vector<std::string> dnsServers;
+    // The registrar's lifetimes for faces that give none.
+    ExpiryRange expiry;
+    // OPTIONS to NATed UDP bindings every so many seconds (NatPinger); 0
+    // for none.
+    uint32_t natPingSeconds = 0;
   };
 
   // False with an error text when a DNS server, a listen address or the

@@ -8,9 +8,12 @@
 #          subscribers.script; SIPp plays the phone of NAME.xml against it,
 #          and the gateway's request lines must be exactly NAME.out.
 # sip/protocol: the gateway serves protocol.script on IPv4 and IPv6
-#          loopback; SIPp plays protocol.xml over each in turn, and the
-#          gateway's request lines must be protocol.out twice, GATEWAY
-#          standing for its address of each run.
+#          loopback, pinging NATed phones every second; SIPp plays
+#          protocol.xml over each in turn, answering the pings (pong.xml),
+#          and the gateway's request lines must be protocol.out twice,
+#          GATEWAY standing for its address of each run; then a phone of
+#          nat-ping.xml registers from behind NAT and leaves, and its
+#          binding must be dropped for the pings it no longer answers.
 # trunks/carrier: SIPp plays the carrier's registrar of carrier.xml; the
 #          gateway serves trunk.script with SIPp's address added as the
 #          proxy, must retry after the registrar's 503, report the trunk
@@ -95,7 +98,8 @@ stop_gateway() {
 # SIPp's own address; ::1 for IPv6.
 sipp_address=127.0.0.1
 run_sipp() {
-  timeout $((sipp_limit + 5)) "$sipp" -sf "$here/$scenario.xml" -i "$sipp_address" -timeout "${sipp_limit}s" \
+  timeout $((sipp_limit + 5)) "$sipp" -sf "${sipp_scenario:-$here/$scenario.xml}" -i "$sipp_address" \
+    -timeout "${sipp_limit}s" \
     -timeout_error -nostdin -trace_err "$@" >"$scenario".sipp.log 2>&1
 }
 
@@ -131,13 +135,18 @@ case $scenario in
     diff -u "$here/$scenario.out" "$scenario".gateway.out >"$scenario".diff || fail "request lines differ: $(cat "$scenario".diff)"
     ;;
   protocol)
-    start_gateway --listen "[::1]:0" "$here/protocol.script"
+    start_gateway --listen "[::1]:0" --nat-ping 1 "$here/protocol.script"
     [[ -n $gateway_port6 ]] || fail "the gateway does not listen on [::1]"
-    run_sipp -m 1 127.0.0.1:"$gateway_port" || fail "SIPp failed over IPv4"
+    run_sipp -m 1 -oocsf "$here/pong.xml" -deadcall_wait 0 127.0.0.1:"$gateway_port" || fail "SIPp failed over IPv4"
     sed "s/GATEWAY/127.0.0.1:$gateway_port/g" "$here/protocol.out" >"$scenario".expected
     sipp_address=::1
-    run_sipp -m 1 "[::1]:$gateway_port6" || fail "SIPp failed over IPv6"
+    run_sipp -m 1 -oocsf "$here/pong.xml" -deadcall_wait 0 "[::1]:$gateway_port6" || fail "SIPp failed over IPv6"
     sed "s/GATEWAY/[::1]:$gateway_port6/g" "$here/protocol.out" >>"$scenario".expected
+    sipp_address=127.0.0.1
+    sipp_scenario=$here/nat-ping.xml run_sipp -m 1 127.0.0.1:"$gateway_port" || fail "SIPp failed to register bob"
+    echo "REGISTER sip:example.com example.com/bob 200" >>"$scenario".expected
+    await_line "$scenario".gateway.err "example.com/bob: <sip:bob@10.0.0.2:5060> dropped, 3 NAT pings unanswered" ||
+      fail "the phone that left was not dropped"
     stop_gateway
     diff -u "$scenario".expected "$scenario".gateway.out >"$scenario".diff || fail "request lines differ: $(cat "$scenario".diff)"
     ;;
