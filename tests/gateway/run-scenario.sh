@@ -135,13 +135,23 @@ case $scenario in
     diff -u "$here/$scenario.out" "$scenario".gateway.out >"$scenario".diff || fail "request lines differ: $(cat "$scenario".diff)"
     ;;
   protocol)
-    start_gateway --listen "[::1]:0" --nat-ping 1 "$here/protocol.script"
-    [[ -n $gateway_port6 ]] || fail "the gateway does not listen on [::1]"
+    # A machine without IPv6 on loopback (a container may have none) runs
+    # the IPv4 half only, and says so.
+    ipv6=()
+    if grep -qs '^0\{31\}1 ' /proc/net/if_inet6; then
+      ipv6=(--listen "[::1]:0")
+    else
+      echo "no IPv6 loopback: the protocol scenario over IPv4 only" >&2
+    fi
+    start_gateway "${ipv6[@]}" --nat-ping 1 "$here/protocol.script"
     run_sipp -m 1 -oocsf "$here/pong.xml" -deadcall_wait 0 127.0.0.1:"$gateway_port" || fail "SIPp failed over IPv4"
     sed "s/GATEWAY/127.0.0.1:$gateway_port/g" "$here/protocol.out" >"$scenario".expected
-    sipp_address=::1
-    run_sipp -m 1 -oocsf "$here/pong.xml" -deadcall_wait 0 "[::1]:$gateway_port6" || fail "SIPp failed over IPv6"
-    sed "s/GATEWAY/[::1]:$gateway_port6/g" "$here/protocol.out" >>"$scenario".expected
+    if ((${#ipv6[@]})); then
+      [[ -n $gateway_port6 ]] || fail "the gateway does not listen on [::1]"
+      sipp_address=::1
+      run_sipp -m 1 -oocsf "$here/pong.xml" -deadcall_wait 0 "[::1]:$gateway_port6" || fail "SIPp failed over IPv6"
+      sed "s/GATEWAY/[::1]:$gateway_port6/g" "$here/protocol.out" >>"$scenario".expected
+    fi
     sipp_address=127.0.0.1
     sipp_scenario=$here/nat-ping.xml run_sipp -m 1 127.0.0.1:"$gateway_port" || fail "SIPp failed to register bob"
     echo "REGISTER sip:example.com example.com/bob 200" >>"$scenario".expected
