@@ -13,7 +13,8 @@
 #          and the gateway's request lines must be protocol.out twice,
 #          GATEWAY standing for its address of each run; then a phone of
 #          nat-ping.xml registers from behind NAT and leaves, and its
-#          binding must be dropped for the pings it no longer answers.
+#          binding must be dropped for the pings it no longer answers, and
+#          again over TCP, dropped when its connection closes.
 # trunks/carrier: SIPp plays the carrier's registrar of carrier.xml; the
 #          gateway serves trunk.script with SIPp's address added as the
 #          proxy, must retry after the registrar's 503, report the trunk
@@ -157,6 +158,11 @@ case $scenario in
     echo "REGISTER sip:example.com example.com/bob 200" >>"$scenario".expected
     await_line "$scenario".gateway.err "example.com/bob: <sip:bob@10.0.0.2:5060> dropped, 3 NAT pings unanswered" ||
       fail "the phone that left was not dropped"
+    sipp_scenario=$here/nat-ping.xml run_sipp -m 1 -t t1 127.0.0.1:"$gateway_port" ||
+      fail "SIPp failed to register bob over TCP"
+    echo "REGISTER sip:example.com example.com/bob 200" >>"$scenario".expected
+    await_line "$scenario".gateway.err "example.com/bob: <sip:bob@10.0.0.2:5060> dropped, its connection closed" ||
+      fail "the phone whose connection closed was not dropped"
     stop_gateway
     diff -u "$scenario".expected "$scenario".gateway.out >"$scenario".diff || fail "request lines differ: $(cat "$scenario".diff)"
     ;;
