@@ -299,6 +299,11 @@ Registrar::Binding* Registrar::find(Bindings& bindings, ContactHeader const& con
     for (auto const& binding : bindings.all)
       if (binding->instance == contact.instance && binding->regId == contact.regId)
         return binding.get();
+  // A refresh names its binding as it was written, and then the text
+  // decides without parsing both URIs again.
+  for (auto const& binding : bindings.all)
+    if (binding->uri == contact.uri)
+      return binding.get();
   pl uri;
   pl_set_str(&uri, contact.uri.c_str());
   for (auto const& binding : bindings.all) {
