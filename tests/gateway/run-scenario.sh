@@ -8,7 +8,8 @@
 #          subscribers.script; SIPp plays the phone of NAME.xml against it,
 #          and the gateway's request lines must be exactly NAME.out.
 # sip/protocol: the gateway serves protocol.script on IPv4 and IPv6
-#          loopback, pinging NATed phones every second; SIPp plays
+#          loopback, pinging NATed phones every second (a second one on
+#          its port must refuse to start); SIPp plays
 #          protocol.xml over each in turn, answering the pings (pong.xml),
 #          and the gateway's request lines must be protocol.out twice,
 #          GATEWAY standing for its address of each run; then a phone of
@@ -145,6 +146,12 @@ case $scenario in
       echo "no IPv6 loopback: the protocol scenario over IPv4 only" >&2
     fi
     start_gateway "${ipv6[@]}" --nat-ping 1 "$here/protocol.script"
+    # A second gateway on the same port must stop, naming the listener.
+    status=0
+    timeout "$wait_limit" "${emulator[@]}" "$gateway" --listen 127.0.0.1:"$gateway_port" "$here/protocol.script" \
+      >/dev/null 2>"$scenario".taken.err || status=$?
+    ((status == 1)) && grep -q "cannot listen on udp:127.0.0.1:$gateway_port: " "$scenario".taken.err ||
+      fail "a taken port did not stop the start ($status)"
     run_sipp -m 1 -oocsf "$here/pong.xml" -deadcall_wait 0 127.0.0.1:"$gateway_port" || fail "SIPp failed over IPv4"
     sed "s/GATEWAY/127.0.0.1:$gateway_port/g" "$here/protocol.out" >"$scenario".expected
     if ((${#ipv6[@]})); then
