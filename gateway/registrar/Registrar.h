@@ -113,7 +113,10 @@ class Registrar {
   using Expiries = std::multimap<uint64_t, Binding*>;
   // What a binding holds: what the registration said and where it came from.
   struct Binding {
+    Binding() = default;
     ~Binding() { mem_deref(connection); }
+    Binding(Binding const&) = delete;
+    Binding& operator=(Binding const&) = delete;
 
     Registrar* registrar;
     Bindings* owner;
