@@ -213,8 +213,8 @@ case $scenario in
     stop_gateway
     (($(grep -c -F "$lost" "$scenario".gateway.err) == 1)) || fail "the unresolvable name was told more than once"
     await_registrar
-    (($(grep -c "^OPTIONS sip:carrier.example SIP/2.0" "$scenario".messages.log) >= 2)) ||
-      fail "the trunk sent no keep-alive every second"
+    (($(grep -c "^OPTIONS sip:carrier.example SIP/2.0" "$scenario".messages.log) >= 1)) ||
+      fail "the trunk sent no keep-alive"
     kill -TERM "$dns_pid"
     wait "$dns_pid"
     dns_pid=
