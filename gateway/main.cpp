@@ -10,6 +10,7 @@
 // the library, not internally synchronised, needs), and brings server and
 // client transactions, registration client and digest helpers.
 
+#include <algorithm>
 #include <cerrno>
 #include <cstdlib>
 #include <cstring>
@@ -102,8 +103,10 @@ bool parse(int argc, char** argv, Options& options) {
     else
       options.scripts.push_back(argument);
   }
-  ExpiryRange const& expiry = options.sip.expiry;
-  if (expiry.minimum > expiry.defaultLifetime || expiry.defaultLifetime > expiry.maximum)
+  // A default above the maximum is cut to it, as a requested expiry is.
+  ExpiryRange& expiry = options.sip.expiry;
+  expiry.defaultLifetime = std::min(expiry.defaultLifetime, expiry.maximum);
+  if (expiry.minimum > expiry.defaultLifetime)
     return false;
   if (options.sip.listen.empty())
     options.sip.listen.push_back("127.0.0.1:5060");
