@@ -47,7 +47,7 @@ for _ in $(seq 600); do
   kill -0 "$gateway_pid" || { cat gateway.err >&2; exit 1; }
   sleep 0.1
 done
-address=$(sed -n 's/.*listening on udp:\(.*\)$/\1/p' gateway.err)
+address=$(sed -n 's/^location-gateway: listening on udp:\(127[^ ]*\).*$/\1/p' gateway.err | head -n 1)
 
 # statistic FILE NAME: field NAME of the last line of a SIPp statistics file.
 statistic() {
