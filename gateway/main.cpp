@@ -1,15 +1,18 @@
 // location-gateway: the location-service library answering real SIP traffic
 // on libre. It reads its configuration from scripts in the console's
 // language, then serves as registrar (digest-authenticated REGISTER) and
-// redirect server (302 to where a subscriber is registered) on one UDP (and
-// TCP) address, and registers its trunks with their registrars, until
-// SIGINT or SIGTERM. It uses the library's public interfaces only.
+// redirect server (302 to where a subscriber is registered) on UDP and TCP
+// at every address it is given, and registers its trunks with their
+// registrars, found through DNS, until SIGINT or SIGTERM. It uses the library's public interfaces only.
 //
 // libre is chosen as the stack: Debian packages it for every architecture
 // the gateway runs on, it is small, runs everything on one event loop (which
 // the library, not internally synchronised, needs), and brings server and
 // client transactions, registration client and digest helpers.
 
+#include <algorithm>
+#include <cerrno>
+#include <cstdlib>
 #include <cstring>
 #include <fstream>
 #include <iostream>
@@ -21,7 +24,11 @@
 #include "ScriptLanguage.h"
 #include "ScriptRunner.h"
 #include "ScriptSession.h"
+#include "control/Autosave.h"
+#include "control/ControlServer.h"
+#include "control/GatewayCommands.h"
 #include "metrics/LibraryClock.h"
+#include "metrics/MetricsServer.h"
 #include "sip/Libre.h"
 #include "sip/SipFrontEnd.h"
 #include "store/BindingReplay.h"
@@ -30,34 +37,64 @@
 namespace {
 
 char const kUsage[] =
-    "usage: location-gateway [--listen ADDR:PORT] [--store WHERE] [--debug] [--statistics] SCRIPT...\n"
+    "usage: location-gateway [--listen ADDR:PORT]... [--dns-server ADDR:PORT]...\n"
+    "                        [--min-expires S] [--max-expires S] [--default-expires S]\n"
+    "                        [--nat-ping S] [--store WHERE] [--debug] [--statistics] [--control PATH]\n"
+    "                        [--autosave FILE] [--metrics ADDR:PORT] SCRIPT...\n"
     "\n"
     "Configures the library from the scripts (the console's language), then\n"
-    "answers SIP requests on ADDR:PORT (default 127.0.0.1:5060, UDP and TCP;\n"
-    "port 0 takes a free one) until SIGINT or SIGTERM. One line per request\n"
-    "answered on standard output: method, request URI, identity or the\n"
-    "library's error text, response code.\n"
+    "answers SIP requests over UDP and TCP on every ADDR:PORT given (default\n"
+    "127.0.0.1:5060; [IPv6]:PORT for IPv6; 0.0.0.0 or [::] for every address\n"
+    "of the machine; port 0 takes a free one) until SIGINT or SIGTERM. One\n"
+    "line per request answered on standard output: method, request URI,\n"
+    "identity or the library's error text, response code.\n"
     "\n"
+    "  --dns-server  a DNS server to resolve names with instead of the\n"
+    "                system's (/etc/resolv.conf)\n"
+    "  --min-expires, --max-expires, --default-expires\n"
+    "                the registration lifetimes in seconds for subscribers\n"
+    "                whose face gives no lifetime range (60, 3600, 3600)\n"
+    "  --nat-ping    OPTIONS every S seconds to phones registered from behind\n"
+    "                NAT over UDP; a phone missing three is unregistered\n"
     "  --store WHERE where registrations outlive the process: a file (SQLite;\n"
     "                default location-gateway.sqlite), a postgresql:// URI\n"
     "                (gateways sharing it learn each other's), or none\n"
     "  --debug       show the library's debug lines\n"
     "  --statistics  at exit, the requests answered and the CPU time spent\n"
     "                in the library's calls\n"
+    "  --control PATH   a Unix socket (mode 0600) taking lines of the script\n"
+    "                   language while serving: location-console --connect PATH\n"
+    "  --autosave FILE  after a change over the socket, the configuration\n"
+    "                   into FILE as save writes it (at most once a second)\n"
+    "  --metrics ADDR:PORT  GET /metrics over HTTP, in Prometheus text format\n"
     "\n"
-    "Exit status: 0 after a signal, 1 when a script line fails, the address\n"
-    "cannot be bound or the store cannot be opened, 2 for a usage error or an\n"
-    "unreadable script.\n";
+    "Exit status: 0 after a signal, 1 when a script line fails, a listener\n"
+    "or the store cannot be opened, 2 for a usage error or an unreadable\n"
+    "script.\n";
+
+// A number of seconds, all digits, at least 1.
+bool seconds(char const* text, uint32_t& value) {
+  char* end = nullptr;
+  errno = 0;
+  unsigned long const parsed = std::strtoul(text, &end, 10);
+  if (*text < '0' || *text > '9' || *end != '\0' || errno != 0 || parsed == 0 || parsed > UINT32_MAX)
+    return false;
+  value = static_cast<uint32_t>(parsed);
+  return true;
+}
 
 void onSignal(int) {
   re_cancel();
 }
 
 struct Options {
-  std::string listen = "127.0.0.1:5060";
+  SipFrontEnd::Settings sip;
   std::string store = "location-gateway.sqlite";
   bool debug = false;
   bool statistics = false;
+  std::string control;
+  std::string autosave;
+  std::string metrics;
   std::vector<std::string> scripts;
 };
 
@@ -66,7 +103,24 @@ bool parse(int argc, char** argv, Options& options) {
   for (int i = 1; i < argc; ++i) {
     std::string const argument = argv[i];
     if (argument == "--listen" && i + 1 < argc)
-      options.listen = argv[++i];
+      options.sip.listen.push_back(argv[++i]);
+    else if (argument == "--dns-server" && i + 1 < argc)
+      options.sip.dnsServers.push_back(argv[++i]);
+    else if (argument == "--min-expires" && i + 1 < argc && seconds(argv[++i], options.sip.expiry.minimum))
+      continue;
+    else if (argument == "--max-expires" && i + 1 < argc && seconds(argv[++i], options.sip.expiry.maximum))
+      continue;
+    else if (argument == "--default-expires" && i + 1 < argc &&
+             seconds(argv[++i], options.sip.expiry.defaultLifetime))
+      continue;
+    else if (argument == "--nat-ping" && i + 1 < argc && seconds(argv[++i], options.sip.natPingSeconds))
+      continue;
+    else if (argument == "--control" && i + 1 < argc)
+      options.control = argv[++i];
+    else if (argument == "--autosave" && i + 1 < argc)
+      options.autosave = argv[++i];
+    else if (argument == "--metrics" && i + 1 < argc)
+      options.metrics = argv[++i];
     else if (argument == "--store" && i + 1 < argc)
       options.store = argv[++i];
     else if (argument == "--debug")
@@ -78,6 +132,13 @@ bool parse(int argc, char** argv, Options& options) {
     else
       options.scripts.push_back(argument);
   }
+  // A default above the maximum is cut to it, as a requested expiry is.
+  ExpiryRange& expiry = options.sip.expiry;
+  expiry.defaultLifetime = std::min(expiry.defaultLifetime, expiry.maximum);
+  if (expiry.minimum > expiry.defaultLifetime)
+    return false;
+  if (options.sip.listen.empty())
+    options.sip.listen.push_back("127.0.0.1:5060");
   return !options.scripts.empty();
 }
 
@@ -99,8 +160,55 @@ int runScripts(ScriptSession& session, std::vector<std::string> const& scripts) 
   return 0;
 }
 
+// The parts that operate a serving gateway: the control socket (with the
+// autosave it drives) and the metrics, each only when asked for.
+struct Operations {
+  CommandTable table;
+  std::unique_ptr<Autosave> autosave;
+  std::unique_ptr<ControlServer> control;
+  std::unique_ptr<MetricsServer> metrics;
+};
+
+bool startOperations(ScriptSession& session,
+                     SipFrontEnd& frontEnd,
+                     Options const& options,
+                     Operations& parts) {
+  std::string error;
+  if (!options.autosave.empty())
+    parts.autosave = std::make_unique<Autosave>(session, options.autosave);
+  if (!options.control.empty()) {
+    addScriptCommands(parts.table);
+    addGatewayCommands(parts.table, frontEnd);
+    parts.control = std::make_unique<ControlServer>(session, parts.table);
+    frontEnd.followChanges();
+    Autosave* const autosave = parts.autosave.get();
+    parts.control->onLine([&frontEnd] { frontEnd.beginChange(); },
+                          [&frontEnd, autosave](bool applied) {
+                            frontEnd.endChange();
+                            if (autosave && applied)
+                              autosave->changed();
+                          });
+    if (!parts.control->start(options.control, error)) {
+      std::cerr << "location-gateway: " << error << "\n";
+      return false;
+    }
+    std::cerr << "location-gateway: control socket " << options.control << std::endl;
+  }
+  if (!options.metrics.empty()) {
+    parts.metrics = std::make_unique<MetricsServer>([&frontEnd] { return frontEnd.statistics(); });
+    std::string bound;
+    if (!parts.metrics->start(options.metrics, bound, error)) {
+      std::cerr << "location-gateway: " << error << "\n";
+      return false;
+    }
+    std::cerr << "location-gateway: metrics on http://" << bound << "/metrics" << std::endl;
+  }
+  return true;
+}
+
 int serve(ScriptSession& session, Options const& options) {
-  LibraryClock clock(options.statistics);
+  // The statistics question and /metrics report the library's share too.
+  LibraryClock clock(options.statistics || !options.control.empty() || !options.metrics.empty());
   std::string error;
   // Outlives the front-end, whose registrar reports to it.
   std::unique_ptr<BindingStore> store;
@@ -114,13 +222,21 @@ int serve(ScriptSession& session, Options const& options) {
     std::cerr << "location-gateway: " << error << "\n";
     return 1;
   }
-  std::string bound;
-  if (!frontEnd.start(options.listen, bound, error)) {
+  if (!frontEnd.start(options.sip, error)) {
     std::cerr << "location-gateway: " << error << "\n";
     return 1;
   }
-  std::cerr << "location-gateway: listening on udp:" << bound << std::endl;
-  re_main(onSignal);
+  if (frontEnd.dnsServers().empty())
+    std::cerr << "location-gateway: no DNS server configured: host names will not resolve\n";
+  std::cerr << "location-gateway: listening on " << frontEnd.listening() << std::endl;
+  {
+    Operations operations;
+    if (!startOperations(session, frontEnd, options, operations)) {
+      frontEnd.shutDown();
+      return 1;
+    }
+    re_main(onSignal);
+  }
   frontEnd.shutDown();
   if (store)
     store->close();

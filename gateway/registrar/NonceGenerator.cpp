@@ -1,6 +1,10 @@
 #include "registrar/NonceGenerator.h"
 
+#include <openssl/core_names.h>
+#include <openssl/evp.h>
+
 #include <cstdio>
+#include <cstdlib>
 
 namespace {
 
@@ -38,7 +42,29 @@ bool parseTime(char const* text, uint64_t& value) {
 }  // namespace
 
 NonceGenerator::NonceGenerator() {
-  rand_bytes(m_key.data(), m_key.size());
+  std::array<uint8_t, 20> key;
+  rand_bytes(key.data(), key.size());
+  useKey(key);
+}
+
+NonceGenerator::NonceGenerator(std::array<uint8_t, 20> const& key) {
+  useKey(key);
+}
+
+NonceGenerator::~NonceGenerator() {
+  EVP_MAC_CTX_free(m_mac);
+}
+
+void NonceGenerator::useKey(std::array<uint8_t, 20> const& key) {
+  EVP_MAC* const hmac = EVP_MAC_fetch(nullptr, "HMAC", nullptr);
+  m_mac = hmac ? EVP_MAC_CTX_new(hmac) : nullptr;
+  EVP_MAC_free(hmac);
+  char digest[] = "SHA1";
+  OSSL_PARAM const parameters[] = {OSSL_PARAM_construct_utf8_string(OSSL_MAC_PARAM_DIGEST, digest, 0),
+                                   OSSL_PARAM_construct_end()};
+  // Without its MAC the gateway could neither make nor check a nonce.
+  if (!m_mac || !EVP_MAC_init(m_mac, key.data(), key.size(), parameters))
+    std::abort();
 }
 
 std::string NonceGenerator::signature(uint64_t madeMs, pl const& realm) const {
@@ -48,8 +74,11 @@ std::string NonceGenerator::signature(uint64_t madeMs, pl const& realm) const {
   data += ':';
   data.append(realm.p, realm.l);
   uint8_t mac[20];
-  hmac_sha1(m_key.data(), m_key.size(), reinterpret_cast<uint8_t const*>(data.data()), data.size(), mac,
-            sizeof mac);
+  size_t length = 0;
+  if (!EVP_MAC_init(m_mac, nullptr, 0, nullptr) ||
+      !EVP_MAC_update(m_mac, reinterpret_cast<uint8_t const*>(data.data()), data.size()) ||
+      !EVP_MAC_final(m_mac, mac, &length, sizeof mac) || length != sizeof mac)
+    std::abort();
   return time + hex(mac, sizeof mac);
 }
 

@@ -1,7 +1,8 @@
 #include "registrar/Registrar.h"
 
 #include <algorithm>
-#include <cstring>
+#include <cctype>
+#include <iostream>
 #include <vector>
 
 #include "LS_CredentialLookup.h"
@@ -9,7 +10,11 @@
 #include "LS_IdentityResolution.h"
 #include "LS_IdentityType.h"
 #include "registrar/DigestAuthentication.h"
+#include "registrar/NatTraversal.h"
+#include "registrar/SipUriComparison.h"
+#include "sip/Capabilities.h"
 #include "sip/Exchange.h"
+#include "sip/HeaderValues.h"
 
 namespace {
 
@@ -24,50 +29,24 @@ std::string text(pl const& value) {
   return std::string(value.p, value.l);
 }
 
-// A delta-seconds value; one beyond 32 bits saturates (RFC 3261 asks to
-// take such a value as the largest). False for anything but digits.
-bool parseSeconds(pl const& value, uint32_t& seconds) {
-  if (value.l == 0)
-    return false;
-  uint64_t total = 0;
-  for (size_t i = 0; i < value.l; ++i) {
-    char const c = value.p[i];
-    if (c < '0' || c > '9')
-      return false;
-    total = std::min<uint64_t>(total * 10 + static_cast<uint64_t>(c - '0'), UINT32_MAX);
-  }
-  seconds = static_cast<uint32_t>(total);
-  return true;
-}
-
-template <class Visit>
-void forEachHeader(sip_msg const& message, sip_hdrid id, Visit visit) {
-  for (le const* entry = list_head(&message.hdrl); entry; entry = entry->next) {
-    sip_hdr const* header = static_cast<sip_hdr const*>(entry->data);
-    if (header->id == id && !visit(*header))
-      return;
-  }
-}
-
-std::string sourceOf(sip_msg const& message) {
+CHostPort sourceOf(sip_msg const& message) {
   char address[64];
   re_snprintf(address, sizeof address, "%J", &message.src);
-  return address;
+  CHostPort source;
+  source.Parse(address, std::char_traits<char>::length(address));
+  return source;
 }
 
-CHostPort hostPortOf(std::string const& text) {
-  CHostPort hostPort;
-  hostPort.Parse(text.data(), text.size());
-  return hostPort;
-}
-
-// One of libre's static transport names for a stored one, so that a
-// binding holds no string of its own for it.
-char const* transportName(std::string const& stored) {
-  for (sip_transp transport : {SIP_TRANSP_UDP, SIP_TRANSP_TCP, SIP_TRANSP_TLS})
-    if (stored == sip_transp_param(transport))
-      return sip_transp_param(transport);
-  return sip_transp_param(SIP_TRANSP_UDP);
+// The stored name of a transport: "udp", "tcp" or "tls".
+char const* transportName(sip_transp transport) {
+  switch (transport) {
+    case SIP_TRANSP_TCP:
+      return "tcp";
+    case SIP_TRANSP_TLS:
+      return "tls";
+    default:
+      return "udp";
+  }
 }
 
 }  // namespace
@@ -76,11 +55,18 @@ Registrar::~Registrar() {
   // The bindings go with the process, not from the store.
   m_store = nullptr;
   for (auto& entry : m_bindings) {
-    size_t const before = entry.second.byContact.size();
+    size_t const before = entry.second.all.size();
     removeAll(entry.second);
     reportTransition(entry.second, before);
   }
   tmr_cancel(&m_sweep);
+}
+
+void Registrar::start(sip& stack, ExpiryRange const& expiry, uint32_t natPingSeconds) {
+  m_stack = &stack;
+  m_expiry = expiry;
+  if (natPingSeconds != 0)
+    m_pinger = std::make_unique<NatPinger>(stack, natPingSeconds, onPingsUnanswered, this);
 }
 
 void Registrar::handle(Exchange& exchange) {
@@ -124,7 +110,7 @@ void Registrar::forgetIfUnbound(LS_IIdentity* identity, bool created) {
   bool dynamic = created;
   auto const found = m_bindings.find(identity);
   if (found != m_bindings.end()) {
-    if (!found->second.byContact.empty())
+    if (!found->second.all.empty())
       return;
     dynamic = dynamic || found->second.dynamic;
     m_bindings.erase(found);
@@ -140,77 +126,46 @@ void Registrar::forgetIfUnbound(LS_IIdentity* identity, bool created) {
   });
 }
 
-RefPtr<LS_IRegistrationInbound> Registrar::faceOf(LS_IIdentity* identity) {
+void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity, bool created) {
+  sip_msg const& message = exchange.request();
   RefPtr<LS_IRegistrationInbound> face;
   m_clock.measure([&] {
     adoptInterface(face, [&](UUID const& iid, void** raw) {
       return identity->createDynamicFaceIf(LS_IdentityFace::REGISTRATION_INBOUND, iid, raw);
     });
   });
-  return face;
-}
-
-Registrar::Bindings& Registrar::entryOf(RefPtr<LS_IIdentity> const& identity,
-                                        RefPtr<LS_IRegistrationInbound> const& face,
-                                        bool dynamic) {
-  Bindings& bindings = m_bindings[identity.get()];
-  bindings.dynamic = bindings.dynamic || dynamic;
-  bindings.face = face;
-  if (bindings.identity)
-    return bindings;
-  bindings.identity = identity;
-  m_clock.measure([&] {
-    bindings.identityName = identity->getName().str();
-    RefPtr<LS_ILocationService> service;
-    adoptInterface(service,
-                   [&](UUID const& iid, void** raw) { return identity->getLocationServiceIf(iid, raw); });
-    if (service)
-      bindings.serviceName = service->getName().str();
-  });
-  return bindings;
-}
-
-void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity, bool created) {
-  sip_msg const& message = exchange.request();
-  RefPtr<LS_IRegistrationInbound> const face = faceOf(identity.get());
   if (!face)
     return exchange.answer(500, "No Registration Face");
   unsigned int minimum = 0;
   unsigned int maximum = 0;
   unsigned int defaultLifetime = 0;
   m_clock.measure([&] { face->getLifetimeRange(minimum, maximum, defaultLifetime); });
+  ExpiryRange const range = ExpiryRange::forFace(minimum, maximum, defaultLifetime, m_expiry);
 
   if (message.callid.l > kMaximumCallId)
     return exchange.answer(400, "Call-ID Too Long");
-  uint32_t headerExpires = defaultLifetime;
+  uint32_t headerExpires = 0;
   bool const hasExpires = pl_isset(&message.expires);
-  if (hasExpires && !parseSeconds(message.expires, headerExpires))
+  if (hasExpires && !ContactHeader::parseSeconds(message.expires, headerExpires))
     return exchange.answer(400, "Bad Expires");
 
   bool wildcard = false;
   bool malformed = false;
   std::vector<ContactRequest> requests;
-  forEachHeader(message, SIP_HDR_CONTACT, [&](sip_hdr const& header) {
+  forEachHeaderValue(message, SIP_HDR_CONTACT, [&](sip_hdr const& header) {
     pl value = header.val;
     if (pl_strcmp(&value, "*") == 0) {
       wildcard = true;
       return true;
     }
-    sip_addr address;
-    uint32_t expires = headerExpires;
-    pl parameter;
-    CNameAddr contact;
-    if (requests.size() == kMaximumContacts || sip_addr_decode(&address, &value) != 0 ||
-        !contact.Parse(address.auri.p, address.auri.l) ||
-        (msg_param_decode(&address.params, "expires", &parameter) == 0 &&
-         !parseSeconds(parameter, expires))) {
+    ContactRequest request;
+    if (requests.size() == kMaximumContacts || !ContactHeader::parse(value, request.header)) {
       malformed = true;
       return false;
     }
-    pl end;
-    requests.push_back(ContactRequest{contact, text(address.auri), text(header.val),
-                                      std::min<uint32_t>(expires, maximum),
-                                      msg_param_exists(&address.params, "reg-id", &end) == 0});
+    request.expires = request.header.hasExpires ? range.grant(true, request.header.expires)
+                                                : range.grant(hasExpires, headerExpires);
+    requests.push_back(std::move(request));
     return true;
   });
   if (malformed)
@@ -219,80 +174,62 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
   if (wildcard && (!requests.empty() || !hasExpires || headerExpires != 0))
     return exchange.answer(400, "Bad Wildcard Contact");
   for (ContactRequest const& request : requests)
-    if (request.expires != 0 && request.expires < minimum)
-      return exchange.answer(423, "Interval Too Brief", "Min-Expires: " + std::to_string(minimum) + "\r\n");
-  Bindings& bindings = entryOf(identity, face, created);
-  size_t const before = bindings.byContact.size();
-  size_t added = 0;
-  for (ContactRequest const& request : requests)
-    added += request.expires != 0 && bindings.byContact.count(request.key) == 0;
-  if (before + added > kMaximumBindings)
-    return exchange.answer(403, "Too Many Bindings");
-
+    if (request.expires != 0 && request.expires < range.minimum)
+      return exchange.answer(423, "Interval Too Brief",
+                             "Min-Expires: " + std::to_string(range.minimum) + "\r\n");
+  Bindings& bindings = entryOf(identity);
+  bindings.dynamic = bindings.dynamic || created;
+  bindings.face = face;
+  switch (order(bindings, requests, wildcard, message.callid, message.cseq.num)) {
+    case Order::OUT_OF_ORDER:
+      return exchange.answer(400, "Out of Order");
+    case Order::RETRANSMITTED:
+      return exchange.answer(200, "OK", bindingHeaders(bindings));
+    case Order::NEW:
+      break;
+  }
+  size_t const before = bindings.all.size();
   if (wildcard)
     removeAll(bindings);
-  Origin const origin{text(message.callid), message.cseq.num, sourceOf(message),
-                      sip_transp_param(message.tp)};
   for (ContactRequest const& request : requests) {
-    if (request.expires != 0) {
-      add(bindings, request, origin);
+    Binding* const binding = request.expires == 0 ? find(bindings, request.header) : nullptr;
+    if (binding)
+      remove(*binding);
+  }
+  CHostPort const received = sourceOf(message);
+  std::vector<Binding*> kept;
+  for (ContactRequest const& request : requests) {
+    if (request.expires == 0)
       continue;
-    }
-    auto const found = bindings.byContact.find(request.key);
-    if (found != bindings.byContact.end())
-      remove(*found->second);
+    Binding* binding = find(bindings, request.header);
+    if (!binding && bindings.all.size() >= kMaximumBindings)
+      giveWay(exchange, bindings, kept, request);
+    binding = add(bindings, request, message, received, binding);
+    if (binding)
+      kept.push_back(binding);
   }
   reportTransition(bindings, before);
   exchange.answer(200, "OK", bindingHeaders(bindings));
 }
 
 bool Registrar::authenticated(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to) {
+  bool stale = false;
+  if (checkCredentials(exchange.request(), identity, to, nullptr, stale) > 0)
+    return true;
   String error;
   Vector<LS_ProtocolRealm> realms;
   m_clock.measure([&] { LS_getInboundAuthenticationChallenge(error, realms, identity, nullptr); });
   if (realms.isEmpty())
     return true;
-
-  sip_msg const& message = exchange.request();
-  uint64_t const now = tmr_jiffies();
-  bool stale = false;
-  unsigned int looked = 0;
-  int verdict = 0;  // 1 accepted, -1 refused, 0 no usable credentials
-  forEachHeader(message, SIP_HDR_AUTHORIZATION, [&](sip_hdr const& header) {
-    httpauth_digest_resp response;
-    if (++looked > kMaximumAuthorizations)
-      return false;
-    if (httpauth_digest_response_decode(&response, &header.val) != 0 ||
-        response.username.l > kMaximumUserName)
-      return true;
-    auto const realm = std::find_if(realms.begin(), realms.end(), [&](LS_ProtocolRealm const& candidate) {
-      return pl_strcmp(&response.realm, candidate.realm.c_str()) == 0;
-    });
-    if (realm == realms.end())
-      return true;
-    NonceGenerator::Check const check = m_nonces.check(response.nonce, response.realm, now);
-    if (check != NonceGenerator::Check::VALID) {
-      stale = stale || check == NonceGenerator::Check::STALE;
-      return true;
-    }
-    Vector<String> passwords;
-    String const user(response.username.p, response.username.l);
-    m_clock.measure([&] {
-      LS_getInboundAuthenticationResponse(error, passwords, identity, to, realm->protocol, realm->realm, user,
-                                          nullptr);
-    });
-    bool const matches = std::any_of(passwords.begin(), passwords.end(), [&](String const& password) {
-      return digestResponseMatches(response, message.met, password.c_str());
-    });
-    verdict = matches ? 1 : -1;
-    return false;
-  });
+  int const verdict = checkCredentials(exchange.request(), identity, to, &realms, stale);
   if (verdict > 0)
     return true;
   if (verdict < 0) {
+    ++m_failedAuthentications;
     exchange.answer(403, "Forbidden");
     return false;
   }
+  uint64_t const now = tmr_jiffies();
   std::string challenges;
   for (LS_ProtocolRealm const& realm : realms) {
     pl name;
@@ -303,128 +240,260 @@ bool Registrar::authenticated(Exchange& exchange, LS_IIdentity* identity, CNameA
   return false;
 }
 
-void Registrar::add(Bindings& bindings,
-                    ContactRequest const& request,
-                    Origin const& origin,
-                    uint64_t expiresAtMs) {
-  CHostPort const received = hostPortOf(origin.source);
+void Registrar::dropRemoved(std::vector<LS_IIdentity const*> const& removed, bool checkAll) {
+  for (LS_IIdentity const* identity : removed) {
+    auto const found = m_bindings.find(const_cast<LS_IIdentity*>(identity));
+    if (found != m_bindings.end())
+      drop(found);
+  }
+  if (!checkAll)
+    return;
+  for (auto entry = m_bindings.begin(); entry != m_bindings.end();) {
+    auto const next = std::next(entry);
+    LS_IIdentity* const identity = entry->first;
+    bool const present = m_clock.measure([&] {
+      RefPtr<LS_ILocationService> service;
+      RefPtr<LS_IIdentity> found;
+      adoptInterface(service,
+                     [&](UUID const& iid, void** raw) { return identity->getLocationServiceIf(iid, raw); });
+      return service && LS_getIdentityIf(service.get(), identity->getName(), found).isSuccess() &&
+             found.get() == identity;
+    });
+    if (!present)
+      drop(entry);
+    entry = next;
+  }
+}
+
+std::vector<Registrar::BindingView> Registrar::bindings(LS_IIdentity const* identity) const {
+  uint64_t const now = tmr_jiffies();
+  std::vector<BindingView> views;
+  for (auto const& entry : m_bindings) {
+    if (identity && entry.first != identity)
+      continue;
+    for (auto const& held : entry.second.all) {
+      Binding const& binding = *held;
+      char source[80];
+      re_snprintf(source, sizeof source, "%s:%J", sip_transp_name(binding.transport), &binding.source);
+      std::string text = source;
+      std::transform(text.begin(), text.end(), text.begin(),
+                     [](char c) { return static_cast<char>(std::tolower(static_cast<unsigned char>(c))); });
+      views.push_back(BindingView{entry.first, binding.uri,
+                                  binding.expiresAtMs > now ? binding.expiresAtMs - now : 0, binding.callId,
+                                  std::move(text)});
+    }
+  }
+  return views;
+}
+
+void Registrar::drop(std::map<LS_IIdentity*, Bindings>::iterator entry) {
+  size_t const before = entry->second.all.size();
+  m_bindingsDropped += before;
+  removeAll(entry->second);
+  reportTransition(entry->second, before);
+  m_bindings.erase(entry);
+}
+
+int Registrar::checkCredentials(sip_msg const& message,
+                                LS_IIdentity* identity,
+                                CNameAddr const& to,
+                                Vector<LS_ProtocolRealm> const* realms,
+                                bool& stale) {
+  uint64_t const now = tmr_jiffies();
+  unsigned int looked = 0;
+  int verdict = 0;
+  forEachHeaderValue(message, SIP_HDR_AUTHORIZATION, [&](sip_hdr const& header) {
+    httpauth_digest_resp response;
+    if (++looked > kMaximumAuthorizations)
+      return false;
+    if (httpauth_digest_response_decode(&response, &header.val) != 0 ||
+        response.username.l > kMaximumUserName)
+      return true;
+    LS_AuthenticationProtocol::Type protocol = LS_AuthenticationProtocol::HTTP;
+    if (realms) {
+      auto const realm = std::find_if(realms->begin(), realms->end(), [&](LS_ProtocolRealm const& candidate) {
+        return pl_strcmp(&response.realm, candidate.realm.c_str()) == 0;
+      });
+      if (realm == realms->end())
+        return true;
+      protocol = realm->protocol;
+    }
+    NonceGenerator::Check const check = m_nonces.check(response.nonce, response.realm, now);
+    if (check != NonceGenerator::Check::VALID) {
+      stale = stale || check == NonceGenerator::Check::STALE;
+      return true;
+    }
+    String error;
+    Vector<String> passwords;
+    String const user(response.username.p, response.username.l);
+    String const realm(response.realm.p, response.realm.l);
+    m_clock.measure([&] {
+      LS_getInboundAuthenticationResponse(error, passwords, identity, to, protocol, realm, user, nullptr);
+    });
+    bool const matches = std::any_of(passwords.begin(), passwords.end(), [&](String const& password) {
+      return digestResponseMatches(response, message.met, password.c_str());
+    });
+    verdict = matches ? 1 : -1;
+    return false;
+  });
+  return verdict;
+}
+
+Registrar::Order Registrar::order(Bindings& bindings,
+                                  std::vector<ContactRequest> const& requests,
+                                  bool wildcard,
+                                  pl const& callId,
+                                  uint32_t cseq) {
+  Order verdict = Order::NEW;
+  auto judge = [&](Binding const& binding) {
+    if (pl_strcmp(&callId, binding.callId.c_str()) != 0)
+      return;
+    if (cseq < binding.cseq)
+      verdict = Order::OUT_OF_ORDER;
+    else if (cseq == binding.cseq && verdict == Order::NEW)
+      verdict = Order::RETRANSMITTED;
+  };
+  if (wildcard) {
+    for (auto const& binding : bindings.all)
+      judge(*binding);
+  }
+  for (ContactRequest const& request : requests)
+    if (Binding const* const binding = find(bindings, request.header))
+      judge(*binding);
+  return verdict;
+}
+
+Registrar::Binding* Registrar::find(Bindings& bindings, ContactHeader const& contact) {
+  if (!contact.instance.empty())
+    for (auto const& binding : bindings.all)
+      if (binding->instance == contact.instance && binding->regId == contact.regId)
+        return binding.get();
+  // A refresh names its binding as it was written, and then the text
+  // decides without parsing both URIs again.
+  for (auto const& binding : bindings.all)
+    if (binding->uri == contact.uri)
+      return binding.get();
+  pl uri;
+  pl_set_str(&uri, contact.uri.c_str());
+  for (auto const& binding : bindings.all) {
+    pl other;
+    pl_set_str(&other, binding->uri.c_str());
+    if (SipUriComparison::equal(uri, other))
+      return binding.get();
+  }
+  return nullptr;
+}
+
+Registrar::Binding* Registrar::add(Bindings& bindings,
+                                   ContactRequest const& request,
+                                   sip_msg const& message,
+                                   CHostPort const& received,
+                                   Binding* binding) {
+  ContactHeader const& header = request.header;
+  std::string const callId = text(message.callid);
+  std::string natedTarget;
+  pl uri;
+  pl_set_str(&uri, header.uri.c_str());
+  bool const nated = NatTraversal::natedTarget(uri, message.src, natedTarget);
+  CNameAddr target = header.contact;
+  if (nated && !target.Parse(natedTarget.data(), natedTarget.size()))
+    target = header.contact;
+  // The face knows a contact by its text: one filed under another target
+  // (a new NAT mapping, or an instance's new URI) goes first.
+  if (binding && binding->contact != target)
+    m_clock.measure([&] { bindings.face->removeContact(binding->contact, binding->callId.c_str()); });
   XCode const added = m_clock.measure([&] {
-    return bindings.face->addContact(origin.callId.c_str(), request.contact, received, "", "", 0,
-                                     request.expires);
+    return bindings.face->addContact(callId.c_str(), target, received, "", "", header.q, request.expires);
   });
   // A contact configured statically on the face stands as registered already.
-  if (added.isFailure())
-    return;
-  std::unique_ptr<Binding>& slot = bindings.byContact[request.key];
-  bool const fresh = !slot;
-  if (fresh) {
-    slot = std::make_unique<Binding>();
-    slot->owner = &bindings;
-    slot->contact = request.contact;
+  if (added.isFailure()) {
+    if (binding)
+      forget(*binding);
+    return nullptr;
+  }
+  bool const fresh = !binding;
+  if (!binding) {
+    bindings.all.push_back(std::make_unique<Binding>());
+    binding = bindings.all.back().get();
+    binding->registrar = this;
+    binding->owner = &bindings;
   } else {
-    unschedule(*slot);
+    unschedule(*binding);
   }
-  slot->contactText = request.text;
-  slot->callId = origin.callId;
-  slot->cseq = origin.cseq;
-  slot->source = origin.source;
-  slot->transport = origin.transport;
-  slot->flowBound = request.outbound && std::strcmp(origin.transport, sip_transp_param(SIP_TRANSP_UDP)) != 0;
-  slot->expiresAtMs = expiresAtMs ? expiresAtMs : tmr_jiffies() + uint64_t{request.expires} * 1000;
-  schedule(*slot);
-  record(fresh ? StoreChange::Kind::ADDED : StoreChange::Kind::REFRESHED, *slot);
+  binding->contact = target;
+  binding->uri = header.uri;
+  binding->parameters = header.parameters;
+  binding->instance = header.instance;
+  binding->regId = header.regId;
+  binding->callId = callId;
+  binding->cseq = message.cseq.num;
+  binding->source = message.src;
+  binding->transport = message.tp;
+  binding->expiresAtMs = tmr_jiffies() + uint64_t{request.expires} * 1000;
+  schedule(*binding);
+  record(fresh ? StoreChange::Kind::ADDED : StoreChange::Kind::REFRESHED, *binding);
+  binding->connection = static_cast<sip_keepalive*>(mem_deref(binding->connection));
+  if (nated && message.tp != SIP_TRANSP_UDP && m_stack)
+    sip_keepalive_start(&binding->connection, m_stack, &message, kConnectionWatchSeconds, onConnectionClosed,
+                        binding);
+  if (m_pinger) {
+    if (nated && message.tp == SIP_TRANSP_UDP)
+      m_pinger->watch(binding, natedTarget, message.src, message.sock);
+    else
+      m_pinger->forget(binding);
+  }
+  return binding;
 }
 
-void Registrar::record(StoreChange::Kind kind, Binding const& binding) {
-  bool const kept = kind == StoreChange::Kind::ADDED || kind == StoreChange::Kind::REFRESHED;
-  if (!m_store || m_replacing || (binding.flowBound && kept))
-    return;
-  Bindings const& bindings = *binding.owner;
-  StoredBinding stored;
-  stored.service = bindings.serviceName;
-  stored.identity = bindings.identityName;
-  for (auto const& entry : bindings.byContact)
-    if (entry.second.get() == &binding)
-      stored.uri = entry.first;
-  if (kept) {
-    stored.contact = binding.contactText;
-    stored.callId = binding.callId;
-    stored.cseq = binding.cseq;
-    stored.source = binding.source;
-    stored.transport = binding.transport;
-    stored.expiresAtMs = binding.expiresAtMs;
-    stored.dynamic = bindings.dynamic;
-  }
-  m_store->record(kind, stored);
-}
-
-bool Registrar::replace(RefPtr<LS_IIdentity> const& identity,
-                        bool dynamic,
-                        std::vector<StoredBinding> const& stored) {
-  RefPtr<LS_IRegistrationInbound> const face = faceOf(identity.get());
-  if (!face)
-    return false;
-  Bindings& bindings = entryOf(identity, face, dynamic);
-  size_t const before = bindings.byContact.size();
-  m_replacing = true;
-  for (auto entry = bindings.byContact.begin(); entry != bindings.byContact.end();) {
-    std::string const& key = entry->first;
-    Binding& binding = *(entry++)->second;
-    bool const kept = std::any_of(stored.begin(), stored.end(),
-                                  [&](StoredBinding const& wanted) { return wanted.uri == key; });
-    if (!kept)
-      remove(binding);
-  }
-  uint64_t const now = tmr_jiffies();
-  for (StoredBinding const& wanted : stored) {
-    ContactRequest request;
-    if (wanted.expiresAtMs <= now || !request.contact.Parse(wanted.uri.data(), wanted.uri.size()))
+void Registrar::giveWay(Exchange& exchange,
+                        Bindings& bindings,
+                        std::vector<Binding*> const& kept,
+                        ContactRequest const& newcomer) {
+  Binding* stalest = nullptr;
+  for (auto const& binding : bindings.all) {
+    if (std::find(kept.begin(), kept.end(), binding.get()) != kept.end())
       continue;
-    request.key = wanted.uri;
-    request.text = wanted.contact;
-    request.outbound = false;
-    request.expires =
-        static_cast<uint32_t>(std::min<uint64_t>((wanted.expiresAtMs - now + 999) / 1000, UINT32_MAX));
-    add(bindings, request, Origin{wanted.callId, wanted.cseq, wanted.source, transportName(wanted.transport)},
-        wanted.expiresAtMs);
+    if (!stalest || binding->expiresAtMs < stalest->expiresAtMs)
+      stalest = binding.get();
   }
-  m_replacing = false;
-  reportTransition(bindings, before);
-  forgetIfUnbound(identity.get(), dynamic);
-  return true;
+  if (!stalest)
+    return;
+  exchange.session().flushDebugLines();
+  std::cerr << "location-gateway: " << ScriptSession::pathOf(bindings.identity.get()) << ": <" << stalest->uri
+            << "> gives way to <" << newcomer.header.uri << ">, " << kMaximumBindings << " bindings at most"
+            << std::endl;
+  remove(*stalest);
 }
 
-std::vector<BindingStore::IdentityName> Registrar::boundIdentities() const {
-  std::vector<BindingStore::IdentityName> names;
-  for (auto const& entry : m_bindings)
-    if (!entry.second.byContact.empty())
-      names.emplace_back(entry.second.serviceName, entry.second.identityName);
-  return names;
-}
-
-void Registrar::remove(Binding& binding, StoreChange::Kind why) {
-  record(why, binding);
+void Registrar::forget(Binding& binding) {
   unschedule(binding);
+  if (m_pinger)
+    m_pinger->forget(&binding);
+  std::vector<std::unique_ptr<Binding>>& all = binding.owner->all;
+  all.erase(std::find_if(all.begin(), all.end(),
+                         [&](std::unique_ptr<Binding> const& each) { return each.get() == &binding; }));
+}
+
+void Registrar::remove(Binding& binding) {
+  record(StoreChange::Kind::REMOVED, binding);
   Bindings& bindings = *binding.owner;
   m_clock.measure([&] { bindings.face->removeContact(binding.contact, binding.callId.c_str()); });
-  for (auto entry = bindings.byContact.begin(); entry != bindings.byContact.end(); ++entry)
-    if (entry->second.get() == &binding) {
-      bindings.byContact.erase(entry);
-      return;
-    }
+  forget(binding);
 }
 
 void Registrar::removeAll(Bindings& bindings) {
-  for (auto& entry : bindings.byContact) {
-    record(StoreChange::Kind::REMOVED, *entry.second);
-    unschedule(*entry.second);
+  for (auto const& binding : bindings.all) {
+    record(StoreChange::Kind::REMOVED, *binding);
+    unschedule(*binding);
+    if (m_pinger)
+      m_pinger->forget(binding.get());
   }
-  bindings.byContact.clear();
+  bindings.all.clear();
   m_clock.measure([&] { bindings.face->removeContacts(); });
 }
 
 void Registrar::reportTransition(Bindings& bindings, size_t before) {
-  size_t const after = bindings.byContact.size();
+  size_t const after = bindings.all.size();
   if (before == 0 && after != 0)
     m_clock.measure([&] { bindings.identity->isInboundRegistered(); });
   else if (before != 0 && after == 0)
@@ -434,12 +503,14 @@ void Registrar::reportTransition(Bindings& bindings, size_t before) {
 std::string Registrar::bindingHeaders(Bindings const& bindings) {
   uint64_t const now = tmr_jiffies();
   std::string headers;
-  for (auto const& entry : bindings.byContact) {
-    uint64_t const remainingMs = entry.second->expiresAtMs > now ? entry.second->expiresAtMs - now : 0;
-    headers +=
-        "Contact: <" + entry.first + ">;expires=" + std::to_string((remainingMs + 999) / 1000) + "\r\n";
+  for (auto const& binding : bindings.all) {
+    uint64_t const remainingMs = binding->expiresAtMs > now ? binding->expiresAtMs - now : 0;
+    headers += "Contact: <" + binding->uri + ">" + binding->parameters +
+               ";expires=" + std::to_string((remainingMs + 999) / 1000) + "\r\n";
   }
-  return headers;
+  char date[64];
+  re_snprintf(date, sizeof date, "Date: %H\r\n", fmt_gmtime, nullptr);
+  return headers + date + Capabilities::kAllow + Capabilities::kSupported;
 }
 
 void Registrar::schedule(Binding& binding) {
@@ -465,13 +536,174 @@ void Registrar::rearm() {
 void Registrar::onSweep(void* argument) {
   Registrar& registrar = *static_cast<Registrar*>(argument);
   uint64_t const now = tmr_jiffies();
-  while (!registrar.m_expiries.empty() && registrar.m_expiries.begin()->first <= now) {
-    Binding& binding = *registrar.m_expiries.begin()->second;
-    Bindings& bindings = *binding.owner;
-    LS_IIdentity* const identity = bindings.identity.get();
-    registrar.remove(binding, StoreChange::Kind::EXPIRED);
-    registrar.reportTransition(bindings, 1);
-    registrar.forgetIfUnbound(identity, false);
-  }
+  while (!registrar.m_expiries.empty() && registrar.m_expiries.begin()->first <= now)
+    registrar.lose(*registrar.m_expiries.begin()->second, nullptr);
   registrar.rearm();
+}
+
+void Registrar::lose(Binding& binding, char const* reason) {
+  Bindings& bindings = *binding.owner;
+  LS_IIdentity* const identity = bindings.identity.get();
+  if (reason)
+    std::cerr << "location-gateway: " << ScriptSession::pathOf(identity) << ": <" << binding.uri
+              << "> dropped, " << reason << std::endl;
+  // Ran out: the store deletes it only if its row ran out too.
+  if (!reason) {
+    record(StoreChange::Kind::EXPIRED, binding);
+    bool const replacing = m_replacing;
+    m_replacing = true;
+    remove(binding);
+    m_replacing = replacing;
+  } else {
+    remove(binding);
+  }
+  reportTransition(bindings, 1);
+  forgetIfUnbound(identity, false);
+}
+
+Registrar::Bindings& Registrar::entryOf(RefPtr<LS_IIdentity> const& identity) {
+  Bindings& bindings = m_bindings[identity.get()];
+  if (bindings.identity)
+    return bindings;
+  bindings.identity = identity;
+  m_clock.measure([&] {
+    bindings.identityName = identity->getName().str();
+    RefPtr<LS_ILocationService> service;
+    adoptInterface(service,
+                   [&](UUID const& iid, void** raw) { return identity->getLocationServiceIf(iid, raw); });
+    if (service)
+      bindings.serviceName = service->getName().str();
+  });
+  return bindings;
+}
+
+void Registrar::record(StoreChange::Kind kind, Binding const& binding) {
+  bool const kept = kind == StoreChange::Kind::ADDED || kind == StoreChange::Kind::REFRESHED;
+  bool const flowBound = !binding.regId.empty() && binding.transport != SIP_TRANSP_UDP;
+  if (!m_store || m_replacing || (flowBound && kept))
+    return;
+  Bindings const& bindings = *binding.owner;
+  StoredBinding stored;
+  stored.service = bindings.serviceName;
+  stored.identity = bindings.identityName;
+  stored.uri = binding.uri;
+  if (kept) {
+    stored.contact = "<" + binding.uri + ">" + binding.parameters;
+    stored.callId = binding.callId;
+    stored.cseq = binding.cseq;
+    char source[64];
+    re_snprintf(source, sizeof source, "%J", &binding.source);
+    stored.source = source;
+    stored.transport = transportName(binding.transport);
+    stored.expiresAtMs = binding.expiresAtMs;
+    stored.dynamic = bindings.dynamic;
+  }
+  m_store->record(kind, stored);
+}
+
+bool Registrar::replace(RefPtr<LS_IIdentity> const& identity,
+                        bool dynamic,
+                        std::vector<StoredBinding> const& stored) {
+  RefPtr<LS_IRegistrationInbound> face;
+  m_clock.measure([&] {
+    adoptInterface(face, [&](UUID const& iid, void** raw) {
+      return identity->createDynamicFaceIf(LS_IdentityFace::REGISTRATION_INBOUND, iid, raw);
+    });
+  });
+  if (!face)
+    return false;
+  Bindings& bindings = entryOf(identity);
+  bindings.dynamic = bindings.dynamic || dynamic;
+  bindings.face = face;
+  size_t const before = bindings.all.size();
+  m_replacing = true;
+  for (size_t i = bindings.all.size(); i-- > 0;) {
+    Binding& binding = *bindings.all[i];
+    bool const wanted = std::any_of(stored.begin(), stored.end(),
+                                    [&](StoredBinding const& each) { return each.uri == binding.uri; });
+    if (!wanted)
+      remove(binding);
+  }
+  uint64_t const now = tmr_jiffies();
+  for (StoredBinding const& each : stored)
+    restore(bindings, each, now);
+  m_replacing = false;
+  reportTransition(bindings, before);
+  forgetIfUnbound(identity.get(), dynamic);
+  return true;
+}
+
+void Registrar::restore(Bindings& bindings, StoredBinding const& stored, uint64_t now) {
+  ContactHeader header;
+  pl value;
+  pl_set_str(&value, stored.contact.c_str());
+  sa source;
+  if (stored.expiresAtMs <= now || !ContactHeader::parse(value, header) ||
+      sa_decode(&source, stored.source.data(), stored.source.size()) != 0)
+    return;
+  header.uri = stored.uri;
+  uint32_t const expires =
+      static_cast<uint32_t>(std::min<uint64_t>((stored.expiresAtMs - now + 999) / 1000, UINT32_MAX));
+  std::string natedTarget;
+  pl uri;
+  pl_set_str(&uri, header.uri.c_str());
+  CNameAddr target = header.contact;
+  if (NatTraversal::natedTarget(uri, source, natedTarget) &&
+      !target.Parse(natedTarget.data(), natedTarget.size()))
+    target = header.contact;
+  Binding* binding = find(bindings, header);
+  if (binding && binding->contact != target)
+    m_clock.measure([&] { bindings.face->removeContact(binding->contact, binding->callId.c_str()); });
+  CHostPort received;
+  received.Parse(stored.source.data(), stored.source.size());
+  XCode const added = m_clock.measure([&] {
+    return bindings.face->addContact(stored.callId.c_str(), target, received, "", "", header.q, expires);
+  });
+  if (added.isFailure()) {
+    if (binding)
+      forget(*binding);
+    return;
+  }
+  if (!binding) {
+    bindings.all.push_back(std::make_unique<Binding>());
+    binding = bindings.all.back().get();
+    binding->registrar = this;
+    binding->owner = &bindings;
+  } else {
+    unschedule(*binding);
+  }
+  binding->contact = target;
+  binding->uri = header.uri;
+  binding->parameters = header.parameters;
+  binding->instance = header.instance;
+  binding->regId = header.regId;
+  binding->callId = stored.callId;
+  binding->cseq = stored.cseq;
+  binding->source = source;
+  binding->transport = SIP_TRANSP_UDP;
+  for (sip_transp transport : {SIP_TRANSP_TCP, SIP_TRANSP_TLS})
+    if (stored.transport == transportName(transport))
+      binding->transport = transport;
+  binding->expiresAtMs = stored.expiresAtMs;
+  schedule(*binding);
+}
+
+std::vector<BindingStore::IdentityName> Registrar::boundIdentities() const {
+  std::vector<BindingStore::IdentityName> names;
+  for (auto const& entry : m_bindings)
+    if (!entry.second.all.empty())
+      names.emplace_back(entry.second.serviceName, entry.second.identityName);
+  return names;
+}
+
+void Registrar::onConnectionClosed(int, void* argument) {
+  Binding& binding = *static_cast<Binding*>(argument);
+  // libre has freed its keep-alive and cleared binding.connection.
+  binding.registrar->lose(binding, "its connection closed");
+}
+
+void Registrar::onPingsUnanswered(void const* binding, void* argument) {
+  Registrar& registrar = *static_cast<Registrar*>(argument);
+  std::string const reason = std::to_string(NatPinger::kMisses) + " NAT pings unanswered";
+  registrar.lose(*const_cast<Binding*>(static_cast<Binding const*>(binding)), reason.c_str());
 }

@@ -6,16 +6,42 @@
 //
 // Decisions, with their reasons:
 // - Expiry: the contact's "expires" parameter, else the Expires header,
-//   else the face's default lifetime; above the face's maximum it is cut to
+//   else the default lifetime of the face's range, or of the gateway's own
+//   when the face has none (ExpiryRange); above the maximum it is cut to
 //   the maximum; a non-zero value below the minimum gets 423 with
-//   Min-Expires, and then no contact of the request is applied.
-// - The 200 lists the identity's own bindings in effect (the ones this
-//   gateway holds for it), each with its remaining seconds.
+//   Min-Expires (RFC 3261 section 10.3, step 7), and then no contact of the
+//   request is applied.
+// - The binding a Contact names: with +sip.instance, the binding of that
+//   instance (and reg-id, when given), whatever its URI or Call-ID, so that
+//   a phone rebooted onto another port or address replaces its binding
+//   instead of leaving a dead one in front of callers (RFC 5626 section 6,
+//   RFC 5627); otherwise the binding whose URI is equal by RFC 3261 section
+//   19.1.4 (SipUriComparison).
+// - A binding keeps its Contact's parameters but expires (ContactHeader):
+//   the 200 lists the identity's own bindings in effect (the ones this
+//   gateway holds for it), each as registered with its parameters and its
+//   remaining seconds, with a Date (section 10.3, step 8). Its q goes to
+//   the face as the contact's priority, in thousandths, for the Redirector.
+// - NAT (NatTraversal): a Contact no caller can reach, registered from
+//   elsewhere, is filed on the face with the source's address and port,
+//   and the 302 names that. Over UDP, --nat-ping keeps the mapping open
+//   (NatPinger) and drops a binding whose phone stops answering. Over TCP
+//   and TLS such a binding lives as long as the connection it came on, the
+//   one way in to the phone: libre tells a connection's keep-alives when it
+//   closes, so one is attached with an interval of kConnectionWatchSeconds
+//   (46 days), which no phone is pinged at, since most do not answer CRLF
+//   pings (only RFC 5626 asks them to). libre closes a connection idle for
+//   15 minutes, and the binding goes with it.
 // - The identity is told it is registered when its first binding comes and
 //   unregistered when its last one goes (removed, expired or shut down).
 // - At most kMaximumContacts per request (400 beyond) and kMaximumBindings
-//   per identity (403 beyond), so that no phone can grow the gateway's
-//   memory at will.
+//   per identity, so that no phone can grow the gateway's memory at will.
+//   The request's removals are applied first and its refreshes and
+//   replacements take no room; a new binding beyond the limit takes the
+//   place of the identity's binding that would expire first among those
+//   the request does not touch, and the replacement is logged, as
+//   Asterisk's remove_existing does: phones take a 403 as final and would
+//   stop registering, whereas the binding given up is the stalest.
 // - A user that only the "DEFAULT" group answers registers as a dynamic
 //   identity of the user's name, which its location service bases on the
 //   group: a contact on the group's own face would be inherited by every
@@ -25,13 +51,21 @@
 // - A digest response to a nonce this process did not make counts as no
 //   credentials (a fresh 401), one to an expired nonce gets 401 with
 //   stale=true; only a wrong password on a valid nonce gets 403.
-// - A registration whose Call-ID differs from the binding's replaces it; CSeq
-//   ordering is not checked (libre's transactions already drop duplicates).
+// - Stateless, as RFC 3261 section 10.3 lets a registrar be: nothing is kept
+//   for a request until it is authenticated, and its answer leaves without a
+//   server transaction. A contact whose binding has the request's Call-ID
+//   is checked against the binding's CSeq: the same CSeq is a retransmission,
+//   answered again with the bindings in effect and changing nothing; a lower
+//   one fails the whole request with 400 (the section says only that it
+//   fails; 400 is what peers answer). Another Call-ID replaces the binding.
 //
-// - Every binding added, refreshed or removed (by a REGISTER or by running
-//   out) is reported to the binding store when there is one; what the store
+// - Every binding added, refreshed or removed (by a REGISTER, by running
+//   out, or by losing its way in) is reported to the binding store when
+//   there is one, except one bound to its connection (an outbound flow over
+//   TCP or TLS, with a reg-id), which dies with the process. What the store
 //   hands back (at start, or another gateway's changes) comes in through
-//   replace(), which reports nothing back.
+//   replace(), which reports nothing back; a binding restored so resumes NAT
+//   pings and connection watches only when its phone next registers.
 //
 // Owns the bindings' timers: destroying the registrar removes every binding
 // from its face first, so that the global count of registered contacts
@@ -46,8 +80,13 @@
 #include "CNameAddr.h"
 #include "LS_IIdentity.h"
 #include "LS_IRegistrationInbound.h"
+#include "LS_ProtocolRealm.h"
 #include "RefPtr.h"
+#include "Vector.h"
 #include "metrics/LibraryClock.h"
+#include "registrar/ContactHeader.h"
+#include "registrar/ExpiryRange.h"
+#include "registrar/NatPinger.h"
 #include "registrar/NonceGenerator.h"
 #include "sip/Libre.h"
 #include "store/BindingStore.h"
@@ -59,15 +98,23 @@ class Registrar {
   static constexpr size_t kMaximumBindings = 32;
   static constexpr size_t kMaximumContacts = 16;
 
+  static constexpr uint32_t kConnectionWatchSeconds = 4000000;
+
   explicit Registrar(LibraryClock& clock) : m_clock(clock) { tmr_init(&m_sweep); }
   ~Registrar();
   Registrar(Registrar const&) = delete;
   Registrar& operator=(Registrar const&) = delete;
 
+  // Before the first request: the stack that connections and NAT pings
+  // belong to, the range for faces that give none, and the NAT ping
+  // interval (0 for none).
+  void start(sip& stack, ExpiryRange const& expiry, uint32_t natPingSeconds);
   void handle(Exchange& exchange);
 
-  // Borrowed; null for none. Set before the first request, cleared (or
-  // closed) before the registrar dies.
+  size_t bindingCount() const { return m_expiries.size(); }
+
+  // Borrowed; null for none. Set before the first request; the registrar
+  // reports nothing to it once it is being destroyed.
   void setStore(BindingStore* store) { m_store = store; }
   // Makes the identity's bindings exactly these (on the loop's clock),
   // without reporting to the store; dynamic: the identity was created for
@@ -77,6 +124,24 @@ class Registrar {
                std::vector<StoredBinding> const& bindings);
   // The identities holding bindings, as (service, identity) names.
   std::vector<BindingStore::IdentityName> boundIdentities() const;
+  uint64_t failedAuthentications() const { return m_failedAuthentications; }
+  uint64_t bindingsDropped() const { return m_bindingsDropped; }
+  // Lets go of the bindings of identities a change removed (counted in
+  // bindingsDropped): those listed, or, when checkAll (a whole location
+  // service went), every identity no longer found under its name in its
+  // service. Bindings of identities that remain are kept as they are.
+  void dropRemoved(std::vector<LS_IIdentity const*> const& removed, bool checkAll);
+
+  // One binding as the bindings question shows it.
+  struct BindingView {
+    LS_IIdentity const* identity;
+    std::string contact;  // as the REGISTER wrote it
+    uint64_t remainingMs;
+    std::string callId;
+    std::string source;  // "udp:ADDR:PORT": where the REGISTER came from
+  };
+  // The bindings held now; only the identity's when one is given.
+  std::vector<BindingView> bindings(LS_IIdentity const* identity) const;
 
  private:
   struct Bindings;
@@ -87,44 +152,43 @@ class Registrar {
   // make every transaction's own timers cost as many steps as there are
   // bindings.
   using Expiries = std::multimap<uint64_t, Binding*>;
+  // What a binding holds: what the registration said and where it came from.
   struct Binding {
+    Binding() = default;
+    ~Binding() { mem_deref(connection); }
+    Binding(Binding const&) = delete;
+    Binding& operator=(Binding const&) = delete;
+
+    Registrar* registrar;
     Bindings* owner;
-    CNameAddr contact;
-    std::string contactText;  // the Contact value as received, parameters included
+    CNameAddr contact;  // as filed on the face: where calls go
+    std::string uri;    // the Contact's URI as registered
+    std::string parameters;
+    std::string instance;
+    std::string regId;
     std::string callId;
     uint32_t cseq;
-    std::string source;     // "ADDR:PORT" the REGISTER came from
-    char const* transport;  // "udp", "tcp", "tls": libre's static names
-    // Lives only as long as its connection (an outbound flow over TCP or
-    // TLS): never stored, since the connection dies with the process.
-    bool flowBound;
-    uint64_t expiresAtMs;
+    uint64_t expiresAtMs;       // on the stack's clock, tmr_jiffies()
+    sa source;                  // where the REGISTER came from
+    sip_transp transport;       // and over what
     Expiries::iterator expiry;  // its entry in m_expiries
+    // Over TCP or TLS, for a NATed contact: the watch on its connection.
+    sip_keepalive* connection = nullptr;
   };
-  // One identity's bindings, by contact text.
+  // One identity's bindings, oldest first.
   struct Bindings {
     RefPtr<LS_IIdentity> identity;
     bool dynamic = false;  // created by this registrar for a "DEFAULT" user
     RefPtr<LS_IRegistrationInbound> face;
-    std::map<std::string, std::unique_ptr<Binding>> byContact;
+    std::vector<std::unique_ptr<Binding>> all;
     // The names the store files the bindings under, read once.
     std::string serviceName;
     std::string identityName;
   };
   // One Contact of a REGISTER, checked and with its expiry worked out.
   struct ContactRequest {
-    CNameAddr contact;
-    std::string key;
-    std::string text;  // the whole Contact value
+    ContactHeader header;
     uint32_t expires;
-    bool outbound;  // it has a reg-id: an RFC 5626 flow when over a connection
-  };
-  // Where a binding came from: the REGISTER's, or a stored one's.
-  struct Origin {
-    std::string callId;
-    uint32_t cseq;
-    std::string source;
-    char const* transport;
   };
 
   // The identity whose face takes the contacts: resolved itself, or for a
@@ -137,25 +201,59 @@ class Registrar {
   // dynamic identity made for it with it.
   void forgetIfUnbound(LS_IIdentity* identity, bool created);
   // Whether the request carries valid credentials; answers 401 or 403
-  // itself when not.
+  // itself when not. Credentials the library takes for their realm are
+  // accepted before the realms to challenge with are asked for: that list
+  // only matters when they are missing or wrong, and asking for it was the
+  // library's largest cost of an authenticated REGISTER.
   bool authenticated(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to);
-  // The identity's registration face, made when it has none; null when it
-  // cannot have one.
-  RefPtr<LS_IRegistrationInbound> faceOf(LS_IIdentity* identity);
-  // The table entry for identity, made with its face and names when new.
-  Bindings& entryOf(RefPtr<LS_IIdentity> const& identity,
-                    RefPtr<LS_IRegistrationInbound> const& face,
-                    bool dynamic);
-  // expiresAtMs: 0 for request.expires from now.
-  void add(Bindings& bindings, ContactRequest const& request, Origin const& origin, uint64_t expiresAtMs = 0);
+  // The first Authorization header with a valid nonce checked against the
+  // library's passwords: 1 when one matches, -1 when none does, 0 when
+  // there is no such header. With realms, only a header for one of them
+  // counts; without, any realm, for HTTP digest. stale is set when a
+  // header's nonce has expired.
+  int checkCredentials(sip_msg const& message,
+                       LS_IIdentity* identity,
+                       CNameAddr const& to,
+                       Vector<LS_ProtocolRealm> const* realms,
+                       bool& stale);
+  // What the request's CSeq makes of it against the bindings it names (all
+  // of them for a wildcard) that carry its Call-ID.
+  enum class Order { NEW, RETRANSMITTED, OUT_OF_ORDER };
+  static Order order(Bindings& bindings,
+                     std::vector<ContactRequest> const& requests,
+                     bool wildcard,
+                     pl const& callId,
+                     uint32_t cseq);
+  // The binding a contact names, or null.
+  static Binding* find(Bindings& bindings, ContactHeader const& contact);
+  // Files the contact on the face as binding (null for a new one); the
+  // binding, or null when the face refused it.
+  Binding* add(Bindings& bindings,
+               ContactRequest const& request,
+               sip_msg const& message,
+               CHostPort const& received,
+               Binding* binding);
+  // Makes room for one more binding: removes the one that expires first
+  // among those not in kept, and logs it.
+  void giveWay(Exchange& exchange,
+               Bindings& bindings,
+               std::vector<Binding*> const& kept,
+               ContactRequest const& newcomer);
+  // The table entry for identity, its names read when it is new.
+  Bindings& entryOf(RefPtr<LS_IIdentity> const& identity);
+  // Files a stored binding on the face as add() files a REGISTER's.
+  void restore(Bindings& bindings, StoredBinding const& stored, uint64_t now);
   void record(StoreChange::Kind kind, Binding const& binding);
+  // Drops the binding from the table only, when its face no longer has it.
+  void forget(Binding& binding);
   // Leaves telling the identity to the caller.
   void removeAll(Bindings& bindings);
-  // Removes one binding from its face and the table, reporting why to the
-  // store (REMOVED or EXPIRED). Invalidates binding.
-  void remove(Binding& binding, StoreChange::Kind why = StoreChange::Kind::REMOVED);
+  // Removes one binding from its face and the table; tells the identity when
+  // it was its last. Invalidates binding.
+  void remove(Binding& binding);
   // Tells the identity when its first binding came or its last went.
   void reportTransition(Bindings& bindings, size_t before);
+  // The 200's own header lines: the bindings, the date, what is supported.
   static std::string bindingHeaders(Bindings const& bindings);
   // (Re)files the binding under its time; sets the stack timer when it is
   // now the earliest.
@@ -163,14 +261,27 @@ class Registrar {
   void unschedule(Binding& binding);
   // Sets the stack timer for the earliest expiry, or stops it.
   void rearm();
+  // Drops every binding of the table entry's identity, and the entry.
+  void drop(std::map<LS_IIdentity*, Bindings>::iterator entry);
   // Removes every binding whose time has run out.
   static void onSweep(void* registrar);
+  // Removes a binding outside a request: expired (reason null), or its way
+  // in gone, its connection closed or its NAT pings unanswered (logged with
+  // reason).
+  void lose(Binding& binding, char const* reason);
+  static void onConnectionClosed(int error, void* binding);
+  static void onPingsUnanswered(void const* binding, void* registrar);
 
   LibraryClock& m_clock;
   BindingStore* m_store = nullptr;
   bool m_replacing = false;  // in replace(): changes come from the store
+  sip* m_stack = nullptr;
+  ExpiryRange m_expiry;
+  std::unique_ptr<NatPinger> m_pinger;
   NonceGenerator m_nonces;
   std::map<LS_IIdentity*, Bindings> m_bindings;
   Expiries m_expiries;
   tmr m_sweep;
+  uint64_t m_failedAuthentications = 0;
+  uint64_t m_bindingsDropped = 0;
 };

@@ -6,6 +6,27 @@ namespace {
 // URI could denote someone else.
 constexpr size_t kMaximumUriLength = 1024;
 
+// FNV-1a over the fields that name a request, after a key drawn once per
+// process: tags of different requests differ, and nobody outside can make
+// two requests share one.
+uint64_t toTag(sip_msg const& request) {
+  static uint64_t const key = rand_u64();
+  uint64_t hash = 14695981039346656037ull ^ key;
+  auto mix = [&](char const* bytes, size_t length) {
+    for (size_t i = 0; i < length; ++i) {
+      hash ^= static_cast<unsigned char>(bytes[i]);
+      hash *= 1099511628211ull;
+    }
+    hash ^= 0x100;  // a field's end: "ab" then "c" differs from "a" then "bc"
+    hash *= 1099511628211ull;
+  };
+  for (pl const* field : {&request.callid, &request.from.tag, &request.cseq.met, &request.via.branch})
+    mix(field->p, field->l);
+  uint32_t const number = request.cseq.num;
+  mix(reinterpret_cast<char const*>(&number), sizeof number);
+  return hash;
+}
+
 }  // namespace
 
 RefPtr<LS_IIdentity> Exchange::resolveOrAnswer(pl const& uri, CNameAddr& nameAddr) {
@@ -28,20 +49,11 @@ RefPtr<LS_IIdentity> Exchange::resolveOrAnswer(pl const& uri, CNameAddr& nameAdd
 }
 
 void Exchange::answer(uint16_t code, char const* reason, std::string const& headers) {
-  // An INVITE is answered without a transaction, as a stateless redirect
-  // server may: its final answer would be retransmitted on a timer every
-  // half second until the ACK, and the stack files each such timer by
-  // walking its sorted list past every transaction of the last 32 seconds,
-  // which made each INVITE cost as much as the recent traffic. A lost answer
-  // brings the INVITE again, and it is answered again the same way.
-  if (pl_strcmp(&m_request.met, "INVITE") == 0) {
-    sip_replyf(&m_stack, &m_request, code, reason, "%sContent-Length: 0\r\n\r\n", headers.c_str());
-  } else {
-    // The stack owns the transaction once it has answered.
-    sip_strans* transaction = nullptr;
-    sip_treplyf(&transaction, nullptr, &m_stack, &m_request, false, code, reason,
-                "%sContent-Length: 0\r\n\r\n", headers.c_str());
-  }
+  // libre draws the tag it adds at random for every message it receives;
+  // the request is the stack's for the length of this call, and the tag is
+  // read by nothing but the answer.
+  const_cast<sip_msg&>(m_request).tag = toTag(m_request);
+  sip_replyf(&m_stack, &m_request, code, reason, "%sContent-Length: 0\r\n\r\n", headers.c_str());
   m_log.write(m_request, m_result, code);
   m_session.flushDebugLines();
 }

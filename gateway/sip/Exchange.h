@@ -1,10 +1,8 @@
 // Exchange: one request being answered. It carries what the answer needs (the
 // stack, the request, the session whose library answers, the log and the
 // clock) and what the log line says about the lookup, and sends the final
-// answer through a server transaction of the stack, which absorbs
-// retransmissions of the request and retransmits the answer itself, except
-// for an INVITE, which is answered without one (see answer()). Each
-// exchange answers exactly once; the log line leaves with the answer.
+// answer statelessly (see answer()). Each exchange answers exactly once; the
+// log line leaves with the answer.
 #pragma once
 
 #include <string>
@@ -33,7 +31,20 @@ class Exchange {
   // refuses, else 404.
   RefPtr<LS_IIdentity> resolveOrAnswer(pl const& uri, CNameAddr& nameAddr);
 
-  // headers: complete header lines, each ending in CRLF.
+  // What the log line says about the lookup, for a part that looked
+  // without resolveOrAnswer: "service/identity" or the error text in quotes.
+  void setResult(std::string result) { m_result = std::move(result); }
+
+  // Sends the final answer without a server transaction, as a stateless
+  // registrar and redirect server may: the stack keeps nothing once it has
+  // left, and a retransmitted request is simply answered again. A server
+  // transaction would hold some kilobytes for 32 s after every answer and
+  // walk the stack's sorted timer list, so that a registration storm made
+  // memory and CPU per request grow with the traffic of the last half
+  // minute. The To tag is drawn from the request's Call-ID, From tag, CSeq
+  // and branch under a key of this process, so that a retransmission gets
+  // the answer it got the first time, tag included (RFC 3261 section
+  // 8.2.7). headers: complete header lines, each ending in CRLF.
   void answer(uint16_t code, char const* reason, std::string const& headers = std::string());
 
  private:

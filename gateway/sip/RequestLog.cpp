@@ -15,11 +15,22 @@ void writeToken(pl const& token) {
 
 }  // namespace
 
+RequestLog::~RequestLog() {
+  tmr_cancel(&m_flush);
+  std::fflush(stdout);
+}
+
+void RequestLog::onFlush(void*) {
+  std::fflush(stdout);
+}
+
 void RequestLog::write(sip_msg const& request, std::string const& result, uint16_t code) {
   ++m_requests;
+  m_answers.count(request.met, code);
   writeToken(request.met);
   std::putchar(' ');
   writeToken(request.ruri);
   std::printf(" %s %u\n", result.c_str(), static_cast<unsigned int>(code));
-  std::fflush(stdout);
+  if (!tmr_isrunning(&m_flush))
+    tmr_start(&m_flush, kFlushMs, onFlush, this);
 }

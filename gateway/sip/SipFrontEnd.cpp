@@ -1,21 +1,28 @@
 #include "sip/SipFrontEnd.h"
 
+#include <algorithm>
 #include <cstring>
 
+#include "SipStatistics.h"
+#include "sip/Capabilities.h"
 #include "sip/Exchange.h"
 
 namespace {
 
-char const kAllow[] = "Allow: REGISTER, INVITE, ACK, CANCEL, MESSAGE, SUBSCRIBE, OPTIONS\r\n";
-
 // Hash table sizes of the stack: client transactions, server transactions,
-// TCP connections. A server transaction outlives its answer by 32 s over
-// UDP, so a registrar answering thousands of requests a second holds some
-// hundred thousand at once; the table (8 bytes a bucket on 32-bit) keeps
-// their chains short.
+// TCP connections. Every request is answered statelessly (see
+// Exchange::answer), so the server-transaction table stays empty; the stack
+// still looks each request up in it.
 constexpr uint32_t kClientTransactions = 64;
-constexpr uint32_t kServerTransactions = 32768;
+constexpr uint32_t kServerTransactions = 16;
 constexpr uint32_t kConnections = 64;
+
+// The receive (and send) buffer of each UDP socket. The kernel's default,
+// some 200 KiB, holds about a thousand requests: a burst of a storm that
+// arrives while the loop is busy or not scheduled overflows it, and the
+// phones retransmit. Kamailio enlarges its sockets likewise. The kernel
+// keeps the size within net.core.rmem_max.
+constexpr int kUdpBufferBytes = 4 * 1024 * 1024;
 
 void stopLoop(void*) {
   re_cancel();
@@ -24,6 +31,7 @@ void stopLoop(void*) {
 }  // namespace
 
 SipFrontEnd::~SipFrontEnd() {
+  m_changes.reset();
   mem_deref(m_listener);
   // Forced: a registrar that never answered the unregistration must not
   // keep a registration alive that points at a trunk about to die.
@@ -33,35 +41,66 @@ SipFrontEnd::~SipFrontEnd() {
   mem_deref(m_stack);
 }
 
-bool SipFrontEnd::start(std::string const& listen, std::string& bound, std::string& error) {
-  sa address;
-  if (sa_decode(&address, listen.c_str(), listen.size()) != 0) {
-    error = "cannot read the listen address " + listen + " (ADDR:PORT)";
+bool SipFrontEnd::start(Settings const& settings, std::string& error) {
+  if (!m_dns.open(settings.dnsServers, error))
     return false;
-  }
-  int result = sip_alloc(&m_stack, nullptr, kClientTransactions, kServerTransactions, kConnections,
-                         "location-gateway", onClosed, this);
-  if (result == 0)
-    result = sip_transp_add(m_stack, SIP_TRANSP_UDP, &address);
-  if (result == 0)
-    result = sip_transp_laddr(m_stack, &address, SIP_TRANSP_UDP, nullptr);
-  if (result == 0)
-    result = sip_listen(&m_listener, m_stack, true, onRequest, this);
+  int const result = sip_alloc(&m_stack, m_dns.client(), kClientTransactions, kServerTransactions,
+                               kConnections, "location-gateway", onClosed, this);
   if (result != 0) {
-    error = "cannot listen on " + listen + ": " + std::strerror(result);
+    error = std::string("the SIP stack cannot start: ") + std::strerror(result);
     return false;
   }
-  // TCP is a convenience: a port taken for TCP leaves the gateway on UDP.
-  sip_transp_add(m_stack, SIP_TRANSP_TCP, &address);
-  char text[64];
-  re_snprintf(text, sizeof text, "%J", &address);
-  bound = text;
-  CHostPort own;
-  own.Parse(bound.data(), bound.size());
-  m_session.stack().localHostPorts.add(own);
+  if (!m_listeners.open(*m_stack, settings.listen, error))
+    return false;
+  m_registrar.start(*m_stack, settings.expiry, settings.natPingSeconds);
+  if (sip_listen(&m_listener, m_stack, true, onRequest, this) != 0) {
+    error = "the SIP stack cannot take requests";
+    return false;
+  }
+  for (Listeners::Listener const& listener : m_listeners.listeners()) {
+    if (listener.transport != SIP_TRANSP_UDP)
+      continue;
+    char text[64];
+    re_snprintf(text, sizeof text, "%J", &listener.address);
+    CHostPort own;
+    if (own.Parse(text, std::char_traits<char>::length(text)))
+      m_session.stack().localHostPorts.add(own);
+  }
   m_trunks = std::make_unique<TrunkRegistrations>(*m_stack, m_session, m_clock);
   m_trunks->start();
   return true;
+}
+
+void SipFrontEnd::followChanges() {
+  m_changes = std::make_unique<ModelChanges>(*m_session.locationMaster());
+}
+
+void SipFrontEnd::beginChange() {
+  m_changes->begin();
+}
+
+void SipFrontEnd::endChange() {
+  m_changes->end();
+  m_registrar.dropRemoved(m_changes->removed(), m_changes->anyServiceChanged());
+  if (m_changes->anyServiceChanged())
+    m_trunks->followAll();
+  else
+    m_trunks->follow(m_changes->touched(), m_changes->removed());
+}
+
+GatewayStatistics SipFrontEnd::statistics() const {
+  GatewayStatistics statistics;
+  statistics.answers = m_log.answers().counts();
+  statistics.failedAuthentications = m_registrar.failedAuthentications();
+  statistics.bindings = m_registrar.bindingCount();
+  statistics.bindingsDropped = m_registrar.bindingsDropped();
+  statistics.registeredContacts = s_sipStatistics.getInboundRegistrations();
+  m_trunks->forEach([&](std::string const& path, bool registered) {
+    statistics.trunks.push_back(GatewayStatistics::Trunk{path, registered});
+  });
+  statistics.cpuSeconds = LibraryClock::cpuSeconds();
+  statistics.librarySeconds = m_clock.librarySeconds();
+  return statistics;
 }
 
 void SipFrontEnd::shutDown() {
@@ -78,18 +117,17 @@ void SipFrontEnd::shutDown() {
 bool SipFrontEnd::onRequest(sip_msg const* request, void* argument) {
   SipFrontEnd& frontEnd = *static_cast<SipFrontEnd*>(argument);
   sip_msg const& message = *request;
-  // An ACK gets no answer, the one for a 302 included (INVITEs are answered
-  // without a transaction, see Exchange::answer).
+  // An ACK gets no answer, the one for a 302 included (every request is
+  // answered without a transaction, see Exchange::answer).
   if (pl_strcmp(&message.met, "ACK") == 0)
     return true;
+  if (message.tp == SIP_TRANSP_UDP)
+    frontEnd.enlarge(message.sock);
   Exchange exchange(*frontEnd.m_stack, message, frontEnd.m_session, frontEnd.m_log, frontEnd.m_clock);
+  if (frontEnd.m_admission.answered(exchange))
+    return true;
   if (pl_strcmp(&message.met, "REGISTER") == 0) {
     frontEnd.m_registrar.handle(exchange);
-    return true;
-  }
-  bool const toUser = message.uri.user.l != 0;
-  if (pl_strcmp(&message.met, "OPTIONS") == 0 && !toUser) {
-    exchange.answer(200, "OK", kAllow);
     return true;
   }
   if (pl_strcmp(&message.met, "CANCEL") == 0) {
@@ -101,8 +139,15 @@ bool SipFrontEnd::onRequest(sip_msg const* request, void* argument) {
     frontEnd.m_redirector.handle(exchange);
     return true;
   }
-  exchange.answer(405, "Method Not Allowed", kAllow);
+  exchange.answer(405, "Method Not Allowed", Capabilities::kAllow);
   return true;
+}
+
+void SipFrontEnd::enlarge(void* udpSocket) {
+  if (std::find(m_enlarged.begin(), m_enlarged.end(), udpSocket) != m_enlarged.end())
+    return;
+  m_enlarged.push_back(udpSocket);
+  udp_sockbuf_set(static_cast<udp_sock*>(udpSocket), kUdpBufferBytes);
 }
 
 void SipFrontEnd::onClosed(void*) {

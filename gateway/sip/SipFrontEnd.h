@@ -1,57 +1,100 @@
 // SipFrontEnd: the SIP side of the gateway on libre: the stack with its
 // transports, the listener that hands each request to the part that answers
-// its method (Registrar for REGISTER, Redirector for requests to a user, 200
-// for OPTIONS to the gateway itself, 405 with Allow for the rest), and the
-// trunk registrations. Malformed messages never reach it: libre drops what it
+// it (Admission first, for what the gateway answers itself; then Registrar
+// for REGISTER, Redirector for requests to a user, 405 with Allow for the
+// rest), and the trunk registrations. Malformed messages never reach it: libre drops what it
 // cannot parse, and every length read here is bounded by the parts.
 //
-// Built after the scripts have run; the listen address joins the stack
-// settings' local host-ports. Owned by main; shutDown() unregisters the
+// Built after the scripts have run; every address listened on joins the
+// stack settings' local host-ports, and the stack resolves names through
+// its DnsClient. Owned by main; shutDown() unregisters the
 // trunks and closes the stack within a bounded time, after which the object
 // may die.
 #pragma once
 
 #include <memory>
 #include <string>
+#include <vector>
 
 #include "ScriptSession.h"
+#include "control/ModelChanges.h"
+#include "metrics/GatewayStatistics.h"
 #include "metrics/LibraryClock.h"
 #include "redirect/Redirector.h"
+#include "registrar/ExpiryRange.h"
 #include "registrar/Registrar.h"
+#include "sip/Admission.h"
+#include "sip/DnsClient.h"
 #include "sip/Libre.h"
+#include "sip/Listeners.h"
 #include "sip/RequestLog.h"
 #include "trunks/TrunkRegistrations.h"
 
 class SipFrontEnd {
  public:
   SipFrontEnd(ScriptSession& session, LibraryClock& clock)
-      : m_session(session), m_clock(clock), m_registrar(clock) {}
+      : m_session(session), m_clock(clock), m_registrar(clock), m_admission(m_listeners) {}
   ~SipFrontEnd();
   SipFrontEnd(SipFrontEnd const&) = delete;
   SipFrontEnd& operator=(SipFrontEnd const&) = delete;
 
-  // Binds UDP (and TCP on the same port when it can) at listen, "ADDR:PORT";
-  // port 0 takes a free one. The bound address, "ADDR:PORT", or an error
-  // text in error.
-  bool start(std::string const& listen, std::string& bound, std::string& error);
+  struct Settings {
+    // "ADDR:PORT" each, UDP and TCP on each (see Listeners).
+    std::vector<std::string> listen;
+    // "ADDR:PORT" each; empty for the system's (see DnsClient).
+    std::vector<std::string> dnsServers;
+    // The registrar's lifetimes for faces that give none.
+    ExpiryRange expiry;
+    // OPTIONS to NATed UDP bindings every so many seconds (NatPinger); 0
+    // for none.
+    uint32_t natPingSeconds = 0;
+  };
+
+  // False with an error text when a DNS server, a listen address or the
+  // stack is refused.
+  bool start(Settings const& settings, std::string& error);
+  // What start() opened: "udp:ADDR:PORT tcp:ADDR:PORT ...".
+  std::string listening() const { return m_listeners.describe(); }
+  std::vector<std::string> const& dnsServers() const { return m_dns.servers(); }
   // Unregisters the trunks and lets the stack finish, at most kShutDownMs.
   void shutDown();
 
   unsigned long requests() const { return m_log.requests(); }
   Registrar& registrar() { return m_registrar; }
 
+  // Makes the gateway ready for changes while it serves (--control): from
+  // then on it observes every identity, which a gateway never changed
+  // need not pay for. Around each change (a control line), beginChange()
+  // and endChange(): the registrar drops the bindings of identities it
+  // removed, the trunks follow.
+  void followChanges();
+  void beginChange();
+  void endChange();
+  GatewayStatistics statistics() const;
+  Registrar const& registrar() const { return m_registrar; }
+
   static constexpr uint64_t kShutDownMs = 2000;
 
  private:
   static bool onRequest(sip_msg const* request, void* frontEnd);
   static void onClosed(void* frontEnd);
+  // Gives a UDP socket of the stack its larger buffers (kUdpBufferBytes)
+  // the first time a request arrives on it: the stack makes its sockets
+  // itself and hands them out only with what they received (sip_msg's
+  // sock, a udp_sock for UDP).
+  void enlarge(void* udpSocket);
 
   ScriptSession& m_session;
   LibraryClock& m_clock;
   RequestLog m_log;
   Registrar m_registrar;
   Redirector m_redirector;
+  DnsClient m_dns;
+  Listeners m_listeners;
+  Admission m_admission;
   sip* m_stack = nullptr;
   sip_lsnr* m_listener = nullptr;
   std::unique_ptr<TrunkRegistrations> m_trunks;
+  std::unique_ptr<ModelChanges> m_changes;
+  std::vector<void*> m_enlarged;  // the UDP sockets enlarge() has seen
 };

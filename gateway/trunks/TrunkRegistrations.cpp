@@ -11,6 +11,18 @@
 
 namespace {
 
+// Why a request of the trunk found no registrar: libre reports a name
+// without any address as "destination address required".
+std::string failureCause(int error, std::string const& host) {
+  sa numeric;
+  bool const named = !host.empty() && host[0] != '[' && sa_set_str(&numeric, host.c_str(), 0) != 0;
+  if (named && error == EDESTADDRREQ)
+    return host + " does not resolve";
+  if (named)
+    return "resolving " + host + ": " + std::strerror(error);
+  return std::strerror(error);
+}
+
 std::string hostPortText(CHostPort const& hostPort) {
   std::string text = hostPort.GetHost().c_str();
   if (hostPort.GetPort() != 0)
@@ -25,11 +37,84 @@ void TrunkRegistrations::report(std::string const& line) {
   std::cerr << "location-gateway: " << line << std::endl;
 }
 
+void TrunkRegistrations::reportFailure(Trunk& trunk, std::string const& failure, unsigned int seconds) {
+  if (failure == trunk.lastFailure)
+    return;
+  trunk.lastFailure = failure;
+  report(failure + ", retrying in " + std::to_string(seconds) + " s");
+}
+
 TrunkRegistrations::~TrunkRegistrations() {
   stop();
 }
 
 void TrunkRegistrations::start() {
+  m_trunks = findTrunks();
+  for (std::unique_ptr<Trunk> const& trunk : m_trunks)
+    registerTrunk(*trunk);
+}
+
+void TrunkRegistrations::follow(std::vector<RefPtr<LS_IIdentity>> const& touched,
+                                std::vector<LS_IIdentity const*> const& removed) {
+  for (LS_IIdentity const* identity : removed)
+    replace(identity, nullptr);
+  for (RefPtr<LS_IIdentity> const& identity : touched) {
+    if (std::find(removed.begin(), removed.end(), identity.get()) != removed.end())
+      continue;
+    std::unique_ptr<Trunk> candidate =
+        m_clock.measure([&] { return findTrunk(identity.get(), ScriptSession::pathOf(identity.get())); });
+    replace(identity.get(), std::move(candidate));
+  }
+}
+
+void TrunkRegistrations::replace(LS_IIdentity const* identity, std::unique_ptr<Trunk> candidate) {
+  auto const existing =
+      std::find_if(m_trunks.begin(), m_trunks.end(),
+                   [&](std::unique_ptr<Trunk> const& trunk) { return trunk->identity.get() == identity; });
+  if (existing != m_trunks.end()) {
+    if (candidate && same(**existing, *candidate))
+      return;
+    unregisterTrunk(**existing);
+    m_retired.push_back(std::move(*existing));
+    m_trunks.erase(existing);
+  }
+  if (!candidate)
+    return;
+  m_trunks.push_back(std::move(candidate));
+  registerTrunk(*m_trunks.back());
+}
+
+bool TrunkRegistrations::same(Trunk const& a, Trunk const& b) {
+  return a.path == b.path && a.registrarUri == b.registrarUri && a.addressOfRecord == b.addressOfRecord &&
+         a.route == b.route && a.lifetime == b.lifetime;
+}
+
+void TrunkRegistrations::followAll() {
+  std::vector<std::unique_ptr<Trunk>> found = findTrunks();
+  std::vector<std::unique_ptr<Trunk>> kept;
+  for (std::unique_ptr<Trunk>& trunk : m_trunks) {
+    auto const match = std::find_if(found.begin(), found.end(), [&](std::unique_ptr<Trunk> const& candidate) {
+      return candidate && same(*trunk, *candidate);
+    });
+    if (match == found.end()) {
+      unregisterTrunk(*trunk);
+      m_retired.push_back(std::move(trunk));
+      continue;
+    }
+    match->reset();
+    kept.push_back(std::move(trunk));
+  }
+  for (std::unique_ptr<Trunk>& trunk : found) {
+    if (!trunk)
+      continue;
+    kept.push_back(std::move(trunk));
+    registerTrunk(*kept.back());
+  }
+  m_trunks = std::move(kept);
+}
+
+std::vector<std::unique_ptr<TrunkRegistrations::Trunk>> TrunkRegistrations::findTrunks() {
+  std::vector<std::unique_ptr<Trunk>> trunks;
   m_clock.measure([&] {
     LS_IMasterLocationService* const master = m_session.locationMaster();
     Vector<String> services;
@@ -42,25 +127,27 @@ void TrunkRegistrations::start() {
       service->getIdentities(identities);
       for (String const& name : identities) {
         RefPtr<LS_IIdentity> identity;
-        if (LS_getIdentityIf(service.get(), name, identity).isSuccess())
-          findTrunk(identity.get(), serviceName.str() + "/" + name.str());
+        if (LS_getIdentityIf(service.get(), name, identity).isFailure())
+          continue;
+        if (std::unique_ptr<Trunk> trunk = findTrunk(identity.get(), serviceName.str() + "/" + name.str()))
+          trunks.push_back(std::move(trunk));
       }
     }
   });
-  for (std::unique_ptr<Trunk> const& trunk : m_trunks)
-    registerTrunk(*trunk);
+  return trunks;
 }
 
-void TrunkRegistrations::findTrunk(LS_IIdentity* identity, std::string const& path) {
+std::unique_ptr<TrunkRegistrations::Trunk> TrunkRegistrations::findTrunk(LS_IIdentity* identity,
+                                                                         std::string const& path) {
   if (identity->getIdentityType() != LS_IdentityType::IDENTITY)
-    return;
+    return nullptr;
   RefPtr<LS_IRegistrationOutbound> face;
   LS_getFaceIf(identity, LS_IdentityFace::REGISTRATION_OUTBOUND, face);
   CHostPort registrar;
   CHostPort tlsRegistrar;
   if (!face || (face->getRegistrar(registrar, tlsRegistrar).isFailure() &&
                 face->getDynamicRegistrar(registrar).isFailure()))
-    return;
+    return nullptr;
   auto trunk = std::make_unique<Trunk>();
   trunk->owner = this;
   trunk->identity = identity;
@@ -69,6 +156,7 @@ void TrunkRegistrations::findTrunk(LS_IIdentity* identity, std::string const& pa
   trunk->user = identity->getName().str();
   char const* const scheme = face->getUriScheme() == LS_UriScheme::SIPS ? "sips:" : "sip:";
   trunk->registrarUri = scheme + hostPortText(registrar);
+  trunk->nextHop = registrar.GetHost().c_str();
   trunk->addressOfRecord = scheme + trunk->user + "@" + registrar.GetHost().c_str();
   trunk->lifetime = face->getLifetime();
   RefPtr<LS_IOutbound> outbound;
@@ -77,10 +165,13 @@ void TrunkRegistrations::findTrunk(LS_IIdentity* identity, std::string const& pa
   CHostPort tlsProxy;
   bool strictRoute = false;
   if (outbound && outbound->getNumberOfProxies() != 0 &&
-      outbound->getProxy(0, proxy, tlsProxy, strictRoute).isSuccess() && !proxy.GetHost().isEmpty())
+      outbound->getProxy(0, proxy, tlsProxy, strictRoute).isSuccess() && !proxy.GetHost().isEmpty()) {
     trunk->route = scheme + hostPortText(proxy);
+    trunk->nextHop = proxy.GetHost().c_str();
+  }
   tmr_init(&trunk->timer);
-  m_trunks.push_back(std::move(trunk));
+  trunk->keepAlive = std::make_unique<TrunkKeepAlive>(m_stack, onKeepAliveFailed, trunk.get());
+  return trunk;
 }
 
 void TrunkRegistrations::registerTrunk(Trunk& trunk) {
@@ -92,9 +183,12 @@ void TrunkRegistrations::registerTrunk(Trunk& trunk) {
                       0, onChallenge, &trunk, false, onResponse, &trunk, nullptr, nullptr);
   if (error == 0)
     return;
-  report("trunk " + trunk.path + " cannot register at " + trunk.registrarUri + ": " + std::strerror(error));
-  trunk.retryMs =
-      uint64_t{m_clock.measure([&] { return trunk.face->getRetryTimeoutOnSystemError(); })} * 1000;
+  unsigned int const seconds = m_clock.measure([&] { return trunk.face->getRetryTimeoutOnSystemError(); });
+  reportFailure(trunk,
+                "trunk " + trunk.path + " cannot register at " + trunk.registrarUri + ": " +
+                    failureCause(error, trunk.nextHop),
+                seconds);
+  trunk.retryMs = uint64_t{seconds} * 1000;
   tmr_start(&trunk.timer, trunk.retryMs, onRetry, &trunk);
 }
 
@@ -132,19 +226,28 @@ void TrunkRegistrations::onResponse(int error, sip_msg const* response, void* ar
     registrar.Parse(address, std::char_traits<char>::length(address));
     clock.measure([&] { trunk.face->setRegistrarAddr(registrar); });
     trunk.registered = true;
+    trunk.lastFailure.clear();
     std::string transport = sip_transp_name(response->tp);
     std::transform(transport.begin(), transport.end(), transport.begin(),
                    [](char c) { return static_cast<char>(std::tolower(static_cast<unsigned char>(c))); });
     owner.report("trunk " + trunk.path + " registered at " + transport + ":" + address + " for " +
                  std::to_string(trunk.lifetime) + " s");
+    LS_KeepAliveMethod::Type method = LS_KeepAliveMethod::NONE;
+    unsigned int interval = 0;
+    clock.measure([&] {
+      method = trunk.face->getKeepAliveMethod();
+      interval = trunk.face->getKeepAliveInterval();
+    });
+    trunk.keepAlive->start(*response, method, interval, trunk.registrarUri, trunk.addressOfRecord);
     return;
   }
   trunk.registered = false;
+  trunk.keepAlive->stop();
   unsigned int seconds;
   std::string cause;
   if (error != 0 || !response) {
     seconds = clock.measure([&] { return trunk.face->getRetryTimeoutOnSystemError(); });
-    cause = std::strerror(error);
+    cause = failureCause(error, trunk.nextHop);
   } else if (response->scode >= 500 && response->scode < 600) {
     seconds = clock.measure([&] { return trunk.face->getRetryTimeoutOnServerError(); });
     cause = std::to_string(response->scode);
@@ -152,8 +255,7 @@ void TrunkRegistrations::onResponse(int error, sip_msg const* response, void* ar
     seconds = clock.measure([&] { return trunk.face->getRetryTimeoutOnClientError(); });
     cause = std::to_string(response->scode);
   }
-  owner.report("trunk " + trunk.path + " failed to register (" + cause + "), retrying in " +
-               std::to_string(seconds) + " s");
+  owner.reportFailure(trunk, "trunk " + trunk.path + " failed to register (" + cause + ")", seconds);
   trunk.retryMs = uint64_t{seconds} * 1000;
   tmr_start(&trunk.timer, 0, onDropFailed, &trunk);
 }
@@ -164,17 +266,33 @@ void TrunkRegistrations::onDropFailed(void* argument) {
   tmr_start(&trunk.timer, trunk.retryMs, onRetry, &trunk);
 }
 
+void TrunkRegistrations::onKeepAliveFailed(int error, void* argument) {
+  Trunk& trunk = *static_cast<Trunk*>(argument);
+  TrunkRegistrations& owner = *trunk.owner;
+  unsigned int const seconds =
+      owner.m_clock.measure([&] { return trunk.face->getRetryTimeoutOnSystemError(); });
+  trunk.registered = false;
+  owner.reportFailure(trunk, "trunk " + trunk.path + " lost its registrar (" + std::strerror(error) + ")",
+                      seconds);
+  trunk.retryMs = uint64_t{seconds} * 1000;
+  tmr_start(&trunk.timer, 0, onDropFailed, &trunk);
+}
+
 void TrunkRegistrations::onRetry(void* argument) {
   Trunk& trunk = *static_cast<Trunk*>(argument);
   trunk.owner->registerTrunk(trunk);
 }
 
+void TrunkRegistrations::unregisterTrunk(Trunk& trunk) {
+  tmr_cancel(&trunk.timer);
+  trunk.keepAlive->stop();
+  if (trunk.registered)
+    report("trunk " + trunk.path + " unregistering");
+  trunk.registered = false;
+  trunk.registration = static_cast<sipreg*>(mem_deref(trunk.registration));
+}
+
 void TrunkRegistrations::stop() {
-  for (std::unique_ptr<Trunk> const& trunk : m_trunks) {
-    tmr_cancel(&trunk->timer);
-    if (trunk->registered)
-      report("trunk " + trunk->path + " unregistering");
-    trunk->registered = false;
-    trunk->registration = static_cast<sipreg*>(mem_deref(trunk->registration));
-  }
+  for (std::unique_ptr<Trunk> const& trunk : m_trunks)
+    unregisterTrunk(*trunk);
 }

@@ -13,7 +13,26 @@
 // failure), server (5xx) or client (any other final failure, 4xx and 6xx),
 // instead of sipreg's own back-off, so that the configuration decides. The
 // registrar's address (where the 2xx came from) is recorded with
-// setRegistrarAddr. Progress goes to standard error, one line per event.
+// setRegistrarAddr. Progress goes to standard error, one line per event; a
+// failure like the one before it is not told again, so that a carrier whose
+// name does not resolve, retried every few seconds for days, leaves one line
+// and not thousands.
+//
+// A registrar or proxy named by host name is found by the stack's DNS client
+// (RFC 3263), anew for every REGISTER sipreg sends, refreshes included, so
+// that a carrier moving its servers is followed without a restart. Between
+// registrations a TrunkKeepAlive keeps the path to the registrar open as
+// the face's keep-alive settings say; when it finds the registrar gone, the
+// trunk registers anew after the retry timeout for system errors.
+//
+// After a change made while serving, the registrations follow the model:
+// a trunk that is new registers, one that is gone (or no longer has a
+// registrar) unregisters, one whose registrar, address of record, route or
+// lifetime changed unregisters and registers anew, and the rest are left
+// alone, registered as they are. follow() looks only at the identities the
+// change touched (see ModelChanges); followAll() at every identity, which
+// with 100,000 subscribers takes a quarter of a second, for the rare change
+// that adds or removes a whole location service.
 //
 // stop() unregisters: it drops every sipreg, which sends its REGISTER with
 // expiry 0 and lives on inside libre until answered; the caller then lets the
@@ -31,6 +50,7 @@
 #include "ScriptSession.h"
 #include "metrics/LibraryClock.h"
 #include "sip/Libre.h"
+#include "trunks/TrunkKeepAlive.h"
 
 class TrunkRegistrations {
  public:
@@ -41,7 +61,17 @@ class TrunkRegistrations {
   TrunkRegistrations& operator=(TrunkRegistrations const&) = delete;
 
   void start();
+  void follow(std::vector<RefPtr<LS_IIdentity>> const& touched,
+              std::vector<LS_IIdentity const*> const& removed);
+  void followAll();
   void stop();
+
+  // Each trunk's "service/identity" path and whether it is registered now.
+  template <class Visit>
+  void forEach(Visit visit) const {
+    for (std::unique_ptr<Trunk> const& trunk : m_trunks)
+      visit(trunk->path, trunk->registered);
+  }
 
  private:
   struct Trunk {
@@ -54,6 +84,11 @@ class TrunkRegistrations {
     std::string registrarUri;
     std::string addressOfRecord;
     std::string route;
+    // The host the stack resolves: the proxy's when there is one, else the
+    // registrar's.
+    std::string nextHop;
+    // The last failure reported, empty once registered.
+    std::string lastFailure;
     uint32_t lifetime;
     sipreg* registration = nullptr;
     bool registered = false;
@@ -61,19 +96,34 @@ class TrunkRegistrations {
     // retryMs and registers anew.
     tmr timer;
     uint64_t retryMs = 0;
+    std::unique_ptr<TrunkKeepAlive> keepAlive;
   };
 
-  void findTrunk(LS_IIdentity* identity, std::string const& path);
+  // Every trunk the model describes now, none registering yet.
+  std::vector<std::unique_ptr<Trunk>> findTrunks();
+  std::unique_ptr<Trunk> findTrunk(LS_IIdentity* identity, std::string const& path);
   void registerTrunk(Trunk& trunk);
+  void unregisterTrunk(Trunk& trunk);
+  // The identity's trunk becomes candidate (none when null): left alone
+  // when the same, else the old one retired and the new one registered.
+  void replace(LS_IIdentity const* identity, std::unique_ptr<Trunk> candidate);
+  static bool same(Trunk const& a, Trunk const& b);
   // One progress line on standard error, after the library's debug lines.
   void report(std::string const& line);
+  // failure, with the retry time, unless it is the trunk's last one.
+  void reportFailure(Trunk& trunk, std::string const& failure, unsigned int seconds);
   static int onChallenge(char** user, char** password, char const* realm, void* trunk);
   static void onResponse(int error, sip_msg const* response, void* trunk);
   static void onDropFailed(void* trunk);
+  static void onKeepAliveFailed(int error, void* trunk);
   static void onRetry(void* trunk);
 
   sip& m_stack;
   ScriptSession& m_session;
   LibraryClock& m_clock;
   std::vector<std::unique_ptr<Trunk>> m_trunks;
+  // Trunks follow() unregistered: their sipreg lives on inside libre until
+  // the unregistration is answered, and may still ask its challenge
+  // handler for credentials with the trunk as argument.
+  std::vector<std::unique_ptr<Trunk>> m_retired;
 };

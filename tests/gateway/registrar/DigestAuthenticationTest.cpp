@@ -62,7 +62,7 @@ INSTANTIATE_TEST_SUITE_P(Vectors,
                          [](testing::TestParamInfo<Vector> const& info) { return info.param.name; });
 
 TEST(NonceGenerator, HoldsForItsRealmAndLifetimeOnly) {
-  NonceGenerator const nonces({1, 2, 3});
+  NonceGenerator nonces({1, 2, 3});
   pl const realm = text("example.com");
   std::string const made = nonces.make(realm, 1000);
   pl const nonce = text(made.c_str());

@@ -69,7 +69,7 @@ start_gateway() {
     >"$name.out" 2>"$name.err" &
   pids[$name]=$!
   await_line "$name.err" "listening on udp:" || fail "gateway $name did not start"
-  ports[$name]=$(sed -n 's/.*listening on udp:127\.0\.0\.1:\([0-9]*\).*/\1/p' "$name.err" | tail -n 1)
+  ports[$name]=$(sed -n 's/.* udp:127\.0\.0\.1:\([0-9]*\).*/\1/p' "$name.err" | tail -n 1)
 }
 
 # stop_gateway NAME SIGNAL: with TERM it must exit 0.
@@ -89,11 +89,14 @@ sipp_run() {
     -s "$user" "$@" 127.0.0.1:"${ports[$name]}" >>sipp.log 2>&1
 }
 
-# register GATEWAY-NAME USER PASSWORD EXPIRES CONTACT-PORT
+# register GATEWAY-NAME USER PASSWORD EXPIRES CONTACT-PORT: SIPp sends from
+# the contact's own port, so that the gateway sees no NAT to correct for.
 register() {
-  sipp_run register "$1" "$2" -au "$2" -ap "$3" -key expires "$4" -key contact_port "$5" ||
+  sipp_run register "$1" "$2" -au "$2" -ap "$3" -key expires "$4" -key contact_port "$5" -p "$5" ||
     fail "$2 could not register at $1 for $4 s"
 }
+# Contact ports, one a phone: random, since a fixed one may be taken.
+base=$((20000 + RANDOM % 20000))
 # moved GATEWAY-NAME USER CONTACT: a call to USER gets 302 to CONTACT alone.
 moved() {
   rm -f moved.log
@@ -106,10 +109,10 @@ case $scenario in
   restart)
     store=$PWD/bindings.sqlite
     start_gateway a "$store"
-    register a alice secret 600 6001
-    register a dave welcome 600 6002
-    register a bob welcome 600 6003
-    register a carol welcome 3 6004
+    register a alice secret 600 $((base + 1))
+    register a dave welcome 600 $((base + 2))
+    register a bob welcome 600 $((base + 3))
+    register a carol welcome 3 $((base + 4))
     # Written behind within 100 ms (an emulated gateway takes longer);
     # killed well inside carol's 3 s, started again after them.
     sleep 1
@@ -119,7 +122,7 @@ case $scenario in
     start_gateway a "$store" without-bob.script
     grep -q "1 stored binding of identities no longer configured deleted" a.err ||
       fail "the binding of the identity removed was not reported deleted"
-    for call in alice:alice:6001 alice.smith:alice:6001 dave:dave:6002; do
+    for call in alice:alice:$((base + 1)) alice.smith:alice:$((base + 1)) dave:dave:$((base + 2)); do
       IFS=: read -r user phone port <<<"$call"
       moved a "$user" "sip:$phone@127.0.0.1:$port" || fail "a call to $user was not redirected to $phone"
     done
@@ -130,19 +133,19 @@ case $scenario in
     postgres_start || fail "PostgreSQL did not start: $(tail -n 5 "$postgres_dir"/*.log 2>/dev/null)"
     start_gateway a "$postgres_uri"
     start_gateway b "$postgres_uri"
-    register a alice secret 600 6001
+    register a alice secret 600 $((base + 1))
     sleep 1
-    moved b alice sip:alice@127.0.0.1:6001 || fail "B did not redirect to the phone registered at A"
-    register b alice secret 0 6001
+    moved b alice sip:alice@127.0.0.1:$((base + 1)) || fail "B did not redirect to the phone registered at A"
+    register b alice secret 0 $((base + 1))
     sleep 1
     unavailable a alice
     postgres_pause || fail "PostgreSQL did not stop"
-    register a alice secret 600 6001
+    register a alice secret 600 $((base + 1))
     postgres_resume || fail "PostgreSQL did not start again"
     # Both reconnect within 5 s of their last attempt, then catch up.
     learnt=false
     for attempt in $(seq 20); do
-      moved b alice sip:alice@127.0.0.1:6001 && { learnt=true; break; }
+      moved b alice sip:alice@127.0.0.1:$((base + 1)) && { learnt=true; break; }
       sleep 1
     done
     $learnt || fail "B did not learn the registration made at A while the server was away"
