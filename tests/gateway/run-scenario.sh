@@ -148,7 +148,7 @@ case $scenario in
     start_gateway "${ipv6[@]}" --nat-ping 1 "$here/protocol.script"
     # A second gateway on the same port must stop, naming the listener.
     status=0
-    timeout "$wait_limit" "${emulator[@]}" "$gateway" --listen 127.0.0.1:"$gateway_port" "$here/protocol.script" \
+    timeout "$wait_limit" "${emulator[@]}" "$gateway" --listen 127.0.0.1:"$gateway_port" --store none "$here/protocol.script" \
       >/dev/null 2>"$scenario".taken.err || status=$?
     ((status == 1)) && grep -q "cannot listen on udp:127.0.0.1:$gateway_port: " "$scenario".taken.err ||
       fail "a taken port did not stop the start ($status)"
