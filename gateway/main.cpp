@@ -10,6 +10,7 @@
 // the library, not internally synchronised, needs), and brings server and
 // client transactions, registration client and digest helpers.
 
+#include <cstdlib>
 #include <cstring>
 #include <fstream>
 #include <iostream>
@@ -21,13 +22,15 @@
 #include "ScriptRunner.h"
 #include "ScriptSession.h"
 #include "metrics/LibraryClock.h"
+#include "redirect/SourceFilter.h"
+#include "registrar/DigestAuthentication.h"
 #include "sip/Libre.h"
 #include "sip/SipFrontEnd.h"
 
 namespace {
 
 char const kUsage[] =
-    "usage: location-gateway [--listen ADDR:PORT] [--debug] [--statistics] SCRIPT...\n"
+    "usage: location-gateway [--listen ADDR:PORT] [OPTION...] SCRIPT...\n"
     "\n"
     "Configures the library from the scripts (the console's language), then\n"
     "answers SIP requests on ADDR:PORT (default 127.0.0.1:5060, UDP and TCP;\n"
@@ -38,6 +41,12 @@ char const kUsage[] =
     "  --debug       show the library's debug lines\n"
     "  --statistics  at exit, the requests answered and the CPU time spent\n"
     "                in the library's calls\n"
+    "  --digest LIST the algorithms each challenge offers, in order\n"
+    "                (default SHA-256,MD5; both are always accepted)\n"
+    "  --redirect-from CIDR  answer INVITE and the other redirected requests\n"
+    "                only from this network (repeatable; default any source)\n"
+    "  --source-rate N  refuse a source address sending more than N requests\n"
+    "                a second for a while (default off)\n"
     "\n"
     "Exit status: 0 after a signal, 1 when a script line fails or the\n"
     "address cannot be bound, 2 for a usage error or an unreadable script.\n";
@@ -50,6 +59,9 @@ struct Options {
   std::string listen = "127.0.0.1:5060";
   bool debug = false;
   bool statistics = false;
+  std::vector<DigestAlgorithm> digest{DigestAlgorithm::SHA256, DigestAlgorithm::MD5};
+  std::vector<std::string> redirectFrom;
+  unsigned long sourceRate = 0;
   std::vector<std::string> scripts;
 };
 
@@ -63,6 +75,13 @@ bool parse(int argc, char** argv, Options& options) {
       options.debug = true;
     else if (argument == "--statistics")
       options.statistics = true;
+    else if (argument == "--digest" && i + 1 < argc && parseDigestAlgorithms(argv[i + 1], options.digest))
+      ++i;
+    else if (argument == "--redirect-from" && i + 1 < argc && SourceFilter().allow(argv[i + 1]))
+      options.redirectFrom.push_back(argv[++i]);
+    else if (argument == "--source-rate" && i + 1 < argc &&
+             (options.sourceRate = std::strtoul(argv[++i], nullptr, 10)) > 0)
+      continue;
     else if (argument.size() > 1 && argument[0] == '-')
       return false;
     else
@@ -92,6 +111,11 @@ int runScripts(ScriptSession& session, std::vector<std::string> const& scripts) 
 int serve(ScriptSession& session, Options const& options) {
   LibraryClock clock(options.statistics);
   SipFrontEnd frontEnd(session, clock);
+  frontEnd.registrar().authenticator().offerAlgorithms(options.digest);
+  for (std::string const& network : options.redirectFrom)
+    frontEnd.redirector().sources().allow(network);
+  if (options.sourceRate > 0)
+    frontEnd.limitSourceRate(static_cast<uint32_t>(options.sourceRate));
   std::string bound;
   std::string error;
   if (!frontEnd.start(options.listen, bound, error)) {

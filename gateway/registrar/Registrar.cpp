@@ -3,19 +3,13 @@
 #include <algorithm>
 #include <vector>
 
-#include "LS_CredentialLookup.h"
 #include "LS_ILocationService.h"
 #include "LS_IdentityResolution.h"
 #include "LS_IdentityType.h"
-#include "registrar/DigestAuthentication.h"
 #include "sip/Exchange.h"
 
 namespace {
 
-// Authorization headers looked at per request, and the longest user name
-// passed to the library: more is an attack, not a phone.
-constexpr unsigned int kMaximumAuthorizations = 8;
-constexpr size_t kMaximumUserName = 256;
 // The Call-ID is kept with every binding; a longer one is refused.
 constexpr size_t kMaximumCallId = 256;
 
@@ -68,9 +62,16 @@ Registrar::~Registrar() {
 }
 
 void Registrar::handle(Exchange& exchange) {
+  if (m_authenticator.refuseHeldSource(exchange))
+    return;
   CNameAddr to;
-  RefPtr<LS_IIdentity> const resolved = exchange.resolveOrAnswer(exchange.request().to.auri, to);
-  if (!resolved || !authenticated(exchange, resolved.get(), to))
+  RefPtr<LS_IIdentity> const resolved = exchange.resolveOrAnswer(exchange.request().to.auri, to, false);
+  if (!resolved) {
+    if (!exchange.answered())
+      m_authenticator.refuseUnknown(exchange, to);
+    return;
+  }
+  if (!m_authenticator.admit(exchange, resolved.get(), to))
     return;
   bool created = false;
   RefPtr<LS_IIdentity> const identity = registering(resolved.get(), to, created);
@@ -210,63 +211,6 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
   }
   reportTransition(bindings, before);
   exchange.answer(200, "OK", bindingHeaders(bindings));
-}
-
-bool Registrar::authenticated(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to) {
-  String error;
-  Vector<LS_ProtocolRealm> realms;
-  m_clock.measure([&] { LS_getInboundAuthenticationChallenge(error, realms, identity, nullptr); });
-  if (realms.isEmpty())
-    return true;
-
-  sip_msg const& message = exchange.request();
-  uint64_t const now = tmr_jiffies();
-  bool stale = false;
-  unsigned int looked = 0;
-  int verdict = 0;  // 1 accepted, -1 refused, 0 no usable credentials
-  forEachHeader(message, SIP_HDR_AUTHORIZATION, [&](sip_hdr const& header) {
-    httpauth_digest_resp response;
-    if (++looked > kMaximumAuthorizations)
-      return false;
-    if (httpauth_digest_response_decode(&response, &header.val) != 0 ||
-        response.username.l > kMaximumUserName)
-      return true;
-    auto const realm = std::find_if(realms.begin(), realms.end(), [&](LS_ProtocolRealm const& candidate) {
-      return pl_strcmp(&response.realm, candidate.realm.c_str()) == 0;
-    });
-    if (realm == realms.end())
-      return true;
-    NonceGenerator::Check const check = m_nonces.check(response.nonce, response.realm, now);
-    if (check != NonceGenerator::Check::VALID) {
-      stale = stale || check == NonceGenerator::Check::STALE;
-      return true;
-    }
-    Vector<String> passwords;
-    String const user(response.username.p, response.username.l);
-    m_clock.measure([&] {
-      LS_getInboundAuthenticationResponse(error, passwords, identity, to, realm->protocol, realm->realm, user,
-                                          nullptr);
-    });
-    bool const matches = std::any_of(passwords.begin(), passwords.end(), [&](String const& password) {
-      return digestResponseMatches(response, message.met, password.c_str());
-    });
-    verdict = matches ? 1 : -1;
-    return false;
-  });
-  if (verdict > 0)
-    return true;
-  if (verdict < 0) {
-    exchange.answer(403, "Forbidden");
-    return false;
-  }
-  std::string challenges;
-  for (LS_ProtocolRealm const& realm : realms) {
-    pl name;
-    pl_set_str(&name, realm.realm.c_str());
-    challenges += "WWW-Authenticate: " + digestChallenge(name, m_nonces.make(name, now), stale) + "\r\n";
-  }
-  exchange.answer(401, "Unauthorized", challenges);
-  return false;
 }
 
 Registrar::Order Registrar::order(Bindings const& bindings,

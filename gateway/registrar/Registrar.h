@@ -22,9 +22,8 @@
 //   member. The registrar removes that identity again when its last binding
 //   goes, so that the group answers the user as before. The group's own
 //   name cannot register (403).
-// - A digest response to a nonce this process did not make counts as no
-//   credentials (a fresh 401), one to an expired nonce gets 401 with
-//   stale=true; only a wrong password on a valid nonce gets 403.
+// - Who may register, and with what credentials, is the Authenticator's
+//   to decide; a To that denotes no identity is answered by it too.
 // - Stateless, as RFC 3261 section 10.3 lets a registrar be: nothing is kept
 //   for a request until it is authenticated, and its answer leaves without a
 //   server transaction. A contact whose binding has the request's Call-ID
@@ -48,7 +47,7 @@
 #include "LS_IRegistrationInbound.h"
 #include "RefPtr.h"
 #include "metrics/LibraryClock.h"
-#include "registrar/NonceGenerator.h"
+#include "registrar/Authenticator.h"
 #include "sip/Libre.h"
 
 class Exchange;
@@ -58,12 +57,13 @@ class Registrar {
   static constexpr size_t kMaximumBindings = 32;
   static constexpr size_t kMaximumContacts = 16;
 
-  explicit Registrar(LibraryClock& clock) : m_clock(clock) { tmr_init(&m_sweep); }
+  explicit Registrar(LibraryClock& clock) : m_clock(clock), m_authenticator(clock) { tmr_init(&m_sweep); }
   ~Registrar();
   Registrar(Registrar const&) = delete;
   Registrar& operator=(Registrar const&) = delete;
 
   void handle(Exchange& exchange);
+  Authenticator& authenticator() { return m_authenticator; }
 
  private:
   struct Bindings;
@@ -141,7 +141,7 @@ class Registrar {
   static void onSweep(void* registrar);
 
   LibraryClock& m_clock;
-  NonceGenerator m_nonces;
+  Authenticator m_authenticator;
   std::map<LS_IIdentity*, Bindings> m_bindings;
   Expiries m_expiries;
   tmr m_sweep;

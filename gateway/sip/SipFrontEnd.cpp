@@ -81,6 +81,8 @@ bool SipFrontEnd::onRequest(sip_msg const* request, void* argument) {
   // answered without a transaction, see Exchange::answer).
   if (pl_strcmp(&message.met, "ACK") == 0)
     return true;
+  if (frontEnd.m_rateLimit && !frontEnd.m_rateLimit->admit(*frontEnd.m_stack, message))
+    return true;
   Exchange exchange(*frontEnd.m_stack, message, frontEnd.m_session, frontEnd.m_log, frontEnd.m_clock);
   if (pl_strcmp(&message.met, "REGISTER") == 0) {
     frontEnd.m_registrar.handle(exchange);

@@ -20,6 +20,7 @@
 #include "registrar/Registrar.h"
 #include "sip/Libre.h"
 #include "sip/RequestLog.h"
+#include "sip/SourceRateLimit.h"
 #include "trunks/TrunkRegistrations.h"
 
 class SipFrontEnd {
@@ -38,6 +39,11 @@ class SipFrontEnd {
   void shutDown();
 
   unsigned long requests() const { return m_log.requests(); }
+  Registrar& registrar() { return m_registrar; }
+  Redirector& redirector() { return m_redirector; }
+  // --source-rate: more than perSecond requests a second from one address
+  // are refused (SourceRateLimit); off unless called.
+  void limitSourceRate(uint32_t perSecond) { m_rateLimit = std::make_unique<SourceRateLimit>(perSecond); }
 
   static constexpr uint64_t kShutDownMs = 2000;
 
@@ -53,4 +59,5 @@ class SipFrontEnd {
   sip* m_stack = nullptr;
   sip_lsnr* m_listener = nullptr;
   std::unique_ptr<TrunkRegistrations> m_trunks;
+  std::unique_ptr<SourceRateLimit> m_rateLimit;
 };
