@@ -23,6 +23,7 @@
 #include "ScriptSession.h"
 #include "metrics/LibraryClock.h"
 #include "redirect/SourceFilter.h"
+#include "registrar/CredentialMask.h"
 #include "registrar/DigestAuthentication.h"
 #include "sip/Libre.h"
 #include "sip/SipFrontEnd.h"
@@ -133,6 +134,8 @@ int serve(ScriptSession& session, Options const& options) {
 }  // namespace
 
 int main(int argc, char** argv) {
+  CredentialMask const maskedOutput(std::cout);
+  CredentialMask const maskedErrors(std::cerr);
   Options options;
   if (!parse(argc, argv, options)) {
     std::cerr << kUsage;
