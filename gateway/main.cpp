@@ -48,6 +48,12 @@ char const kUsage[] =
     "                only from this network (repeatable; default any source)\n"
     "  --source-rate N  refuse a source address sending more than N requests\n"
     "                a second for a while (default off)\n"
+    "  --tls ADDR:PORT  SIP over TLS too (needs --certificate)\n"
+    "  --ws ADDR:PORT, --wss ADDR:PORT  SIP over WebSocket, plain or secure\n"
+    "                (RFC 7118; --wss needs --certificate)\n"
+    "  --certificate FILE, --key FILE  the server's certificate and key (PEM)\n"
+    "  --allow-vulnerable-websocket  WebSocket even on a libre before 4.8.1,\n"
+    "                which any peer can crash (CVE-2026-50161): tests only\n"
     "\n"
     "Exit status: 0 after a signal, 1 when a script line fails or the\n"
     "address cannot be bound, 2 for a usage error or an unreadable script.\n";
@@ -63,6 +69,7 @@ struct Options {
   std::vector<DigestAlgorithm> digest{DigestAlgorithm::SHA256, DigestAlgorithm::MD5};
   std::vector<std::string> redirectFrom;
   unsigned long sourceRate = 0;
+  SecureTransportOptions secure;
   std::vector<std::string> scripts;
 };
 
@@ -78,6 +85,18 @@ bool parse(int argc, char** argv, Options& options) {
       options.statistics = true;
     else if (argument == "--digest" && i + 1 < argc && parseDigestAlgorithms(argv[i + 1], options.digest))
       ++i;
+    else if (argument == "--tls" && i + 1 < argc)
+      options.secure.tls = argv[++i];
+    else if (argument == "--ws" && i + 1 < argc)
+      options.secure.ws = argv[++i];
+    else if (argument == "--wss" && i + 1 < argc)
+      options.secure.wss = argv[++i];
+    else if (argument == "--certificate" && i + 1 < argc)
+      options.secure.certificate = argv[++i];
+    else if (argument == "--key" && i + 1 < argc)
+      options.secure.key = argv[++i];
+    else if (argument == "--allow-vulnerable-websocket")
+      options.secure.allowVulnerableWebSocket = true;
     else if (argument == "--redirect-from" && i + 1 < argc && SourceFilter().allow(argv[i + 1]))
       options.redirectFrom.push_back(argv[++i]);
     else if (argument == "--source-rate" && i + 1 < argc &&
@@ -123,7 +142,14 @@ int serve(ScriptSession& session, Options const& options) {
     std::cerr << "location-gateway: " << error << "\n";
     return 1;
   }
+  std::vector<std::string> secure;
+  if (!frontEnd.startSecure(options.secure, secure, error)) {
+    std::cerr << "location-gateway: " << error << "\n";
+    return 1;
+  }
   std::cerr << "location-gateway: listening on udp:" << bound << std::endl;
+  for (std::string const& transport : secure)
+    std::cerr << "location-gateway: listening on " << transport << std::endl;
   re_main(onSignal);
   frontEnd.shutDown();
   if (options.statistics)

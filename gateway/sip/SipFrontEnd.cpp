@@ -84,6 +84,10 @@ bool SipFrontEnd::onRequest(sip_msg const* request, void* argument) {
   if (frontEnd.m_rateLimit && !frontEnd.m_rateLimit->admit(*frontEnd.m_stack, message))
     return true;
   Exchange exchange(*frontEnd.m_stack, message, frontEnd.m_session, frontEnd.m_log, frontEnd.m_clock);
+  if (SecureTransports::sipsOverPlainTransport(message)) {
+    exchange.answer(416, "Unsupported URI Scheme");
+    return true;
+  }
   if (pl_strcmp(&message.met, "REGISTER") == 0) {
     frontEnd.m_registrar.handle(exchange);
     return true;

@@ -20,6 +20,7 @@
 #include "registrar/Registrar.h"
 #include "sip/Libre.h"
 #include "sip/RequestLog.h"
+#include "sip/SecureTransports.h"
 #include "sip/SourceRateLimit.h"
 #include "trunks/TrunkRegistrations.h"
 
@@ -35,6 +36,13 @@ class SipFrontEnd {
   // port 0 takes a free one. The bound address, "ADDR:PORT", or an error
   // text in error.
   bool start(std::string const& listen, std::string& bound, std::string& error);
+  // After start(): TLS, WebSocket and secure WebSocket as options ask, each
+  // bound one as "tls:ADDR:PORT" (and so on) in bound, else an error text.
+  bool startSecure(SecureTransportOptions const& options,
+                   std::vector<std::string>& bound,
+                   std::string& error) {
+    return m_secure.add(*m_stack, options, bound, error);
+  }
   // Unregisters the trunks and lets the stack finish, at most kShutDownMs.
   void shutDown();
 
@@ -56,6 +64,7 @@ class SipFrontEnd {
   RequestLog m_log;
   Registrar m_registrar;
   Redirector m_redirector;
+  SecureTransports m_secure;
   sip* m_stack = nullptr;
   sip_lsnr* m_listener = nullptr;
   std::unique_ptr<TrunkRegistrations> m_trunks;
