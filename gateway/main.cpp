@@ -52,6 +52,8 @@ char const kUsage[] =
     "  --ws ADDR:PORT, --wss ADDR:PORT  SIP over WebSocket, plain or secure\n"
     "                (RFC 7118; --wss needs --certificate)\n"
     "  --certificate FILE, --key FILE  the server's certificate and key (PEM)\n"
+    "  --ca-file FILE  verify TLS trunks' carriers against these CA\n"
+    "                certificates (PEM) instead of the system's\n"
     "  --allow-vulnerable-websocket  WebSocket even on a libre before 4.8.1,\n"
     "                which any peer can crash (CVE-2026-50161): tests only\n"
     "\n"
@@ -70,6 +72,7 @@ struct Options {
   std::vector<std::string> redirectFrom;
   unsigned long sourceRate = 0;
   SecureTransportOptions secure;
+  std::string caFile;
   std::vector<std::string> scripts;
 };
 
@@ -95,6 +98,8 @@ bool parse(int argc, char** argv, Options& options) {
       options.secure.certificate = argv[++i];
     else if (argument == "--key" && i + 1 < argc)
       options.secure.key = argv[++i];
+    else if (argument == "--ca-file" && i + 1 < argc)
+      options.caFile = argv[++i];
     else if (argument == "--allow-vulnerable-websocket")
       options.secure.allowVulnerableWebSocket = true;
     else if (argument == "--redirect-from" && i + 1 < argc && SourceFilter().allow(argv[i + 1]))
@@ -132,6 +137,7 @@ int serve(ScriptSession& session, Options const& options) {
   LibraryClock clock(options.statistics);
   SipFrontEnd frontEnd(session, clock);
   frontEnd.registrar().authenticator().offerAlgorithms(options.digest);
+  frontEnd.trustForTrunks(options.caFile);
   for (std::string const& network : options.redirectFrom)
     frontEnd.redirector().sources().allow(network);
   if (options.sourceRate > 0)

@@ -59,6 +59,7 @@ bool SipFrontEnd::start(std::string const& listen, std::string& bound, std::stri
   own.Parse(bound.data(), bound.size());
   m_session.stack().localHostPorts.add(own);
   m_trunks = std::make_unique<TrunkRegistrations>(*m_stack, m_session, m_clock);
+  m_trunks->useCaFile(m_caFile);
   m_trunks->start();
   return true;
 }

@@ -49,6 +49,8 @@ class SipFrontEnd {
   unsigned long requests() const { return m_log.requests(); }
   Registrar& registrar() { return m_registrar; }
   Redirector& redirector() { return m_redirector; }
+  // --ca-file: what a TLS trunk's carrier is verified against; before start().
+  void trustForTrunks(std::string const& caFile) { m_caFile = caFile; }
   // --source-rate: more than perSecond requests a second from one address
   // are refused (SourceRateLimit); off unless called.
   void limitSourceRate(uint32_t perSecond) { m_rateLimit = std::make_unique<SourceRateLimit>(perSecond); }
@@ -69,4 +71,5 @@ class SipFrontEnd {
   sip_lsnr* m_listener = nullptr;
   std::unique_ptr<TrunkRegistrations> m_trunks;
   std::unique_ptr<SourceRateLimit> m_rateLimit;
+  std::string m_caFile;
 };

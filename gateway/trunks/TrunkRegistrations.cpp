@@ -47,6 +47,17 @@ void TrunkRegistrations::start() {
       }
     }
   });
+  std::vector<std::string> tlsHosts;
+  for (std::unique_ptr<Trunk> const& trunk : m_trunks)
+    if (!trunk->tlsHost.empty())
+      tlsHosts.push_back(trunk->tlsHost);
+  if (!tlsHosts.empty()) {
+    sa local;
+    std::string error;
+    if (sip_transp_laddr(&m_stack, &local, SIP_TRANSP_UDP, nullptr) != 0 ||
+        !m_tls.add(m_stack, local, m_caFile, tlsHosts, error))
+      report("trunks over TLS cannot register: " + error);
+  }
   for (std::unique_ptr<Trunk> const& trunk : m_trunks)
     registerTrunk(*trunk);
 }
@@ -67,8 +78,14 @@ void TrunkRegistrations::findTrunk(LS_IIdentity* identity, std::string const& pa
   trunk->face = face;
   trunk->path = path;
   trunk->user = identity->getName().str();
-  char const* const scheme = face->getUriScheme() == LS_UriScheme::SIPS ? "sips:" : "sip:";
-  trunk->registrarUri = scheme + hostPortText(registrar);
+  bool const secure = face->getUriScheme() == LS_UriScheme::SIPS || !tlsRegistrar.GetHost().isEmpty();
+  if (!tlsRegistrar.GetHost().isEmpty())
+    registrar = tlsRegistrar;
+  // libre's requests take sip: URIs only: TLS is asked for with
+  // transport=tls, which libre then uses for the hop.
+  char const* const scheme = secure ? "sips:" : "sip:";
+  std::string const transport = secure ? ";transport=tls" : "";
+  trunk->registrarUri = "sip:" + hostPortText(registrar) + transport;
   trunk->addressOfRecord = scheme + trunk->user + "@" + registrar.GetHost().c_str();
   trunk->lifetime = face->getLifetime();
   RefPtr<LS_IOutbound> outbound;
@@ -77,8 +94,13 @@ void TrunkRegistrations::findTrunk(LS_IIdentity* identity, std::string const& pa
   CHostPort tlsProxy;
   bool strictRoute = false;
   if (outbound && outbound->getNumberOfProxies() != 0 &&
-      outbound->getProxy(0, proxy, tlsProxy, strictRoute).isSuccess() && !proxy.GetHost().isEmpty())
-    trunk->route = scheme + hostPortText(proxy);
+      outbound->getProxy(0, proxy, tlsProxy, strictRoute).isSuccess() && !proxy.GetHost().isEmpty()) {
+    if (secure && !tlsProxy.GetHost().isEmpty())
+      proxy = tlsProxy;
+    trunk->route = "sip:" + hostPortText(proxy) + transport;
+  }
+  if (secure)
+    trunk->tlsHost = (trunk->route.empty() ? registrar : proxy).GetHost().c_str();
   tmr_init(&trunk->timer);
   m_trunks.push_back(std::move(trunk));
 }
