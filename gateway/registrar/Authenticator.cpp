@@ -97,8 +97,8 @@ bool Authenticator::admit(Exchange& exchange, LS_IIdentity* identity, CNameAddr 
     adoptInterface(service,
                    [&](UUID const& iid, void** raw) { return identity->getLocationServiceIf(iid, raw); });
   });
-  if (service)
-    m_realmsByService.emplace(service->getName().str(), names);
+  if (service && m_realmsByService.count(service.get()) == 0)
+    m_realmsByService.emplace(service.get(), names);
   return check(exchange, names, [&](size_t index, String const& user) {
     Vector<String> passwords;
     m_clock.measure([&] {
@@ -127,7 +127,7 @@ void Authenticator::refuseUnknown(Exchange& exchange, CNameAddr const& to) {
   });
   if (!service)
     return exchange.answer(404, "Not Found");
-  auto const known = m_realmsByService.find(service->getName().str());
+  auto const known = m_realmsByService.find(service.get());
   std::vector<std::string> const realms =
       known != m_realmsByService.end() ? known->second : std::vector<std::string>{host.GetHost().c_str()};
   check(exchange, realms, [](size_t, String const&) { return Vector<String>(); });
@@ -185,11 +185,9 @@ bool Authenticator::check(Exchange& exchange,
     }
     switch (m_used.use(fields.nonce, NonceGenerator::madeAt(fields.nonce), count, fingerprintOf(message))) {
       case NonceTable::Use::FORGOTTEN:
+      case NonceTable::Use::REPLAYED:
         stale = true;
         return true;
-      case NonceTable::Use::REPLAYED:
-        failure = "nonce replayed";
-        return false;
       case NonceTable::Use::FIRST_OR_NEWER:
       case NonceTable::Use::REPEATED:
         accepted = true;

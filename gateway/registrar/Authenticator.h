@@ -25,10 +25,14 @@
 //   22.4, RFC 7616 section 3.4.6): a response computed for another URI is a
 //   failed authentication.
 // - A nonce is bound to the realm and the Call-ID (NonceGenerator) and used
-//   at most once per nonce-count (NonceTable); a nonce the table no longer
-//   remembers gets 401 with stale=true, like an expired one.
+//   at most once per nonce-count (NonceTable). A nonce used again, or one
+//   the table no longer remembers, gets 401 with stale=true, like an expired
+//   one, as Kamailio answers a nonce-count that did not increase: a replay
+//   gains nothing from it, and a phone that reuses its nonce carelessly
+//   gets a fresh one instead of a refusal its user would have to clear.
+//   Such a request is not a failed authentication: the password was right.
 // - A failed authentication (wrong password or user, a digest over another
-//   URI, a replayed nonce) gets 403 and one line on standard error naming
+//   URI) gets 403 and one line on standard error naming
 //   the user and the source address, for an operator's fail2ban; a source
 //   with kFailureLimit of them within kFailureWindowMs is then refused with
 //   403 for kFailureHoldMs without any lookup (one more line when that
@@ -94,7 +98,9 @@ class Authenticator {
   DigestAuthentication m_digest;
   // The throttle passes its limit and holds at the next one.
   SourceThrottle m_failures{kFailureLimit - 1, kFailureWindowMs, kFailureHoldMs, kFailureSources};
-  // The realms the first challenged identity of each location service (by
-  // name) was challenged in: as many entries as services configured.
-  std::map<std::string, std::vector<std::string>> m_realmsByService;
+  // The realms the first challenged identity of each location service was
+  // challenged in: as many entries as services configured. The key is only
+  // compared, never followed: a service removed and another made at its
+  // address would only lend the new one its realms.
+  std::map<void const*, std::vector<std::string>> m_realmsByService;
 };

@@ -48,7 +48,8 @@ def sha256_registration_cannot_be_replayed(program, work, emulator):
         # higher one; and on another registration (Call-ID).
         for cseq in (2, 3):
             replay = phone.send(register(phone, alice, call_id, cseq, "sip:mallory@203.0.113.66", auth))
-            check(replay.status == 403, "replay with CSeq %d answered %d" % (cseq, replay.status))
+            check(replay.status == 401 and all(c[3] for c in replay.challenges()),
+                  "replay with CSeq %d answered %d %r" % (cseq, replay.status, replay.challenges()))
         other = phone.send(register(phone, alice, phone.new_call_id(), 1, "sip:mallory@203.0.113.66", auth))
         check(other.status == 401, "nonce taken to another Call-ID: %d" % other.status)
         where = phone.send(phone.build("MESSAGE", alice, alice, phone.new_call_id(), 1))
