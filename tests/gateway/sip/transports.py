@@ -5,17 +5,20 @@ transport is refused.
 
     transports.py GATEWAY WORK-DIR [EMULATOR...]
 
-The phone is sipphone.StreamPhone on Python's ssl module: Debian's SIPp has
-no TLS, and no packaged client speaks SIP over WebSocket. The server
-certificate is made here with the openssl command, and the phone verifies it
-and its host name.
+A real phone, Debian's baresip, registers over TLS. The other cases use
+sipphone.StreamPhone on Python's ssl module: Debian's SIPp has no TLS,
+baresip 1.0 speaks no SIP over WebSocket and answers no SHA-256 challenge.
+The server certificate is made here with the openssl command, and the
+phones verify it.
 """
 
 import os
 import re
+import shutil
 import subprocess
 import sys
 import tempfile
+import time
 
 sys.path.insert(0, os.path.join(os.path.dirname(os.path.abspath(__file__)), ".."))
 from sipphone import Failure, Gateway, Phone, StreamPhone, authorization, check, run  # noqa: E402
@@ -27,7 +30,7 @@ def make_certificate(directory):
     certificate = os.path.join(directory, "gateway.pem")
     key = os.path.join(directory, "gateway.key")
     subprocess.run(["openssl", "req", "-x509", "-newkey", "rsa:2048", "-nodes", "-keyout", key, "-out", certificate,
-                    "-days", "1", "-subj", "/CN=localhost", "-addext", "subjectAltName=DNS:localhost"],
+                    "-days", "1", "-subj", "/CN=localhost", "-addext", "subjectAltName=DNS:localhost,IP:127.0.0.1"],
                    check=True, capture_output=True, timeout=60)
     return certificate, key
 
@@ -85,10 +88,54 @@ def phones_register_and_are_found_over_every_transport(program, work, emulator):
         gateway.kill()
 
 
+def baresip_registers_over_tls_and_is_found(program, work, emulator):
+    baresip = shutil.which("baresip")
+    if not baresip:
+        print("skipped: no baresip (Debian's baresip-core)")
+        return
+    directory = tempfile.mkdtemp(dir=work)
+    certificate, key = make_certificate(directory)
+    # libre 1.x, under baresip 1.0, gives up on a SHA-256 challenge first.
+    gateway = Gateway(program, emulator, work, "baresip", [SCRIPT],
+                      ["--digest", "MD5", "--tls", "127.0.0.1:0", "--certificate", certificate, "--key", key])
+    phone = None
+    try:
+        port = re.search(r"listening on tls:127\.0\.0\.1:(\d+)", gateway.errors()).group(1)
+        with open(os.path.join(directory, "config"), "w") as config:
+            config.write("sip_listen 127.0.0.1:0\nsip_cafile %s\nmodule_path /usr/lib/baresip/modules\n"
+                         "module g711.so\nmodule_app account.so\n" % certificate)
+        with open(os.path.join(directory, "accounts"), "w") as accounts:
+            accounts.write('<sip:alice@example.com;transport=tls>;auth_pass=secret;'
+                           'outbound="sip:127.0.0.1:%s;transport=tls";regint=60\n' % port)
+        with open(os.path.join(work, "baresip.log"), "wb") as log:
+            phone = subprocess.Popen([baresip, "-f", directory, "-t", "30"], stdout=log, stderr=log)
+        deadline = time.monotonic() + 20
+        while "example.com/alice 200" not in gateway.output() and time.monotonic() < deadline:
+            time.sleep(0.1)
+        check("example.com/alice 200" in gateway.output(), "baresip did not register: " + gateway.output())
+        caller = Phone(gateway.port)
+        uri = "sip:alice@example.com"
+        found = caller.send(caller.build("INVITE", uri, uri, caller.new_call_id(), 1))
+        caller.close()
+        check(found.status == 302 and any("transport=tls" in c for c in found.all("Contact")),
+              "baresip not found over TLS: %d %r" % (found.status, found.all("Contact")))
+        gateway.stop()
+    finally:
+        if phone:
+            phone.terminate()
+            try:
+                phone.wait(timeout=10)
+            except subprocess.TimeoutExpired:
+                phone.kill()
+                phone.wait()
+        gateway.kill()
+
+
 if __name__ == "__main__":
     if len(sys.argv) < 3:
         sys.exit("usage: transports.py GATEWAY WORK-DIR [EMULATOR...]")
-    sys.exit(run([("websocket_refused_on_a_crashable_libre", websocket_refused_on_a_crashable_libre),
+    sys.exit(run([("baresip_registers_over_tls_and_is_found", baresip_registers_over_tls_and_is_found),
+                  ("websocket_refused_on_a_crashable_libre", websocket_refused_on_a_crashable_libre),
                   ("phones_register_and_are_found_over_every_transport",
                    phones_register_and_are_found_over_every_transport)],
                  sys.argv[1], sys.argv[2], sys.argv[3:]))
