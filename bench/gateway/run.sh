@@ -70,22 +70,19 @@ server_processes() {
   echo "$server_pid"
   pgrep -P "$server_pid" || true
 }
+# sum_over_server FILE PROGRAM: the sum over the server's processes of what
+# the awk PROGRAM prints from /proc/PID/FILE.
+sum_over_server() {
+  local pid total=0
+  for pid in $(server_processes); do
+    total=$((total + $(awk "$2" "/proc/$pid/$1" 2>/dev/null || echo 0)))
+  done
+  echo "$total"
+}
 # CPU time (user and system) of all the server's processes so far, in ticks.
-server_ticks() {
-  local pid total=0
-  for pid in $(server_processes); do
-    total=$((total + $(awk '{ sub(/^.*\) /, ""); print $12 + $13 }' "/proc/$pid/stat" 2>/dev/null || echo 0)))
-  done
-  echo "$total"
-}
+server_ticks() { sum_over_server stat '{ sub(/^.*\) /, ""); print $12 + $13 }'; }
 # Proportional set size of all the server's processes, in KiB.
-server_pss_kib() {
-  local pid total=0
-  for pid in $(server_processes); do
-    total=$((total + $(awk '/^Pss:/ { print $2 }' "/proc/$pid/smaps_rollup" 2>/dev/null || echo 0)))
-  done
-  echo "$total"
-}
+server_pss_kib() { sum_over_server smaps_rollup '/^Pss:/ { print $2 }'; }
 
 # Field NAME of the last line of a SIPp statistics file.
 statistic() {

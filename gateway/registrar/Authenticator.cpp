@@ -79,6 +79,16 @@ bool Authenticator::refuseHeldSource(Exchange& exchange) {
 
 bool Authenticator::admit(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to) {
   String error;
+  Outcome const quick = evaluate(exchange.request(), nullptr, [&](String const& realm, String const& user) {
+    Vector<String> passwords;
+    m_clock.measure([&] {
+      LS_getInboundAuthenticationResponse(error, passwords, identity, to, LS_AuthenticationProtocol::HTTP,
+                                          realm, user, nullptr);
+    });
+    return passwords;
+  });
+  if (quick.accepted)
+    return true;
   Vector<LS_ProtocolRealm> realms;
   m_clock.measure([&] { LS_getInboundAuthenticationChallenge(error, realms, identity, nullptr); });
   if (realms.isEmpty()) {
@@ -99,11 +109,16 @@ bool Authenticator::admit(Exchange& exchange, LS_IIdentity* identity, CNameAddr 
   });
   if (service && m_realmsByService.count(service.get()) == 0)
     m_realmsByService.emplace(service.get(), names);
-  return check(exchange, names, [&](size_t index, String const& user) {
+  return check(exchange, names, [&](String const& realm, String const& user) {
     Vector<String> passwords;
+    auto const found = std::find_if(realms.begin(), realms.end(), [&](LS_ProtocolRealm const& candidate) {
+      return candidate.realm == realm;
+    });
+    if (found == realms.end())
+      return passwords;
     m_clock.measure([&] {
-      LS_getInboundAuthenticationResponse(error, passwords, identity, to, realms[index].protocol,
-                                          realms[index].realm, user, nullptr);
+      LS_getInboundAuthenticationResponse(error, passwords, identity, to, found->protocol, realm, user,
+                                          nullptr);
     });
     return passwords;
   });
@@ -130,19 +145,15 @@ void Authenticator::refuseUnknown(Exchange& exchange, CNameAddr const& to) {
   auto const known = m_realmsByService.find(service.get());
   std::vector<std::string> const realms =
       known != m_realmsByService.end() ? known->second : std::vector<std::string>{host.GetHost().c_str()};
-  check(exchange, realms, [](size_t, String const&) { return Vector<String>(); });
+  check(exchange, realms, [](String const&, String const&) { return Vector<String>(); });
 }
 
-bool Authenticator::check(Exchange& exchange,
-                          std::vector<std::string> const& realms,
-                          Passwords const& passwordsOf) {
-  sip_msg const& message = exchange.request();
+Authenticator::Outcome Authenticator::evaluate(sip_msg const& message,
+                                               std::vector<std::string> const* realms,
+                                               Passwords const& passwordsOf) {
   uint64_t const now = tmr_jiffies();
-  bool stale = false;
   unsigned int looked = 0;
-  char const* failure = nullptr;
-  bool accepted = false;
-  pl user{};
+  Outcome outcome;
   forEachHeader(message, SIP_HDR_AUTHORIZATION, [&](sip_hdr const& header) {
     if (++looked > kMaximumAuthorizations)
       return false;
@@ -150,58 +161,64 @@ bool Authenticator::check(Exchange& exchange,
     if (!decodeDigestResponse(header.val, response) || response.fields.username.l > kMaximumUserName)
       return true;
     httpauth_digest_resp const& fields = response.fields;
-    auto const realm = std::find_if(realms.begin(), realms.end(), [&](std::string const& candidate) {
-      return pl_strcmp(&fields.realm, candidate.c_str()) == 0;
-    });
-    if (realm == realms.end())
+    if (realms && std::none_of(realms->begin(), realms->end(), [&](std::string const& candidate) {
+          return pl_strcmp(&fields.realm, candidate.c_str()) == 0;
+        }))
       return true;
     switch (m_nonces.check(fields.nonce, fields.realm, message.callid, now)) {
       case NonceGenerator::Check::UNKNOWN:
         return true;
       case NonceGenerator::Check::STALE:
-        stale = true;
+        outcome.stale = true;
         return true;
       case NonceGenerator::Check::VALID:
         break;
     }
-    user = fields.username;
+    outcome.user = fields.username;
     if (pl_cmp(&fields.uri, &message.ruri) != 0) {
-      failure = "digest uri is not the request URI";
+      outcome.failure = "digest uri is not the request URI";
       return false;
     }
-    Vector<String> const passwords = passwordsOf(static_cast<size_t>(realm - realms.begin()),
-                                                 String(fields.username.p, fields.username.l));
+    Vector<String> const passwords =
+        passwordsOf(String(fields.realm.p, fields.realm.l), String(fields.username.p, fields.username.l));
     bool const matches = std::any_of(passwords.begin(), passwords.end(), [&](String const& password) {
       return m_digest.matches(response, message.met, password.c_str());
     });
     if (!matches) {
-      failure = "wrong user or password";
+      outcome.failure = "wrong user or password";
       return false;
     }
     uint32_t const count = pl_isset(&fields.qop) ? pl_x32(&fields.nc) : 0;
     if (pl_isset(&fields.qop) && count == 0) {
-      failure = "no nonce-count";
+      outcome.failure = "no nonce-count";
       return false;
     }
     switch (m_used.use(fields.nonce, NonceGenerator::madeAt(fields.nonce), count, fingerprintOf(message))) {
       case NonceTable::Use::FORGOTTEN:
       case NonceTable::Use::REPLAYED:
-        stale = true;
+        outcome.stale = true;
         return true;
       case NonceTable::Use::FIRST_OR_NEWER:
       case NonceTable::Use::REPEATED:
-        accepted = true;
+        outcome.accepted = true;
         return false;
     }
     return false;
   });
-  if (accepted)
+  return outcome;
+}
+
+bool Authenticator::check(Exchange& exchange,
+                          std::vector<std::string> const& realms,
+                          Passwords const& passwordsOf) {
+  Outcome const outcome = evaluate(exchange.request(), &realms, passwordsOf);
+  if (outcome.accepted)
     return true;
-  if (failure) {
-    fail(exchange, user, failure);
+  if (outcome.failure) {
+    fail(exchange, outcome.user, outcome.failure);
     return false;
   }
-  challenge(exchange, realms, stale);
+  challenge(exchange, realms, outcome.stale);
   return false;
 }
 

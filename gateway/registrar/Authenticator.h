@@ -5,6 +5,12 @@
 // and NonceTable's. Nothing here touches a binding.
 //
 // Decisions, with their reasons:
+// - Credentials the library takes for the realm they name (HTTP digest) are
+//   accepted before the realms to challenge with are asked for: that list
+//   only matters when credentials are missing or wrong, and asking for it
+//   was the library's largest cost of an authenticated REGISTER. Such a
+//   password can only come from the identity's own inbound authentication,
+//   so an identity accepted that way is a challenged one.
 // - An identity the library does not challenge registers only when it or
 //   its group has an inbound-registration face (configured, or dynamic from
 //   an earlier registration that passed this same test); any other gets 403.
@@ -82,11 +88,24 @@ class Authenticator {
   void refuseUnknown(Exchange& exchange, CNameAddr const& to);
 
  private:
-  // The passwords that answer the realm of index for the user.
-  using Passwords = std::function<Vector<String>(size_t realm, String const& user)>;
+  // The passwords that answer the realm for the user.
+  using Passwords = std::function<Vector<String>(String const& realm, String const& user)>;
+  // What the request's Authorization headers come to.
+  struct Outcome {
+    bool accepted = false;
+    bool stale = false;             // a nonce expired, used or forgotten
+    char const* failure = nullptr;  // why a failed authentication failed
+    pl user{};                      // whose it was
+  };
 
-  // The digest check over the request's Authorization headers against the
-  // realms; answers 401 or 403 itself when they do not pass.
+  // The first Authorization header with an authentic nonce for one of the
+  // realms (for any realm when realms is null) checked, and its nonce used
+  // when it passes. Answers nothing, logs nothing: a request may be
+  // evaluated again with the realms after failing without them.
+  Outcome evaluate(sip_msg const& message,
+                   std::vector<std::string> const* realms,
+                   Passwords const& passwordsOf);
+  // The evaluation against realms, answering 401 or 403 when it does not pass.
   bool check(Exchange& exchange, std::vector<std::string> const& realms, Passwords const& passwords);
   void challenge(Exchange& exchange, std::vector<std::string> const& realms, bool stale);
   void fail(Exchange& exchange, pl const& user, char const* reason);

@@ -108,9 +108,6 @@ class Registrar {
   // Drops the identity's table entry when it holds no binding, and a
   // dynamic identity made for it with it.
   void forgetIfUnbound(LS_IIdentity* identity, bool created);
-  // Whether the request carries valid credentials; answers 401 or 403
-  // itself when not.
-  bool authenticated(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to);
   // What the request's CSeq makes of it against the bindings it names (all
   // of them for a wildcard) that carry its Call-ID.
   enum class Order { NEW, RETRANSMITTED, OUT_OF_ORDER };

@@ -1,5 +1,6 @@
 #include "sip/SipFrontEnd.h"
 
+#include <algorithm>
 #include <cstring>
 
 #include "sip/Exchange.h"
@@ -15,6 +16,13 @@ char const kAllow[] = "Allow: REGISTER, INVITE, ACK, CANCEL, MESSAGE, SUBSCRIBE,
 constexpr uint32_t kClientTransactions = 64;
 constexpr uint32_t kServerTransactions = 16;
 constexpr uint32_t kConnections = 64;
+
+// The receive (and send) buffer of each UDP socket. The kernel's default,
+// some 200 KiB, holds about a thousand requests: a burst of a storm that
+// arrives while the loop is busy or not scheduled overflows it, and the
+// phones retransmit. Kamailio enlarges its sockets likewise. The kernel
+// keeps the size within net.core.rmem_max.
+constexpr int kUdpBufferBytes = 4 * 1024 * 1024;
 
 void stopLoop(void*) {
   re_cancel();
@@ -82,6 +90,8 @@ bool SipFrontEnd::onRequest(sip_msg const* request, void* argument) {
   // answered without a transaction, see Exchange::answer).
   if (pl_strcmp(&message.met, "ACK") == 0)
     return true;
+  if (message.tp == SIP_TRANSP_UDP)
+    frontEnd.enlarge(message.sock);
   if (frontEnd.m_rateLimit && !frontEnd.m_rateLimit->admit(*frontEnd.m_stack, message))
     return true;
   Exchange exchange(*frontEnd.m_stack, message, frontEnd.m_session, frontEnd.m_log, frontEnd.m_clock);
@@ -109,6 +119,13 @@ bool SipFrontEnd::onRequest(sip_msg const* request, void* argument) {
   }
   exchange.answer(405, "Method Not Allowed", kAllow);
   return true;
+}
+
+void SipFrontEnd::enlarge(void* udpSocket) {
+  if (std::find(m_enlarged.begin(), m_enlarged.end(), udpSocket) != m_enlarged.end())
+    return;
+  m_enlarged.push_back(udpSocket);
+  udp_sockbuf_set(static_cast<udp_sock*>(udpSocket), kUdpBufferBytes);
 }
 
 void SipFrontEnd::onClosed(void*) {

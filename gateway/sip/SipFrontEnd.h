@@ -13,6 +13,7 @@
 
 #include <memory>
 #include <string>
+#include <vector>
 
 #include "ScriptSession.h"
 #include "metrics/LibraryClock.h"
@@ -60,6 +61,11 @@ class SipFrontEnd {
  private:
   static bool onRequest(sip_msg const* request, void* frontEnd);
   static void onClosed(void* frontEnd);
+  // Gives a UDP socket of the stack its larger buffers (kUdpBufferBytes)
+  // the first time a request arrives on it: the stack makes its sockets
+  // itself and hands them out only with what they received (sip_msg's
+  // sock, a udp_sock for UDP).
+  void enlarge(void* udpSocket);
 
   ScriptSession& m_session;
   LibraryClock& m_clock;
@@ -70,6 +76,7 @@ class SipFrontEnd {
   sip* m_stack = nullptr;
   sip_lsnr* m_listener = nullptr;
   std::unique_ptr<TrunkRegistrations> m_trunks;
+  std::vector<void*> m_enlarged;  // the UDP sockets enlarge() has seen
   std::unique_ptr<SourceRateLimit> m_rateLimit;
   std::string m_caFile;
 };
