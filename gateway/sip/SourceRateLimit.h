@@ -8,7 +8,8 @@
 // a load test from one machine; an operator sets N above what its largest
 // site sends. Dropping rather than answering every request keeps a flood
 // from costing a send per packet; the one 503 tells a well-behaved peer
-// when to come back. Runs on libre's thread, before anything else looks at
+// when to come back. Neither the 503 nor a drop gets a request log line:
+// the one line of the hold says it. Runs on libre's thread, before anything else looks at
 // the request.
 #pragma once
 

@@ -16,7 +16,7 @@ from sipphone import Failure, Gateway, Phone, authorization, check, run  # noqa:
 
 HERE = os.path.dirname(os.path.abspath(__file__))
 SCRIPTS = [os.path.join(HERE, "subscribers.script"), os.path.join(HERE, "security.script")]
-PASSWORDS = ["secret", "welcome", "erin-password"]
+PASSWORDS = ["secret", "welcome", "erin-password", "topsecret"]
 # The README's fail2ban filter.
 FAIL2BAN = re.compile(r'^location-gateway: authentication failed for ".*" from (?P<host>\S+) port \d+', re.M)
 
@@ -66,9 +66,12 @@ def sha256_registration_cannot_be_replayed(program, work, emulator):
         auth = authorization(md5, "REGISTER", "sip:example.com", "carol", "welcome")
         check(phone.send(register(phone, carol, carol_call, 2, "sip:carol@192.0.2.3", auth)).status == 200,
               "MD5 response refused")
+        # A password in a Request-URI, as RFC 3261 advises against.
+        phone.send(phone.build("MESSAGE", "sip:alice:topsecret@example.com", alice, phone.new_call_id(), 1))
         phone.close()
         gateway.stop()
         printed = gateway.output() + gateway.errors()
+        check("sip:alice:****@example.com" in printed, "the request log lost the masked URI")
         check("debug: " in printed, "--debug printed no debug line")
         for secret in PASSWORDS:
             check(secret not in printed, "the output shows the password " + secret)
