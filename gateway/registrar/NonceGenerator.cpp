@@ -67,9 +67,9 @@ void NonceGenerator::useKey(std::array<uint8_t, 20> const& key) {
     std::abort();
 }
 
-std::string NonceGenerator::signature(uint64_t madeMs, pl const& realm, pl const& callId) const {
+std::string NonceGenerator::signature(uint64_t stamp, pl const& realm, pl const& callId) const {
   char time[kTimeDigits + 1];
-  std::snprintf(time, sizeof time, "%016llx", static_cast<unsigned long long>(madeMs));
+  std::snprintf(time, sizeof time, "%016llx", static_cast<unsigned long long>(stamp));
   // The realm's length goes first: both texts may hold any character, and
   // "a:b" + "c" must not sign the same as "a" + "b:c".
   std::string data(time);
@@ -86,17 +86,19 @@ std::string NonceGenerator::signature(uint64_t madeMs, pl const& realm, pl const
 }
 
 std::string NonceGenerator::make(pl const& realm, pl const& callId, uint64_t nowMs) const {
-  return signature(nowMs, realm, callId);
+  ++m_serial;
+  return signature((nowMs << kSerialBits) | (m_serial & ((1u << kSerialBits) - 1)), realm, callId);
 }
 
 NonceGenerator::Check NonceGenerator::check(pl const& nonce,
                                             pl const& realm,
                                             pl const& callId,
                                             uint64_t nowMs) const {
-  uint64_t madeMs = 0;
-  if (nonce.l != kTimeDigits + kSignatureDigits || !parseTime(nonce.p, madeMs))
+  uint64_t stamp = 0;
+  if (nonce.l != kTimeDigits + kSignatureDigits || !parseTime(nonce.p, stamp))
     return Check::UNKNOWN;
-  std::string const expected = signature(madeMs, realm, callId);
+  uint64_t const madeMs = stamp >> kSerialBits;
+  std::string const expected = signature(stamp, realm, callId);
   // Compared in full whatever differs first, so the time taken tells
   // nothing about how much of a forged signature was right.
   unsigned char difference = 0;
@@ -108,8 +110,8 @@ NonceGenerator::Check NonceGenerator::check(pl const& nonce,
 }
 
 uint64_t NonceGenerator::madeAt(pl const& nonce) {
-  uint64_t madeMs = 0;
+  uint64_t stamp = 0;
   if (nonce.l >= kTimeDigits)
-    parseTime(nonce.p, madeMs);
-  return madeMs;
+    parseTime(nonce.p, stamp);
+  return stamp >> kSerialBits;
 }

@@ -118,6 +118,8 @@ TEST(NonceGenerator, HoldsForItsRealmCallIdAndLifetimeOnly) {
   std::string const made = nonces.make(realm, callId, 1000);
   pl const nonce = text(made.c_str());
   EXPECT_EQ(1000u, NonceGenerator::madeAt(nonce));
+  // Two challenges of one registration within a millisecond differ.
+  EXPECT_NE(made, nonces.make(realm, callId, 1000));
   EXPECT_EQ(NonceGenerator::Check::VALID,
             nonces.check(nonce, realm, callId, 1000 + NonceGenerator::kLifetimeMs));
   EXPECT_EQ(NonceGenerator::Check::STALE,
