@@ -38,11 +38,10 @@
 //   gets a fresh one instead of a refusal its user would have to clear.
 //   Such a request is not a failed authentication: the password was right.
 // - A failed authentication (wrong password or user, a digest over another
-//   URI) gets 403 and one line on standard error naming
-//   the user and the source address, for an operator's fail2ban; a source
-//   with kFailureLimit of them within kFailureWindowMs is then refused with
-//   403 for kFailureHoldMs without any lookup (one more line when that
-//   starts). The library is asked nothing for a held source.
+//   URI) gets 403 and one line on standard error naming the user and the
+//   source address, for an operator's fail2ban; a source with kFailureLimit
+//   of them within kFailureWindowMs is then refused with 403 for
+//   kFailureHoldMs without any lookup (one more line when that starts).
 //
 // Owned by the Registrar; everything runs on libre's thread.
 #pragma once
