@@ -14,6 +14,7 @@
 #include <cstring>
 #include <fstream>
 #include <iostream>
+#include <memory>
 #include <string>
 #include <vector>
 
@@ -21,7 +22,11 @@
 #include "ScriptLanguage.h"
 #include "ScriptRunner.h"
 #include "ScriptSession.h"
+#include "control/Autosave.h"
+#include "control/ControlServer.h"
+#include "control/GatewayCommands.h"
 #include "metrics/LibraryClock.h"
+#include "metrics/MetricsServer.h"
 #include "redirect/SourceFilter.h"
 #include "registrar/CredentialMask.h"
 #include "registrar/DigestAuthentication.h"
@@ -31,7 +36,8 @@
 namespace {
 
 char const kUsage[] =
-    "usage: location-gateway [--listen ADDR:PORT] [OPTION...] SCRIPT...\n"
+    "usage: location-gateway [--listen ADDR:PORT] [--debug] [--statistics] [--control PATH]\n"
+    "                        [--autosave FILE] [--metrics ADDR:PORT] [OPTION...] SCRIPT...\n"
     "\n"
     "Configures the library from the scripts (the console's language), then\n"
     "answers SIP requests on ADDR:PORT (default 127.0.0.1:5060, UDP and TCP;\n"
@@ -56,6 +62,11 @@ char const kUsage[] =
     "                certificates (PEM) instead of the system's\n"
     "  --allow-vulnerable-websocket  WebSocket even on a libre before 4.8.1,\n"
     "                which any peer can crash (CVE-2026-50161): tests only\n"
+    "  --control PATH   a Unix socket (mode 0600) taking lines of the script\n"
+    "                   language while serving: location-console --connect PATH\n"
+    "  --autosave FILE  after a change over the socket, the configuration\n"
+    "                   into FILE as save writes it (at most once a second)\n"
+    "  --metrics ADDR:PORT  GET /metrics over HTTP, in Prometheus text format\n"
     "\n"
     "Exit status: 0 after a signal, 1 when a script line fails or the\n"
     "address cannot be bound, 2 for a usage error or an unreadable script.\n";
@@ -73,6 +84,9 @@ struct Options {
   unsigned long sourceRate = 0;
   SecureTransportOptions secure;
   std::string caFile;
+  std::string control;
+  std::string autosave;
+  std::string metrics;
   std::vector<std::string> scripts;
 };
 
@@ -82,6 +96,12 @@ bool parse(int argc, char** argv, Options& options) {
     std::string const argument = argv[i];
     if (argument == "--listen" && i + 1 < argc)
       options.listen = argv[++i];
+    else if (argument == "--control" && i + 1 < argc)
+      options.control = argv[++i];
+    else if (argument == "--autosave" && i + 1 < argc)
+      options.autosave = argv[++i];
+    else if (argument == "--metrics" && i + 1 < argc)
+      options.metrics = argv[++i];
     else if (argument == "--debug")
       options.debug = true;
     else if (argument == "--statistics")
@@ -133,8 +153,54 @@ int runScripts(ScriptSession& session, std::vector<std::string> const& scripts) 
   return 0;
 }
 
+// The parts that operate a serving gateway: the control socket (with the
+// autosave it drives) and the metrics, each only when asked for.
+struct Operations {
+  CommandTable table;
+  std::unique_ptr<Autosave> autosave;
+  std::unique_ptr<ControlServer> control;
+  std::unique_ptr<MetricsServer> metrics;
+};
+
+bool startOperations(ScriptSession& session,
+                     SipFrontEnd& frontEnd,
+                     Options const& options,
+                     Operations& parts) {
+  std::string error;
+  if (!options.autosave.empty())
+    parts.autosave = std::make_unique<Autosave>(session, options.autosave);
+  if (!options.control.empty()) {
+    addScriptCommands(parts.table);
+    addGatewayCommands(parts.table, frontEnd);
+    parts.control = std::make_unique<ControlServer>(session, parts.table);
+    Autosave* const autosave = parts.autosave.get();
+    parts.control->onLine([&frontEnd] { frontEnd.beginChange(); },
+                          [&frontEnd, autosave](bool applied) {
+                            frontEnd.endChange();
+                            if (autosave && applied)
+                              autosave->changed();
+                          });
+    if (!parts.control->start(options.control, error)) {
+      std::cerr << "location-gateway: " << error << "\n";
+      return false;
+    }
+    std::cerr << "location-gateway: control socket " << options.control << std::endl;
+  }
+  if (!options.metrics.empty()) {
+    parts.metrics = std::make_unique<MetricsServer>([&frontEnd] { return frontEnd.statistics(); });
+    std::string bound;
+    if (!parts.metrics->start(options.metrics, bound, error)) {
+      std::cerr << "location-gateway: " << error << "\n";
+      return false;
+    }
+    std::cerr << "location-gateway: metrics on http://" << bound << "/metrics" << std::endl;
+  }
+  return true;
+}
+
 int serve(ScriptSession& session, Options const& options) {
-  LibraryClock clock(options.statistics);
+  // The statistics question and /metrics report the library's share too.
+  LibraryClock clock(options.statistics || !options.control.empty() || !options.metrics.empty());
   SipFrontEnd frontEnd(session, clock);
   frontEnd.registrar().authenticator().offerAlgorithms(options.digest);
   frontEnd.trustForTrunks(options.caFile);
@@ -156,7 +222,14 @@ int serve(ScriptSession& session, Options const& options) {
   std::cerr << "location-gateway: listening on udp:" << bound << std::endl;
   for (std::string const& transport : secure)
     std::cerr << "location-gateway: listening on " << transport << std::endl;
-  re_main(onSignal);
+  {
+    Operations operations;
+    if (!startOperations(session, frontEnd, options, operations)) {
+      frontEnd.shutDown();
+      return 1;
+    }
+    re_main(onSignal);
+  }
   frontEnd.shutDown();
   if (options.statistics)
     std::cerr << "location-gateway: " << frontEnd.requests() << " requests, " << clock.summary() << std::endl;

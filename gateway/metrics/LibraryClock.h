@@ -1,8 +1,7 @@
 // LibraryClock: the gateway's CPU time and the share of it spent inside the
-// library's calls, for --statistics. Every call the gateway makes on the
-// library goes through measure(), which reads a clock before and after it
-// when the clock is on and reads nothing when it is off. The gateway runs on
-// one thread, so the thread's CPU clock is the process's work.
+// library's calls, for --statistics, the statistics question and /metrics. Every call the gateway makes on
+// the library goes through measure(), which reads a clock before and after it when the clock is on and reads
+// nothing when it is off. The gateway runs on one thread, so the thread's CPU clock is the process's work.
 //
 // Decision: the calls are timed with the monotonic clock, not the thread's
 // CPU clock. The CPU clock is a system call (about 1.3 us on the machines
@@ -32,6 +31,9 @@ class LibraryClock {
 
   // "CPU X.XXX s, in the library Y.YYY s (Z.Z%)" for the thread so far.
   std::string summary() const;
+  // The calling thread's CPU time: the gateway's when called on its loop.
+  static double cpuSeconds() { return threadSeconds(); }
+  double librarySeconds() const { return m_librarySeconds; }
 
  private:
   // Adds the time between its construction and destruction.

@@ -71,7 +71,7 @@ std::string addressOf(sa const& source) {
 Authenticator::Authenticator(LibraryClock& clock) : m_clock(clock) {}
 
 bool Authenticator::refuseHeldSource(Exchange& exchange) {
-  if (!m_failures.held(exchange.request().src, tmr_jiffies()))
+  if (!m_failingSources.held(exchange.request().src, tmr_jiffies()))
     return false;
   exchange.answer(403, "Forbidden");
   return true;
@@ -236,10 +236,11 @@ void Authenticator::challenge(Exchange& exchange, std::vector<std::string> const
 }
 
 void Authenticator::fail(Exchange& exchange, pl const& user, char const* reason) {
+  ++m_failures;
   sa const& source = exchange.request().src;
   std::cerr << "location-gateway: authentication failed for \"" << printable(user) << "\" from "
             << addressOf(source) << ": " << reason << std::endl;
-  if (m_failures.count(source, tmr_jiffies()) == SourceThrottle::Verdict::HELD_NOW)
+  if (m_failingSources.count(source, tmr_jiffies()) == SourceThrottle::Verdict::HELD_NOW)
     std::cerr << "location-gateway: " << addressOf(source) << " refused for " << kFailureHoldMs / 1000
               << " s after " << kFailureLimit << " failed authentications" << std::endl;
   exchange.answer(403, "Forbidden");

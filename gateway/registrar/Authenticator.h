@@ -79,6 +79,9 @@ class Authenticator {
   // What each challenge offers per realm, in this order; not empty.
   void offerAlgorithms(std::vector<DigestAlgorithm> const& algorithms) { m_offered = algorithms; }
 
+  // Failed authentications answered so far (for the statistics).
+  uint64_t failures() const { return m_failures; }
+
   // True, after answering 403, when the request's source is held.
   bool refuseHeldSource(Exchange& exchange);
   // Whether identity, which to denotes, may register with this request.
@@ -110,12 +113,13 @@ class Authenticator {
   void fail(Exchange& exchange, pl const& user, char const* reason);
 
   LibraryClock& m_clock;
+  uint64_t m_failures = 0;
   std::vector<DigestAlgorithm> m_offered{DigestAlgorithm::SHA256, DigestAlgorithm::MD5};
   NonceGenerator m_nonces;
   NonceTable m_used{kNonceCapacity};
   DigestAuthentication m_digest;
   // The throttle passes its limit and holds at the next one.
-  SourceThrottle m_failures{kFailureLimit - 1, kFailureWindowMs, kFailureHoldMs, kFailureSources};
+  SourceThrottle m_failingSources{kFailureLimit - 1, kFailureWindowMs, kFailureHoldMs, kFailureSources};
   // The realms the first challenged identity of each location service was
   // challenged in: as many entries as services configured. The key is only
   // compared, never followed: a service removed and another made at its

@@ -1,6 +1,7 @@
 #include "registrar/Registrar.h"
 
 #include <algorithm>
+#include <cctype>
 #include <vector>
 
 #include "LS_ILocationService.h"
@@ -211,6 +212,60 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
   }
   reportTransition(bindings, before);
   exchange.answer(200, "OK", bindingHeaders(bindings));
+}
+
+void Registrar::dropRemoved(std::vector<LS_IIdentity const*> const& removed, bool checkAll) {
+  for (LS_IIdentity const* identity : removed) {
+    auto const found = m_bindings.find(const_cast<LS_IIdentity*>(identity));
+    if (found != m_bindings.end())
+      drop(found);
+  }
+  if (!checkAll)
+    return;
+  for (auto entry = m_bindings.begin(); entry != m_bindings.end();) {
+    auto const next = std::next(entry);
+    LS_IIdentity* const identity = entry->first;
+    bool const present = m_clock.measure([&] {
+      RefPtr<LS_ILocationService> service;
+      RefPtr<LS_IIdentity> found;
+      adoptInterface(service,
+                     [&](UUID const& iid, void** raw) { return identity->getLocationServiceIf(iid, raw); });
+      return service && LS_getIdentityIf(service.get(), identity->getName(), found).isSuccess() &&
+             found.get() == identity;
+    });
+    if (!present)
+      drop(entry);
+    entry = next;
+  }
+}
+
+std::vector<Registrar::BindingView> Registrar::bindings(LS_IIdentity const* identity) const {
+  uint64_t const now = tmr_jiffies();
+  std::vector<BindingView> views;
+  for (auto const& entry : m_bindings) {
+    if (identity && entry.first != identity)
+      continue;
+    for (auto const& held : entry.second.byContact) {
+      Binding const& binding = *held.second;
+      char source[80];
+      re_snprintf(source, sizeof source, "%s:%J", sip_transp_name(binding.transport), &binding.source);
+      std::string text = source;
+      std::transform(text.begin(), text.end(), text.begin(),
+                     [](char c) { return static_cast<char>(std::tolower(static_cast<unsigned char>(c))); });
+      views.push_back(BindingView{entry.first, held.first,
+                                  binding.expiresAtMs > now ? binding.expiresAtMs - now : 0, binding.callId,
+                                  std::move(text)});
+    }
+  }
+  return views;
+}
+
+void Registrar::drop(std::map<LS_IIdentity*, Bindings>::iterator entry) {
+  size_t const before = entry->second.byContact.size();
+  m_bindingsDropped += before;
+  removeAll(entry->second);
+  reportTransition(entry->second, before);
+  m_bindings.erase(entry);
 }
 
 Registrar::Order Registrar::order(Bindings const& bindings,

@@ -65,6 +65,26 @@ class Registrar {
   void handle(Exchange& exchange);
   Authenticator& authenticator() { return m_authenticator; }
 
+  size_t bindingCount() const { return m_expiries.size(); }
+  uint64_t failedAuthentications() const { return m_authenticator.failures(); }
+  uint64_t bindingsDropped() const { return m_bindingsDropped; }
+  // Lets go of the bindings of identities a change removed (counted in
+  // bindingsDropped): those listed, or, when checkAll (a whole location
+  // service went), every identity no longer found under its name in its
+  // service. Bindings of identities that remain are kept as they are.
+  void dropRemoved(std::vector<LS_IIdentity const*> const& removed, bool checkAll);
+
+  // One binding as the bindings question shows it.
+  struct BindingView {
+    LS_IIdentity const* identity;
+    std::string contact;  // as the REGISTER wrote it
+    uint64_t remainingMs;
+    std::string callId;
+    std::string source;  // "udp:ADDR:PORT": where the REGISTER came from
+  };
+  // The bindings held now; only the identity's when one is given.
+  std::vector<BindingView> bindings(LS_IIdentity const* identity) const;
+
  private:
   struct Bindings;
   struct Binding;
@@ -134,6 +154,8 @@ class Registrar {
   void unschedule(Binding& binding);
   // Sets the stack timer for the earliest expiry, or stops it.
   void rearm();
+  // Drops every binding of the table entry's identity, and the entry.
+  void drop(std::map<LS_IIdentity*, Bindings>::iterator entry);
   // Removes every binding whose time has run out.
   static void onSweep(void* registrar);
 
@@ -142,4 +164,5 @@ class Registrar {
   std::map<LS_IIdentity*, Bindings> m_bindings;
   Expiries m_expiries;
   tmr m_sweep;
+  uint64_t m_bindingsDropped = 0;
 };

@@ -39,6 +39,7 @@ void RequestLog::onFlush(void*) {
 
 void RequestLog::write(sip_msg const& request, std::string const& result, uint16_t code) {
   ++m_requests;
+  m_answers.count(request.met, code);
   writeToken(request.met);
   std::putchar(' ');
   writeUri(request);

@@ -13,6 +13,7 @@
 
 #include <string>
 
+#include "metrics/AnswerCounters.h"
 #include "sip/Libre.h"
 
 class RequestLog {
@@ -26,10 +27,12 @@ class RequestLog {
 
   void write(sip_msg const& request, std::string const& result, uint16_t code);
   unsigned long requests() const { return m_requests; }
+  AnswerCounters const& answers() const { return m_answers; }
 
  private:
   static void onFlush(void* log);
 
   unsigned long m_requests = 0;
+  AnswerCounters m_answers;
   tmr m_flush;
 };

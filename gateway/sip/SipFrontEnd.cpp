@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cstring>
 
+#include "SipStatistics.h"
 #include "sip/Exchange.h"
 
 namespace {
@@ -31,6 +32,7 @@ void stopLoop(void*) {
 }  // namespace
 
 SipFrontEnd::~SipFrontEnd() {
+  m_changes.reset();
   mem_deref(m_listener);
   // Forced: a registrar that never answered the unregistration must not
   // keep a registration alive that points at a trunk about to die.
@@ -69,7 +71,36 @@ bool SipFrontEnd::start(std::string const& listen, std::string& bound, std::stri
   m_trunks = std::make_unique<TrunkRegistrations>(*m_stack, m_session, m_clock);
   m_trunks->useCaFile(m_caFile);
   m_trunks->start();
+  m_changes = std::make_unique<ModelChanges>(*m_session.locationMaster());
   return true;
+}
+
+void SipFrontEnd::beginChange() {
+  m_changes->begin();
+}
+
+void SipFrontEnd::endChange() {
+  m_changes->end();
+  m_registrar.dropRemoved(m_changes->removed(), m_changes->anyServiceChanged());
+  if (m_changes->anyServiceChanged())
+    m_trunks->followAll();
+  else
+    m_trunks->follow(m_changes->touched(), m_changes->removed());
+}
+
+GatewayStatistics SipFrontEnd::statistics() const {
+  GatewayStatistics statistics;
+  statistics.answers = m_log.answers().counts();
+  statistics.failedAuthentications = m_registrar.failedAuthentications();
+  statistics.bindings = m_registrar.bindingCount();
+  statistics.bindingsDropped = m_registrar.bindingsDropped();
+  statistics.registeredContacts = s_sipStatistics.getInboundRegistrations();
+  m_trunks->forEach([&](std::string const& path, bool registered) {
+    statistics.trunks.push_back(GatewayStatistics::Trunk{path, registered});
+  });
+  statistics.cpuSeconds = LibraryClock::cpuSeconds();
+  statistics.librarySeconds = m_clock.librarySeconds();
+  return statistics;
 }
 
 void SipFrontEnd::shutDown() {

@@ -16,6 +16,8 @@
 #include <vector>
 
 #include "ScriptSession.h"
+#include "control/ModelChanges.h"
+#include "metrics/GatewayStatistics.h"
 #include "metrics/LibraryClock.h"
 #include "redirect/Redirector.h"
 #include "registrar/Registrar.h"
@@ -56,6 +58,13 @@ class SipFrontEnd {
   // are refused (SourceRateLimit); off unless called.
   void limitSourceRate(uint32_t perSecond) { m_rateLimit = std::make_unique<SourceRateLimit>(perSecond); }
 
+  // Around a change made while serving (a control line): the registrar
+  // drops the bindings of identities it removed, the trunks follow.
+  void beginChange();
+  void endChange();
+  GatewayStatistics statistics() const;
+  Registrar const& registrar() const { return m_registrar; }
+
   static constexpr uint64_t kShutDownMs = 2000;
 
  private:
@@ -76,6 +85,7 @@ class SipFrontEnd {
   sip* m_stack = nullptr;
   sip_lsnr* m_listener = nullptr;
   std::unique_ptr<TrunkRegistrations> m_trunks;
+  std::unique_ptr<ModelChanges> m_changes;
   std::vector<void*> m_enlarged;  // the UDP sockets enlarge() has seen
   std::unique_ptr<SourceRateLimit> m_rateLimit;
   std::string m_caFile;

@@ -30,6 +30,72 @@ TrunkRegistrations::~TrunkRegistrations() {
 }
 
 void TrunkRegistrations::start() {
+  m_trunks = findTrunks();
+  for (std::unique_ptr<Trunk> const& trunk : m_trunks)
+    registerTrunk(*trunk);
+}
+
+void TrunkRegistrations::follow(std::vector<RefPtr<LS_IIdentity>> const& touched,
+                                std::vector<LS_IIdentity const*> const& removed) {
+  for (LS_IIdentity const* identity : removed)
+    replace(identity, nullptr);
+  for (RefPtr<LS_IIdentity> const& identity : touched) {
+    if (std::find(removed.begin(), removed.end(), identity.get()) != removed.end())
+      continue;
+    std::unique_ptr<Trunk> candidate =
+        m_clock.measure([&] { return findTrunk(identity.get(), ScriptSession::pathOf(identity.get())); });
+    replace(identity.get(), std::move(candidate));
+  }
+}
+
+void TrunkRegistrations::replace(LS_IIdentity const* identity, std::unique_ptr<Trunk> candidate) {
+  auto const existing =
+      std::find_if(m_trunks.begin(), m_trunks.end(),
+                   [&](std::unique_ptr<Trunk> const& trunk) { return trunk->identity.get() == identity; });
+  if (existing != m_trunks.end()) {
+    if (candidate && same(**existing, *candidate))
+      return;
+    unregisterTrunk(**existing);
+    m_retired.push_back(std::move(*existing));
+    m_trunks.erase(existing);
+  }
+  if (!candidate)
+    return;
+  m_trunks.push_back(std::move(candidate));
+  registerTrunk(*m_trunks.back());
+}
+
+bool TrunkRegistrations::same(Trunk const& a, Trunk const& b) {
+  return a.path == b.path && a.registrarUri == b.registrarUri && a.addressOfRecord == b.addressOfRecord &&
+         a.route == b.route && a.lifetime == b.lifetime;
+}
+
+void TrunkRegistrations::followAll() {
+  std::vector<std::unique_ptr<Trunk>> found = findTrunks();
+  std::vector<std::unique_ptr<Trunk>> kept;
+  for (std::unique_ptr<Trunk>& trunk : m_trunks) {
+    auto const match = std::find_if(found.begin(), found.end(), [&](std::unique_ptr<Trunk> const& candidate) {
+      return candidate && same(*trunk, *candidate);
+    });
+    if (match == found.end()) {
+      unregisterTrunk(*trunk);
+      m_retired.push_back(std::move(trunk));
+      continue;
+    }
+    match->reset();
+    kept.push_back(std::move(trunk));
+  }
+  for (std::unique_ptr<Trunk>& trunk : found) {
+    if (!trunk)
+      continue;
+    kept.push_back(std::move(trunk));
+    registerTrunk(*kept.back());
+  }
+  m_trunks = std::move(kept);
+}
+
+std::vector<std::unique_ptr<TrunkRegistrations::Trunk>> TrunkRegistrations::findTrunks() {
+  std::vector<std::unique_ptr<Trunk>> trunks;
   m_clock.measure([&] {
     LS_IMasterLocationService* const master = m_session.locationMaster();
     Vector<String> services;
@@ -42,36 +108,27 @@ void TrunkRegistrations::start() {
       service->getIdentities(identities);
       for (String const& name : identities) {
         RefPtr<LS_IIdentity> identity;
-        if (LS_getIdentityIf(service.get(), name, identity).isSuccess())
-          findTrunk(identity.get(), serviceName.str() + "/" + name.str());
+        if (LS_getIdentityIf(service.get(), name, identity).isFailure())
+          continue;
+        if (std::unique_ptr<Trunk> trunk = findTrunk(identity.get(), serviceName.str() + "/" + name.str()))
+          trunks.push_back(std::move(trunk));
       }
     }
   });
-  std::vector<std::string> tlsHosts;
-  for (std::unique_ptr<Trunk> const& trunk : m_trunks)
-    if (!trunk->tlsHost.empty())
-      tlsHosts.push_back(trunk->tlsHost);
-  if (!tlsHosts.empty()) {
-    sa local;
-    std::string error;
-    if (sip_transp_laddr(&m_stack, &local, SIP_TRANSP_UDP, nullptr) != 0 ||
-        !m_tls.add(m_stack, local, m_caFile, tlsHosts, error))
-      report("trunks over TLS cannot register: " + error);
-  }
-  for (std::unique_ptr<Trunk> const& trunk : m_trunks)
-    registerTrunk(*trunk);
+  return trunks;
 }
 
-void TrunkRegistrations::findTrunk(LS_IIdentity* identity, std::string const& path) {
+std::unique_ptr<TrunkRegistrations::Trunk> TrunkRegistrations::findTrunk(LS_IIdentity* identity,
+                                                                         std::string const& path) {
   if (identity->getIdentityType() != LS_IdentityType::IDENTITY)
-    return;
+    return nullptr;
   RefPtr<LS_IRegistrationOutbound> face;
   LS_getFaceIf(identity, LS_IdentityFace::REGISTRATION_OUTBOUND, face);
   CHostPort registrar;
   CHostPort tlsRegistrar;
   if (!face || (face->getRegistrar(registrar, tlsRegistrar).isFailure() &&
                 face->getDynamicRegistrar(registrar).isFailure()))
-    return;
+    return nullptr;
   auto trunk = std::make_unique<Trunk>();
   trunk->owner = this;
   trunk->identity = identity;
@@ -102,19 +159,24 @@ void TrunkRegistrations::findTrunk(LS_IIdentity* identity, std::string const& pa
   if (secure)
     trunk->tlsHost = (trunk->route.empty() ? registrar : proxy).GetHost().c_str();
   tmr_init(&trunk->timer);
-  m_trunks.push_back(std::move(trunk));
+  return trunk;
 }
 
 void TrunkRegistrations::registerTrunk(Trunk& trunk) {
   char const* routes[] = {trunk.route.c_str()};
+  std::string tlsError;
   int const error =
-      sipreg_register(&trunk.registration, &m_stack, trunk.registrarUri.c_str(),
-                      trunk.addressOfRecord.c_str(), nullptr, trunk.addressOfRecord.c_str(), trunk.lifetime,
-                      trunk.user.c_str(), trunk.route.empty() ? nullptr : routes, trunk.route.empty() ? 0 : 1,
-                      0, onChallenge, &trunk, false, onResponse, &trunk, nullptr, nullptr);
+      !trunk.tlsHost.empty() && !m_tls.verify(m_stack, trunk.tlsHost, m_caFile, tlsError)
+          ? EPROTO
+          : sipreg_register(&trunk.registration, &m_stack, trunk.registrarUri.c_str(),
+                            trunk.addressOfRecord.c_str(), nullptr, trunk.addressOfRecord.c_str(),
+                            trunk.lifetime, trunk.user.c_str(), trunk.route.empty() ? nullptr : routes,
+                            trunk.route.empty() ? 0 : 1, 0, onChallenge, &trunk, false, onResponse, &trunk,
+                            nullptr, nullptr);
   if (error == 0)
     return;
-  report("trunk " + trunk.path + " cannot register at " + trunk.registrarUri + ": " + std::strerror(error));
+  report("trunk " + trunk.path + " cannot register at " + trunk.registrarUri + ": " +
+         (tlsError.empty() ? std::strerror(error) : tlsError));
   trunk.retryMs =
       uint64_t{m_clock.measure([&] { return trunk.face->getRetryTimeoutOnSystemError(); })} * 1000;
   tmr_start(&trunk.timer, trunk.retryMs, onRetry, &trunk);
@@ -191,12 +253,15 @@ void TrunkRegistrations::onRetry(void* argument) {
   trunk.owner->registerTrunk(trunk);
 }
 
+void TrunkRegistrations::unregisterTrunk(Trunk& trunk) {
+  tmr_cancel(&trunk.timer);
+  if (trunk.registered)
+    report("trunk " + trunk.path + " unregistering");
+  trunk.registered = false;
+  trunk.registration = static_cast<sipreg*>(mem_deref(trunk.registration));
+}
+
 void TrunkRegistrations::stop() {
-  for (std::unique_ptr<Trunk> const& trunk : m_trunks) {
-    tmr_cancel(&trunk->timer);
-    if (trunk->registered)
-      report("trunk " + trunk->path + " unregistering");
-    trunk->registered = false;
-    trunk->registration = static_cast<sipreg*>(mem_deref(trunk->registration));
-  }
+  for (std::unique_ptr<Trunk> const& trunk : m_trunks)
+    unregisterTrunk(*trunk);
 }

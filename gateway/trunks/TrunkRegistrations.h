@@ -20,6 +20,15 @@
 // registrar's address (where the 2xx came from) is recorded with
 // setRegistrarAddr. Progress goes to standard error, one line per event.
 //
+// After a change made while serving, the registrations follow the model:
+// a trunk that is new registers, one that is gone (or no longer has a
+// registrar) unregisters, one whose registrar, address of record, route or
+// lifetime changed unregisters and registers anew, and the rest are left
+// alone, registered as they are. follow() looks only at the identities the
+// change touched (see ModelChanges); followAll() at every identity, which
+// with 100,000 subscribers takes a quarter of a second, for the rare change
+// that adds or removes a whole location service.
+//
 // stop() unregisters: it drops every sipreg, which sends its REGISTER with
 // expiry 0 and lives on inside libre until answered; the caller then lets the
 // stack run for a bounded time. Owned by the front-end; everything runs on
@@ -50,7 +59,17 @@ class TrunkRegistrations {
   // system's; before start().
   void useCaFile(std::string const& file) { m_caFile = file; }
   void start();
+  void follow(std::vector<RefPtr<LS_IIdentity>> const& touched,
+              std::vector<LS_IIdentity const*> const& removed);
+  void followAll();
   void stop();
+
+  // Each trunk's "service/identity" path and whether it is registered now.
+  template <class Visit>
+  void forEach(Visit visit) const {
+    for (std::unique_ptr<Trunk> const& trunk : m_trunks)
+      visit(trunk->path, trunk->registered);
+  }
 
  private:
   struct Trunk {
@@ -75,8 +94,15 @@ class TrunkRegistrations {
     uint64_t retryMs = 0;
   };
 
-  void findTrunk(LS_IIdentity* identity, std::string const& path);
+  // Every trunk the model describes now, none registering yet.
+  std::vector<std::unique_ptr<Trunk>> findTrunks();
+  std::unique_ptr<Trunk> findTrunk(LS_IIdentity* identity, std::string const& path);
   void registerTrunk(Trunk& trunk);
+  void unregisterTrunk(Trunk& trunk);
+  // The identity's trunk becomes candidate (none when null): left alone
+  // when the same, else the old one retired and the new one registered.
+  void replace(LS_IIdentity const* identity, std::unique_ptr<Trunk> candidate);
+  static bool same(Trunk const& a, Trunk const& b);
   // One progress line on standard error, after the library's debug lines.
   void report(std::string const& line);
   static int onChallenge(char** user, char** password, char const* realm, void* trunk);
@@ -88,6 +114,10 @@ class TrunkRegistrations {
   ScriptSession& m_session;
   LibraryClock& m_clock;
   std::vector<std::unique_ptr<Trunk>> m_trunks;
+  // Trunks follow() unregistered: their sipreg lives on inside libre until
+  // the unregistration is answered, and may still ask its challenge
+  // handler for credentials with the trunk as argument.
+  std::vector<std::unique_ptr<Trunk>> m_retired;
   std::string m_caFile;
   TrunkTls m_tls;
 };

@@ -14,8 +14,14 @@
 //   which keeps its own context and asks phones for no certificate. It
 //   listens on the gateway's address at a free port; a phone that finds it
 //   is asked for a certificate and served whatever it sends.
-// - One context serves every trunk: with several TLS carriers each of
-//   their names is accepted for all of them (each chain still has to
+// - Made when the first TLS trunk registers, at start or when the control
+//   socket adds one later; the CA certificates are read then. When --tls
+//   made the phones' transport first, a TLS trunk the control socket adds
+//   later does not register (until a restart) rather than go out through a
+//   transport that verifies nothing.
+// - One context serves every trunk, so the name is checked in the verify
+//   callback against the hosts of all TLS trunks: with several carriers,
+//   each one's name is accepted for all of them (each chain still has to
 //   verify). libre offers no hook per connection.
 //
 // Owned by TrunkRegistrations; the stack keeps its own reference to the
@@ -27,6 +33,9 @@
 
 #include "sip/Libre.h"
 
+typedef struct x509_st X509;
+typedef struct x509_store_ctx_st X509_STORE_CTX;
+
 class TrunkTls {
  public:
   TrunkTls() = default;
@@ -34,14 +43,15 @@ class TrunkTls {
   TrunkTls(TrunkTls const&) = delete;
   TrunkTls& operator=(TrunkTls const&) = delete;
 
-  // Adds the transport on address's host; hosts: the names a carrier's
-  // certificate may carry. caFile empty: the system's store.
-  bool add(sip& stack,
-           sa const& address,
-           std::string const& caFile,
-           std::vector<std::string> const& hosts,
-           std::string& error);
+  // Makes sure the stack has the verifying transport (on the address of its
+  // UDP transport) and that a certificate for host is accepted; caFile
+  // empty: the system's store. False with the reason in error.
+  bool verify(sip& stack, std::string const& host, std::string const& caFile, std::string& error);
 
  private:
+  static int onVerify(int verified, X509_STORE_CTX* store);
+  bool names(X509* certificate) const;
+
   tls* m_tls = nullptr;
+  std::vector<std::string> m_hosts;
 };

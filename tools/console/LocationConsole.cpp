@@ -2,7 +2,9 @@
 // and answers the SIP stack's questions about it, without a gateway. It
 // plays the driver host (builds and registers both masters), the
 // configuration layer and the SIP stack, through the library's public
-// interfaces only.
+// interfaces only. With --connect it is instead a client of a running
+// gateway's control socket: the same scripts and prompt, run on the
+// gateway's model.
 
 #include <unistd.h>
 
@@ -14,6 +16,7 @@
 #include <vector>
 
 #include "CommandTable.h"
+#include "ControlConnection.h"
 #include "DefaultSession.h"
 #include "ModelSaver.h"
 #include "ScriptLanguage.h"
@@ -25,6 +28,7 @@ namespace {
 char const kUsage[] =
     "usage: location-console [--debug] [--keep-going] [--save file] [--print-default] [--help]\n"
     "                        [script ...]\n"
+    "       location-console --connect PATH [--keep-going] [script ...]\n"
     "\n"
     "Runs each script in turn against one model; \"-\" reads standard input\n"
     "(with a prompt when it is a terminal). Without a script it runs the\n"
@@ -38,9 +42,50 @@ char const kUsage[] =
     "                   stopped the run)\n"
     "  --print-default  print the default session's script and exit\n"
     "  --help           print this and the command reference, and exit\n"
+    "  --connect PATH   run the scripts (standard input without one) on the\n"
+    "                   gateway whose control socket is PATH; its own\n"
+    "                   commands (bindings, statistics) included\n"
     "\n"
-    "Exit status: 0, 1 when a line could not be applied, 2 for a usage error\n"
-    "or a script that cannot be read.\n";
+    "Exit status: 0, 1 when a line could not be applied, 2 for a usage error,\n"
+    "a script that cannot be read, or a gateway that cannot be reached.\n";
+
+// The scripts run on a gateway: the same runner, each line sent over the
+// socket. "-" and no script read standard input.
+int runConnected(std::string const& path, std::vector<std::string> scripts, bool keepGoing) {
+  ControlConnection connection;
+  std::string error;
+  if (!connection.connect(path, error)) {
+    std::cerr << "location-console: cannot connect to " << path << ": " << error << "\n";
+    return 2;
+  }
+  ScriptRunner runner([&connection](std::string const& text) { return connection.run(text); }, std::cout,
+                      std::cerr);
+  runner.keepGoing(keepGoing);
+  runner.beforePrompt([&connection] { connection.showEventsUntilInput(std::cout, "ls> "); });
+  if (scripts.empty())
+    scripts.push_back("-");
+  try {
+    for (std::string const& name : scripts) {
+      bool stopped = false;
+      if (name == "-") {
+        stopped = !runner.run(std::cin, "<stdin>", isatty(STDIN_FILENO) != 0);
+      } else {
+        std::ifstream file(name);
+        if (!file) {
+          std::cerr << "location-console: cannot read " << name << ": " << std::strerror(errno) << "\n";
+          return 2;
+        }
+        stopped = !runner.run(file, name, false);
+      }
+      if (stopped)
+        break;
+    }
+  } catch (std::runtime_error const& lost) {
+    std::cerr << "location-console: " << lost.what() << "\n";
+    return 2;
+  }
+  return runner.anyLineFailed() ? 1 : 0;
+}
 
 }  // namespace
 
@@ -48,6 +93,7 @@ int main(int argc, char** argv) {
   bool debug = false;
   bool keepGoing = false;
   std::string saveTo;
+  std::string connectTo;
   std::vector<std::string> scripts;
   CommandTable table;
   addScriptCommands(table);
@@ -63,6 +109,12 @@ int main(int argc, char** argv) {
         return 2;
       }
       saveTo = argv[++i];
+    } else if (argument == "--connect") {
+      if (i + 1 == argc) {
+        std::cerr << "location-console: --connect needs a socket path\n" << kUsage;
+        return 2;
+      }
+      connectTo = argv[++i];
     } else if (argument == "--print-default") {
       std::cout << defaultSession();
       return 0;
@@ -75,6 +127,18 @@ int main(int argc, char** argv) {
     } else {
       scripts.push_back(argument);
     }
+  }
+
+  if (!connectTo.empty()) {
+    // The gateway keeps its changes with its own save command or
+    // --autosave; its debug lines go to its own error stream.
+    if (!saveTo.empty() || debug) {
+      std::cerr
+          << "location-console: --save and --debug are not for --connect; use save and debug on the gateway\n"
+          << kUsage;
+      return 2;
+    }
+    return runConnected(connectTo, scripts, keepGoing);
   }
 
   ScriptSession session;

@@ -109,7 +109,7 @@ void ModelWatcher::observeIdentity(LS_IIdentity* identity, bool observe) {
 }
 
 void ModelWatcher::print(std::string const& line) {
-  m_session.output() << "event: " << line << "\n";
+  m_session.event("event: " + line + "\n");
 }
 
 void ModelWatcher::onLocationServiceAdded(ObserverEvent<LS_IMasterLocationService>& event) {

@@ -39,6 +39,21 @@ std::string ScriptSession::takeOutput() {
   return text;
 }
 
+void ScriptSession::watch(bool on) {
+  if (m_watchHost)
+    return m_watchHost->watch(on);
+  if (on)
+    m_watcher->start();
+  else
+    m_watcher->stop();
+}
+
+void ScriptSession::event(std::string const& line) {
+  if (m_watchHost)
+    return m_watchHost->event(line);
+  m_output << line;
+}
+
 void ScriptSession::showDebugLines(bool show) {
   if (!show) {
     DebugMonitor::disable(kLibraryMonitor);

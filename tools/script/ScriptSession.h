@@ -45,6 +45,20 @@ class ScriptSession {
     bool useDefault = true;
   };
 
+  // A host program that serves several clients at once (the gateway's
+  // control socket) decides itself which of them watch: the watch command
+  // and the watcher's event lines go to it instead of the session's own
+  // watcher and output. Borrowed; the host unsets itself before it dies.
+  class WatchHost {
+   public:
+    virtual void watch(bool on) = 0;
+    // One complete line, "event: ...\n".
+    virtual void event(std::string const& line) = 0;
+
+   protected:
+    ~WatchHost() = default;
+  };
+
   ScriptSession();
   ~ScriptSession();
   ScriptSession(ScriptSession const&) = delete;
@@ -58,6 +72,11 @@ class ScriptSession {
   LS_IMasterAuthenticationService* authenticationMaster() const { return m_authenticationMaster.get(); }
   StackSettings& stack() { return m_stack; }
   ModelWatcher& watcher() { return *m_watcher; }
+  void setWatchHost(WatchHost* host) { m_watchHost = host; }
+  // The watch command: the host's, else the session's own watcher.
+  void watch(bool on);
+  // An event line of the watcher: to the host, else into output().
+  void event(std::string const& line);
   // Shows the debug monitor's lines in the output, or stops showing them.
   void showDebugLines(bool show);
   // For a host program that serves rather than runs a script: writes the
@@ -111,4 +130,5 @@ class ScriptSession {
   RefPtr<LS_CMasterAuthenticationService> m_authenticationMaster;
   StackSettings m_stack;
   std::unique_ptr<ModelWatcher> m_watcher;
+  WatchHost* m_watchHost = nullptr;
 };

@@ -8,7 +8,6 @@
 #include "IInfo.h"
 #include "InfoContainer.h"
 #include "ModelSaver.h"
-#include "ModelWatcher.h"
 #include "ScriptSession.h"
 
 namespace {
@@ -98,10 +97,7 @@ void addSessionCommands(CommandTable& table) {
             });
   table.add("watch <on|off>", "print every event of the location model as it happens",
             [](Session& session, Args const& arguments) {
-              if (arguments.on("on|off"))
-                session.watcher().start();
-              else
-                session.watcher().stop();
+              session.watch(arguments.on("on|off"));
             });
   table.add("debug <on|off>", "show the library's debug lines (monitor 57)",
             [](Session& session, Args const& arguments) { session.showDebugLines(arguments.on("on|off")); });

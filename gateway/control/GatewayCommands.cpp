@@ -1,0 +1,56 @@
+#include "control/GatewayCommands.h"
+
+#include <algorithm>
+#include <tuple>
+#include <vector>
+
+#include "ScriptSession.h"
+
+namespace {
+
+// The bindings of the identity, the service or all, one line each, ordered
+// by identity and contact.
+void printBindings(ScriptSession& session, Registrar const& registrar, Arguments const& arguments) {
+  RefPtr<LS_IIdentity> identity;
+  std::string prefix;
+  if (arguments.has("identity"))
+    identity = session.identity(arguments);
+  else if (arguments.has("service"))
+    prefix = session.service(arguments)->getName().str() + "/";
+  struct Line {
+    std::string identity;
+    Registrar::BindingView binding;
+  };
+  std::vector<Line> lines;
+  for (Registrar::BindingView& binding : registrar.bindings(identity.get())) {
+    std::string path = ScriptSession::pathOf(binding.identity);
+    if (path.compare(0, prefix.size(), prefix) == 0)
+      lines.push_back(Line{std::move(path), std::move(binding)});
+  }
+  std::sort(lines.begin(), lines.end(), [](Line const& a, Line const& b) {
+    return std::tie(a.identity, a.binding.contact) < std::tie(b.identity, b.binding.contact);
+  });
+  if (lines.empty())
+    session.output() << "no bindings\n";
+  for (Line const& line : lines)
+    session.output() << line.identity << " <" << line.binding.contact << "> expires in "
+                     << (line.binding.remainingMs + 999) / 1000 << " s, Call-ID " << line.binding.callId
+                     << ", from " << line.binding.source << "\n";
+}
+
+}  // namespace
+
+void addGatewayCommands(CommandTable& table, SipFrontEnd const& frontEnd) {
+  table.add("statistics", "what the gateway answered, its bindings and trunks, the library's CPU share",
+            [&frontEnd](ScriptSession& session, Arguments const&) {
+              session.output() << frontEnd.statistics().text();
+            });
+  table.add("bindings [<service>]", "the contacts registered here, of one location service or all",
+            [&frontEnd](ScriptSession& session, Arguments const& arguments) {
+              printBindings(session, frontEnd.registrar(), arguments);
+            });
+  table.add("bindings <service> <identity>", "the contacts one identity registered here",
+            [&frontEnd](ScriptSession& session, Arguments const& arguments) {
+              printBindings(session, frontEnd.registrar(), arguments);
+            });
+}

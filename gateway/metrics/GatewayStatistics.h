@@ -1,0 +1,34 @@
+// GatewayStatistics: one reading of what the gateway counts since it started,
+// taken by the front-end on libre's thread, and its text as the statistics
+// question prints it. The Prometheus form of the same reading is
+// PrometheusExposition's.
+#pragma once
+
+#include <cstdint>
+#include <map>
+#include <string>
+#include <utility>
+#include <vector>
+
+struct GatewayStatistics {
+  struct Trunk {
+    std::string path;  // "service/identity"
+    bool registered;
+  };
+
+  // (method, response code) -> requests answered so.
+  std::map<std::pair<std::string, uint16_t>, uint64_t> answers;
+  // Digest responses with a wrong password, each answered 403.
+  uint64_t failedAuthentications = 0;
+  // Contacts this gateway holds registered now.
+  uint64_t bindings = 0;
+  // Bindings let go because a change removed their identity.
+  uint64_t bindingsDropped = 0;
+  // The library's process-wide count of registered contacts.
+  int64_t registeredContacts = 0;
+  std::vector<Trunk> trunks;
+  double cpuSeconds = 0;
+  double librarySeconds = 0;
+
+  std::string text() const;
+};
