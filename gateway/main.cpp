@@ -1,15 +1,17 @@
 // location-gateway: the location-service library answering real SIP traffic
 // on libre. It reads its configuration from scripts in the console's
 // language, then serves as registrar (digest-authenticated REGISTER) and
-// redirect server (302 to where a subscriber is registered) on one UDP (and
-// TCP) address, and registers its trunks with their registrars, until
-// SIGINT or SIGTERM. It uses the library's public interfaces only.
+// redirect server (302 to where a subscriber is registered) on UDP and TCP
+// at every address it is given, and registers its trunks with their
+// registrars, found through DNS, until SIGINT or SIGTERM. It uses the library's public interfaces only.
 //
 // libre is chosen as the stack: Debian packages it for every architecture
 // the gateway runs on, it is small, runs everything on one event loop (which
 // the library, not internally synchronised, needs), and brings server and
 // client transactions, registration client and digest helpers.
 
+#include <algorithm>
+#include <cerrno>
 #include <cstdlib>
 #include <cstring>
 #include <fstream>
@@ -36,15 +38,25 @@
 namespace {
 
 char const kUsage[] =
-    "usage: location-gateway [--listen ADDR:PORT] [--debug] [--statistics] [--control PATH]\n"
+    "usage: location-gateway [--listen ADDR:PORT]... [--dns-server ADDR:PORT]...\n"
+    "                        [--min-expires S] [--max-expires S] [--default-expires S]\n"
+    "                        [--nat-ping S] [--debug] [--statistics] [--control PATH]\n"
     "                        [--autosave FILE] [--metrics ADDR:PORT] [OPTION...] SCRIPT...\n"
     "\n"
     "Configures the library from the scripts (the console's language), then\n"
-    "answers SIP requests on ADDR:PORT (default 127.0.0.1:5060, UDP and TCP;\n"
-    "port 0 takes a free one) until SIGINT or SIGTERM. One line per request\n"
-    "answered on standard output: method, request URI, identity or the\n"
-    "library's error text, response code.\n"
+    "answers SIP requests over UDP and TCP on every ADDR:PORT given (default\n"
+    "127.0.0.1:5060; [IPv6]:PORT for IPv6; 0.0.0.0 or [::] for every address\n"
+    "of the machine; port 0 takes a free one) until SIGINT or SIGTERM. One\n"
+    "line per request answered on standard output: method, request URI,\n"
+    "identity or the library's error text, response code.\n"
     "\n"
+    "  --dns-server  a DNS server to resolve names with instead of the\n"
+    "                system's (/etc/resolv.conf)\n"
+    "  --min-expires, --max-expires, --default-expires\n"
+    "                the registration lifetimes in seconds for subscribers\n"
+    "                whose face gives no lifetime range (60, 3600, 3600)\n"
+    "  --nat-ping    OPTIONS every S seconds to phones registered from behind\n"
+    "                NAT over UDP; a phone missing three is unregistered\n"
     "  --debug       show the library's debug lines\n"
     "  --statistics  at exit, the requests answered and the CPU time spent\n"
     "                in the library's calls\n"
@@ -68,15 +80,26 @@ char const kUsage[] =
     "                   into FILE as save writes it (at most once a second)\n"
     "  --metrics ADDR:PORT  GET /metrics over HTTP, in Prometheus text format\n"
     "\n"
-    "Exit status: 0 after a signal, 1 when a script line fails or the\n"
-    "address cannot be bound, 2 for a usage error or an unreadable script.\n";
+    "Exit status: 0 after a signal, 1 when a script line fails or a\n"
+    "listener cannot be opened, 2 for a usage error or an unreadable script.\n";
+
+// A number of seconds, all digits, at least 1.
+bool seconds(char const* text, uint32_t& value) {
+  char* end = nullptr;
+  errno = 0;
+  unsigned long const parsed = std::strtoul(text, &end, 10);
+  if (*text < '0' || *text > '9' || *end != '\0' || errno != 0 || parsed == 0 || parsed > UINT32_MAX)
+    return false;
+  value = static_cast<uint32_t>(parsed);
+  return true;
+}
 
 void onSignal(int) {
   re_cancel();
 }
 
 struct Options {
-  std::string listen = "127.0.0.1:5060";
+  SipFrontEnd::Settings sip;
   bool debug = false;
   bool statistics = false;
   std::vector<DigestAlgorithm> digest{DigestAlgorithm::SHA256, DigestAlgorithm::MD5};
@@ -95,7 +118,18 @@ bool parse(int argc, char** argv, Options& options) {
   for (int i = 1; i < argc; ++i) {
     std::string const argument = argv[i];
     if (argument == "--listen" && i + 1 < argc)
-      options.listen = argv[++i];
+      options.sip.listen.push_back(argv[++i]);
+    else if (argument == "--dns-server" && i + 1 < argc)
+      options.sip.dnsServers.push_back(argv[++i]);
+    else if (argument == "--min-expires" && i + 1 < argc && seconds(argv[++i], options.sip.expiry.minimum))
+      continue;
+    else if (argument == "--max-expires" && i + 1 < argc && seconds(argv[++i], options.sip.expiry.maximum))
+      continue;
+    else if (argument == "--default-expires" && i + 1 < argc &&
+             seconds(argv[++i], options.sip.expiry.defaultLifetime))
+      continue;
+    else if (argument == "--nat-ping" && i + 1 < argc && seconds(argv[++i], options.sip.natPingSeconds))
+      continue;
     else if (argument == "--control" && i + 1 < argc)
       options.control = argv[++i];
     else if (argument == "--autosave" && i + 1 < argc)
@@ -132,6 +166,13 @@ bool parse(int argc, char** argv, Options& options) {
     else
       options.scripts.push_back(argument);
   }
+  // A default above the maximum is cut to it, as a requested expiry is.
+  ExpiryRange& expiry = options.sip.expiry;
+  expiry.defaultLifetime = std::min(expiry.defaultLifetime, expiry.maximum);
+  if (expiry.minimum > expiry.defaultLifetime)
+    return false;
+  if (options.sip.listen.empty())
+    options.sip.listen.push_back("127.0.0.1:5060");
   return !options.scripts.empty();
 }
 
@@ -208,9 +249,8 @@ int serve(ScriptSession& session, Options const& options) {
     frontEnd.redirector().sources().allow(network);
   if (options.sourceRate > 0)
     frontEnd.limitSourceRate(static_cast<uint32_t>(options.sourceRate));
-  std::string bound;
   std::string error;
-  if (!frontEnd.start(options.listen, bound, error)) {
+  if (!frontEnd.start(options.sip, error)) {
     std::cerr << "location-gateway: " << error << "\n";
     return 1;
   }
@@ -219,7 +259,9 @@ int serve(ScriptSession& session, Options const& options) {
     std::cerr << "location-gateway: " << error << "\n";
     return 1;
   }
-  std::cerr << "location-gateway: listening on udp:" << bound << std::endl;
+  if (frontEnd.dnsServers().empty())
+    std::cerr << "location-gateway: no DNS server configured: host names will not resolve\n";
+  std::cerr << "location-gateway: listening on " << frontEnd.listening() << std::endl;
   for (std::string const& transport : secure)
     std::cerr << "location-gateway: listening on " << transport << std::endl;
   {

@@ -1,10 +1,30 @@
 #include "redirect/Redirector.h"
 
+#include <algorithm>
 #include <vector>
 
 #include "CBlob.h"
 #include "LS_IRegistrationInbound.h"
 #include "sip/Exchange.h"
+
+namespace {
+
+struct Found {
+  CNameAddr contact;
+  bool registered;
+  unsigned int q;  // thousandths, for a registered contact
+};
+
+// A q value as RFC 3261 writes it: "1", "0.5", "0.125".
+std::string qText(unsigned int thousandths) {
+  if (thousandths >= 1000)
+    return "1";
+  std::string digits = std::to_string(1000 + thousandths).substr(1);
+  digits.erase(digits.find_last_not_of('0') + 1);
+  return "0." + (digits.empty() ? std::string("0") : digits);
+}
+
+}  // namespace
 
 void Redirector::handle(Exchange& exchange) {
   if (!m_sources.admits(exchange.request().src))
@@ -13,7 +33,7 @@ void Redirector::handle(Exchange& exchange) {
   RefPtr<LS_IIdentity> const identity = exchange.resolveOrAnswer(exchange.request().ruri, target);
   if (!identity)
     return;
-  std::vector<CNameAddr> found;
+  std::vector<Found> found;
   exchange.clock().measure([&] {
     RefPtr<LS_IRegistrationInbound> face;
     LS_getFaceIf(identity.get(), LS_IdentityFace::REGISTRATION_INBOUND, face);
@@ -25,15 +45,23 @@ void Redirector::handle(Exchange& exchange) {
       unsigned int priority = 0;
       unsigned int expires = 0;
       if (face->getContact(i, callId, contact, received, context, provider, priority, expires).isSuccess())
-        found.push_back(contact);
+        found.push_back(Found{contact, !callId.isEmpty(), priority});
     }
   });
+  // Static contacts carry no Call-ID and stay in front.
+  std::stable_sort(found.begin(), found.end(), [](Found const& a, Found const& b) {
+    if (a.registered != b.registered)
+      return !a.registered;
+    return a.registered && a.q > b.q;
+  });
   std::string contacts;
-  for (CNameAddr const& contact : found) {
+  for (Found const& each : found) {
     CBlob text;
-    contact.Serialize(text);
-    contacts +=
-        "Contact: " + std::string(reinterpret_cast<char const*>(text.GetData()), text.GetSize()) + "\r\n";
+    each.contact.Serialize(text);
+    contacts += "Contact: " + std::string(reinterpret_cast<char const*>(text.GetData()), text.GetSize());
+    if (each.registered)
+      contacts += ";q=" + qText(each.q);
+    contacts += "\r\n";
   }
   if (contacts.empty())
     return exchange.answer(480, "Temporarily Unavailable");

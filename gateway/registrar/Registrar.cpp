@@ -2,12 +2,17 @@
 
 #include <algorithm>
 #include <cctype>
+#include <iostream>
 #include <vector>
 
 #include "LS_ILocationService.h"
 #include "LS_IdentityResolution.h"
 #include "LS_IdentityType.h"
+#include "registrar/NatTraversal.h"
+#include "registrar/SipUriComparison.h"
+#include "sip/Capabilities.h"
 #include "sip/Exchange.h"
+#include "sip/HeaderValues.h"
 
 namespace {
 
@@ -16,31 +21,6 @@ constexpr size_t kMaximumCallId = 256;
 
 std::string text(pl const& value) {
   return std::string(value.p, value.l);
-}
-
-// A delta-seconds value; one beyond 32 bits saturates (RFC 3261 asks to
-// take such a value as the largest). False for anything but digits.
-bool parseSeconds(pl const& value, uint32_t& seconds) {
-  if (value.l == 0)
-    return false;
-  uint64_t total = 0;
-  for (size_t i = 0; i < value.l; ++i) {
-    char const c = value.p[i];
-    if (c < '0' || c > '9')
-      return false;
-    total = std::min<uint64_t>(total * 10 + static_cast<uint64_t>(c - '0'), UINT32_MAX);
-  }
-  seconds = static_cast<uint32_t>(total);
-  return true;
-}
-
-template <class Visit>
-void forEachHeader(sip_msg const& message, sip_hdrid id, Visit visit) {
-  for (le const* entry = list_head(&message.hdrl); entry; entry = entry->next) {
-    sip_hdr const* header = static_cast<sip_hdr const*>(entry->data);
-    if (header->id == id && !visit(*header))
-      return;
-  }
 }
 
 CHostPort sourceOf(sip_msg const& message) {
@@ -55,11 +35,18 @@ CHostPort sourceOf(sip_msg const& message) {
 
 Registrar::~Registrar() {
   for (auto& entry : m_bindings) {
-    size_t const before = entry.second.byContact.size();
+    size_t const before = entry.second.all.size();
     removeAll(entry.second);
     reportTransition(entry.second, before);
   }
   tmr_cancel(&m_sweep);
+}
+
+void Registrar::start(sip& stack, ExpiryRange const& expiry, uint32_t natPingSeconds) {
+  m_stack = &stack;
+  m_expiry = expiry;
+  if (natPingSeconds != 0)
+    m_pinger = std::make_unique<NatPinger>(stack, natPingSeconds, onPingsUnanswered, this);
 }
 
 void Registrar::handle(Exchange& exchange) {
@@ -110,7 +97,7 @@ void Registrar::forgetIfUnbound(LS_IIdentity* identity, bool created) {
   bool dynamic = created;
   auto const found = m_bindings.find(identity);
   if (found != m_bindings.end()) {
-    if (!found->second.byContact.empty())
+    if (!found->second.all.empty())
       return;
     dynamic = dynamic || found->second.dynamic;
     m_bindings.erase(found);
@@ -140,35 +127,32 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
   unsigned int maximum = 0;
   unsigned int defaultLifetime = 0;
   m_clock.measure([&] { face->getLifetimeRange(minimum, maximum, defaultLifetime); });
+  ExpiryRange const range = ExpiryRange::forFace(minimum, maximum, defaultLifetime, m_expiry);
 
   if (message.callid.l > kMaximumCallId)
     return exchange.answer(400, "Call-ID Too Long");
-  uint32_t headerExpires = defaultLifetime;
+  uint32_t headerExpires = 0;
   bool const hasExpires = pl_isset(&message.expires);
-  if (hasExpires && !parseSeconds(message.expires, headerExpires))
+  if (hasExpires && !ContactHeader::parseSeconds(message.expires, headerExpires))
     return exchange.answer(400, "Bad Expires");
 
   bool wildcard = false;
   bool malformed = false;
   std::vector<ContactRequest> requests;
-  forEachHeader(message, SIP_HDR_CONTACT, [&](sip_hdr const& header) {
+  forEachHeaderValue(message, SIP_HDR_CONTACT, [&](sip_hdr const& header) {
     pl value = header.val;
     if (pl_strcmp(&value, "*") == 0) {
       wildcard = true;
       return true;
     }
-    sip_addr address;
-    uint32_t expires = headerExpires;
-    pl parameter;
-    CNameAddr contact;
-    if (requests.size() == kMaximumContacts || sip_addr_decode(&address, &value) != 0 ||
-        !contact.Parse(address.auri.p, address.auri.l) ||
-        (msg_param_decode(&address.params, "expires", &parameter) == 0 &&
-         !parseSeconds(parameter, expires))) {
+    ContactRequest request;
+    if (requests.size() == kMaximumContacts || !ContactHeader::parse(value, request.header)) {
       malformed = true;
       return false;
     }
-    requests.push_back(ContactRequest{contact, text(address.auri), std::min<uint32_t>(expires, maximum)});
+    request.expires = request.header.hasExpires ? range.grant(true, request.header.expires)
+                                                : range.grant(hasExpires, headerExpires);
+    requests.push_back(std::move(request));
     return true;
   });
   if (malformed)
@@ -177,8 +161,9 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
   if (wildcard && (!requests.empty() || !hasExpires || headerExpires != 0))
     return exchange.answer(400, "Bad Wildcard Contact");
   for (ContactRequest const& request : requests)
-    if (request.expires != 0 && request.expires < minimum)
-      return exchange.answer(423, "Interval Too Brief", "Min-Expires: " + std::to_string(minimum) + "\r\n");
+    if (request.expires != 0 && request.expires < range.minimum)
+      return exchange.answer(423, "Interval Too Brief",
+                             "Min-Expires: " + std::to_string(range.minimum) + "\r\n");
   Bindings& bindings = m_bindings[identity.get()];
   bindings.identity = identity;
   bindings.dynamic = bindings.dynamic || created;
@@ -191,24 +176,25 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
     case Order::NEW:
       break;
   }
-  size_t const before = bindings.byContact.size();
-  size_t added = 0;
-  for (ContactRequest const& request : requests)
-    added += request.expires != 0 && bindings.byContact.count(request.key) == 0;
-  if (before + added > kMaximumBindings)
-    return exchange.answer(403, "Too Many Bindings");
-
+  size_t const before = bindings.all.size();
   if (wildcard)
     removeAll(bindings);
-  CHostPort const received = sourceOf(message);
   for (ContactRequest const& request : requests) {
-    if (request.expires != 0) {
-      add(bindings, request, message, received);
+    Binding* const binding = request.expires == 0 ? find(bindings, request.header) : nullptr;
+    if (binding)
+      remove(*binding);
+  }
+  CHostPort const received = sourceOf(message);
+  std::vector<Binding*> kept;
+  for (ContactRequest const& request : requests) {
+    if (request.expires == 0)
       continue;
-    }
-    auto const found = bindings.byContact.find(request.key);
-    if (found != bindings.byContact.end())
-      remove(*found->second);
+    Binding* binding = find(bindings, request.header);
+    if (!binding && bindings.all.size() >= kMaximumBindings)
+      giveWay(exchange, bindings, kept, request);
+    binding = add(bindings, request, message, received, binding);
+    if (binding)
+      kept.push_back(binding);
   }
   reportTransition(bindings, before);
   exchange.answer(200, "OK", bindingHeaders(bindings));
@@ -245,14 +231,14 @@ std::vector<Registrar::BindingView> Registrar::bindings(LS_IIdentity const* iden
   for (auto const& entry : m_bindings) {
     if (identity && entry.first != identity)
       continue;
-    for (auto const& held : entry.second.byContact) {
-      Binding const& binding = *held.second;
+    for (auto const& held : entry.second.all) {
+      Binding const& binding = *held;
       char source[80];
       re_snprintf(source, sizeof source, "%s:%J", sip_transp_name(binding.transport), &binding.source);
       std::string text = source;
       std::transform(text.begin(), text.end(), text.begin(),
                      [](char c) { return static_cast<char>(std::tolower(static_cast<unsigned char>(c))); });
-      views.push_back(BindingView{entry.first, held.first,
+      views.push_back(BindingView{entry.first, binding.uri,
                                   binding.expiresAtMs > now ? binding.expiresAtMs - now : 0, binding.callId,
                                   std::move(text)});
     }
@@ -261,14 +247,14 @@ std::vector<Registrar::BindingView> Registrar::bindings(LS_IIdentity const* iden
 }
 
 void Registrar::drop(std::map<LS_IIdentity*, Bindings>::iterator entry) {
-  size_t const before = entry->second.byContact.size();
+  size_t const before = entry->second.all.size();
   m_bindingsDropped += before;
   removeAll(entry->second);
   reportTransition(entry->second, before);
   m_bindings.erase(entry);
 }
 
-Registrar::Order Registrar::order(Bindings const& bindings,
+Registrar::Order Registrar::order(Bindings& bindings,
                                   std::vector<ContactRequest> const& requests,
                                   bool wildcard,
                                   pl const& callId,
@@ -283,64 +269,142 @@ Registrar::Order Registrar::order(Bindings const& bindings,
       verdict = Order::RETRANSMITTED;
   };
   if (wildcard) {
-    for (auto const& entry : bindings.byContact)
-      judge(*entry.second);
+    for (auto const& binding : bindings.all)
+      judge(*binding);
   }
-  for (ContactRequest const& request : requests) {
-    auto const found = bindings.byContact.find(request.key);
-    if (found != bindings.byContact.end())
-      judge(*found->second);
-  }
+  for (ContactRequest const& request : requests)
+    if (Binding const* const binding = find(bindings, request.header))
+      judge(*binding);
   return verdict;
 }
 
-void Registrar::add(Bindings& bindings,
-                    ContactRequest const& request,
-                    sip_msg const& message,
-                    CHostPort const& received) {
+Registrar::Binding* Registrar::find(Bindings& bindings, ContactHeader const& contact) {
+  if (!contact.instance.empty())
+    for (auto const& binding : bindings.all)
+      if (binding->instance == contact.instance && binding->regId == contact.regId)
+        return binding.get();
+  // A refresh names its binding as it was written, and then the text
+  // decides without parsing both URIs again.
+  for (auto const& binding : bindings.all)
+    if (binding->uri == contact.uri)
+      return binding.get();
+  pl uri;
+  pl_set_str(&uri, contact.uri.c_str());
+  for (auto const& binding : bindings.all) {
+    pl other;
+    pl_set_str(&other, binding->uri.c_str());
+    if (SipUriComparison::equal(uri, other))
+      return binding.get();
+  }
+  return nullptr;
+}
+
+Registrar::Binding* Registrar::add(Bindings& bindings,
+                                   ContactRequest const& request,
+                                   sip_msg const& message,
+                                   CHostPort const& received,
+                                   Binding* binding) {
+  ContactHeader const& header = request.header;
   std::string const callId = text(message.callid);
+  std::string natedTarget;
+  pl uri;
+  pl_set_str(&uri, header.uri.c_str());
+  bool const nated = NatTraversal::natedTarget(uri, message.src, natedTarget);
+  CNameAddr target = header.contact;
+  if (nated && !target.Parse(natedTarget.data(), natedTarget.size()))
+    target = header.contact;
+  // The face knows a contact by its text: one filed under another target
+  // (a new NAT mapping, or an instance's new URI) goes first.
+  if (binding && binding->contact != target)
+    m_clock.measure([&] { bindings.face->removeContact(binding->contact, binding->callId.c_str()); });
   XCode const added = m_clock.measure([&] {
-    return bindings.face->addContact(callId.c_str(), request.contact, received, "", "", 0, request.expires);
+    return bindings.face->addContact(callId.c_str(), target, received, "", "", header.q, request.expires);
   });
   // A contact configured statically on the face stands as registered already.
-  if (added.isFailure())
-    return;
-  std::unique_ptr<Binding>& slot = bindings.byContact[request.key];
-  if (!slot) {
-    slot = std::make_unique<Binding>();
-    slot->owner = &bindings;
-    slot->contact = request.contact;
-  } else {
-    unschedule(*slot);
+  if (added.isFailure()) {
+    if (binding)
+      forget(*binding);
+    return nullptr;
   }
-  slot->callId = callId;
-  slot->cseq = message.cseq.num;
-  slot->source = message.src;
-  slot->transport = message.tp;
-  slot->expiresAtMs = tmr_jiffies() + uint64_t{request.expires} * 1000;
-  schedule(*slot);
+  if (!binding) {
+    bindings.all.push_back(std::make_unique<Binding>());
+    binding = bindings.all.back().get();
+    binding->registrar = this;
+    binding->owner = &bindings;
+  } else {
+    unschedule(*binding);
+  }
+  binding->contact = target;
+  binding->uri = header.uri;
+  binding->parameters = header.parameters;
+  binding->instance = header.instance;
+  binding->regId = header.regId;
+  binding->callId = callId;
+  binding->cseq = message.cseq.num;
+  binding->source = message.src;
+  binding->transport = message.tp;
+  binding->expiresAtMs = tmr_jiffies() + uint64_t{request.expires} * 1000;
+  schedule(*binding);
+  binding->connection = static_cast<sip_keepalive*>(mem_deref(binding->connection));
+  if (nated && message.tp != SIP_TRANSP_UDP && m_stack)
+    sip_keepalive_start(&binding->connection, m_stack, &message, kConnectionWatchSeconds, onConnectionClosed,
+                        binding);
+  if (m_pinger) {
+    if (nated && message.tp == SIP_TRANSP_UDP)
+      m_pinger->watch(binding, natedTarget, message.src, message.sock);
+    else
+      m_pinger->forget(binding);
+  }
+  return binding;
+}
+
+void Registrar::giveWay(Exchange& exchange,
+                        Bindings& bindings,
+                        std::vector<Binding*> const& kept,
+                        ContactRequest const& newcomer) {
+  Binding* stalest = nullptr;
+  for (auto const& binding : bindings.all) {
+    if (std::find(kept.begin(), kept.end(), binding.get()) != kept.end())
+      continue;
+    if (!stalest || binding->expiresAtMs < stalest->expiresAtMs)
+      stalest = binding.get();
+  }
+  if (!stalest)
+    return;
+  exchange.session().flushDebugLines();
+  std::cerr << "location-gateway: " << ScriptSession::pathOf(bindings.identity.get()) << ": <" << stalest->uri
+            << "> gives way to <" << newcomer.header.uri << ">, " << kMaximumBindings << " bindings at most"
+            << std::endl;
+  remove(*stalest);
+}
+
+void Registrar::forget(Binding& binding) {
+  unschedule(binding);
+  if (m_pinger)
+    m_pinger->forget(&binding);
+  std::vector<std::unique_ptr<Binding>>& all = binding.owner->all;
+  all.erase(std::find_if(all.begin(), all.end(),
+                         [&](std::unique_ptr<Binding> const& each) { return each.get() == &binding; }));
 }
 
 void Registrar::remove(Binding& binding) {
-  unschedule(binding);
   Bindings& bindings = *binding.owner;
   m_clock.measure([&] { bindings.face->removeContact(binding.contact, binding.callId.c_str()); });
-  for (auto entry = bindings.byContact.begin(); entry != bindings.byContact.end(); ++entry)
-    if (entry->second.get() == &binding) {
-      bindings.byContact.erase(entry);
-      return;
-    }
+  forget(binding);
 }
 
 void Registrar::removeAll(Bindings& bindings) {
-  for (auto& entry : bindings.byContact)
-    unschedule(*entry.second);
-  bindings.byContact.clear();
+  for (auto const& binding : bindings.all) {
+    unschedule(*binding);
+    if (m_pinger)
+      m_pinger->forget(binding.get());
+  }
+  bindings.all.clear();
   m_clock.measure([&] { bindings.face->removeContacts(); });
 }
 
 void Registrar::reportTransition(Bindings& bindings, size_t before) {
-  size_t const after = bindings.byContact.size();
+  size_t const after = bindings.all.size();
   if (before == 0 && after != 0)
     m_clock.measure([&] { bindings.identity->isInboundRegistered(); });
   else if (before != 0 && after == 0)
@@ -350,12 +414,14 @@ void Registrar::reportTransition(Bindings& bindings, size_t before) {
 std::string Registrar::bindingHeaders(Bindings const& bindings) {
   uint64_t const now = tmr_jiffies();
   std::string headers;
-  for (auto const& entry : bindings.byContact) {
-    uint64_t const remainingMs = entry.second->expiresAtMs > now ? entry.second->expiresAtMs - now : 0;
-    headers +=
-        "Contact: <" + entry.first + ">;expires=" + std::to_string((remainingMs + 999) / 1000) + "\r\n";
+  for (auto const& binding : bindings.all) {
+    uint64_t const remainingMs = binding->expiresAtMs > now ? binding->expiresAtMs - now : 0;
+    headers += "Contact: <" + binding->uri + ">" + binding->parameters +
+               ";expires=" + std::to_string((remainingMs + 999) / 1000) + "\r\n";
   }
-  return headers;
+  char date[64];
+  re_snprintf(date, sizeof date, "Date: %H\r\n", fmt_gmtime, nullptr);
+  return headers + date + Capabilities::kAllow + Capabilities::kSupported;
 }
 
 void Registrar::schedule(Binding& binding) {
@@ -381,13 +447,30 @@ void Registrar::rearm() {
 void Registrar::onSweep(void* argument) {
   Registrar& registrar = *static_cast<Registrar*>(argument);
   uint64_t const now = tmr_jiffies();
-  while (!registrar.m_expiries.empty() && registrar.m_expiries.begin()->first <= now) {
-    Binding& binding = *registrar.m_expiries.begin()->second;
-    Bindings& bindings = *binding.owner;
-    LS_IIdentity* const identity = bindings.identity.get();
-    registrar.remove(binding);
-    registrar.reportTransition(bindings, 1);
-    registrar.forgetIfUnbound(identity, false);
-  }
+  while (!registrar.m_expiries.empty() && registrar.m_expiries.begin()->first <= now)
+    registrar.lose(*registrar.m_expiries.begin()->second, nullptr);
   registrar.rearm();
+}
+
+void Registrar::lose(Binding& binding, char const* reason) {
+  Bindings& bindings = *binding.owner;
+  LS_IIdentity* const identity = bindings.identity.get();
+  if (reason)
+    std::cerr << "location-gateway: " << ScriptSession::pathOf(identity) << ": <" << binding.uri
+              << "> dropped, " << reason << std::endl;
+  remove(binding);
+  reportTransition(bindings, 1);
+  forgetIfUnbound(identity, false);
+}
+
+void Registrar::onConnectionClosed(int, void* argument) {
+  Binding& binding = *static_cast<Binding*>(argument);
+  // libre has freed its keep-alive and cleared binding.connection.
+  binding.registrar->lose(binding, "its connection closed");
+}
+
+void Registrar::onPingsUnanswered(void const* binding, void* argument) {
+  Registrar& registrar = *static_cast<Registrar*>(argument);
+  std::string const reason = std::to_string(NatPinger::kMisses) + " NAT pings unanswered";
+  registrar.lose(*const_cast<Binding*>(static_cast<Binding const*>(binding)), reason.c_str());
 }

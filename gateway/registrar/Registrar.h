@@ -6,16 +6,42 @@
 //
 // Decisions, with their reasons:
 // - Expiry: the contact's "expires" parameter, else the Expires header,
-//   else the face's default lifetime; above the face's maximum it is cut to
+//   else the default lifetime of the face's range, or of the gateway's own
+//   when the face has none (ExpiryRange); above the maximum it is cut to
 //   the maximum; a non-zero value below the minimum gets 423 with
-//   Min-Expires, and then no contact of the request is applied.
-// - The 200 lists the identity's own bindings in effect (the ones this
-//   gateway holds for it), each with its remaining seconds.
+//   Min-Expires (RFC 3261 section 10.3, step 7), and then no contact of the
+//   request is applied.
+// - The binding a Contact names: with +sip.instance, the binding of that
+//   instance (and reg-id, when given), whatever its URI or Call-ID, so that
+//   a phone rebooted onto another port or address replaces its binding
+//   instead of leaving a dead one in front of callers (RFC 5626 section 6,
+//   RFC 5627); otherwise the binding whose URI is equal by RFC 3261 section
+//   19.1.4 (SipUriComparison).
+// - A binding keeps its Contact's parameters but expires (ContactHeader):
+//   the 200 lists the identity's own bindings in effect (the ones this
+//   gateway holds for it), each as registered with its parameters and its
+//   remaining seconds, with a Date (section 10.3, step 8). Its q goes to
+//   the face as the contact's priority, in thousandths, for the Redirector.
+// - NAT (NatTraversal): a Contact no caller can reach, registered from
+//   elsewhere, is filed on the face with the source's address and port,
+//   and the 302 names that. Over UDP, --nat-ping keeps the mapping open
+//   (NatPinger) and drops a binding whose phone stops answering. Over TCP
+//   and TLS such a binding lives as long as the connection it came on, the
+//   one way in to the phone: libre tells a connection's keep-alives when it
+//   closes, so one is attached with an interval of kConnectionWatchSeconds
+//   (46 days), which no phone is pinged at, since most do not answer CRLF
+//   pings (only RFC 5626 asks them to). libre closes a connection idle for
+//   15 minutes, and the binding goes with it.
 // - The identity is told it is registered when its first binding comes and
 //   unregistered when its last one goes (removed, expired or shut down).
 // - At most kMaximumContacts per request (400 beyond) and kMaximumBindings
-//   per identity (403 beyond), so that no phone can grow the gateway's
-//   memory at will.
+//   per identity, so that no phone can grow the gateway's memory at will.
+//   The request's removals are applied first and its refreshes and
+//   replacements take no room; a new binding beyond the limit takes the
+//   place of the identity's binding that would expire first among those
+//   the request does not touch, and the replacement is logged, as
+//   Asterisk's remove_existing does: phones take a 403 as final and would
+//   stop registering, whereas the binding given up is the stalest.
 // - A user that only the "DEFAULT" group answers registers as a dynamic
 //   identity of the user's name, which its location service bases on the
 //   group: a contact on the group's own face would be inherited by every
@@ -48,6 +74,9 @@
 #include "RefPtr.h"
 #include "metrics/LibraryClock.h"
 #include "registrar/Authenticator.h"
+#include "registrar/ContactHeader.h"
+#include "registrar/ExpiryRange.h"
+#include "registrar/NatPinger.h"
 #include "sip/Libre.h"
 
 class Exchange;
@@ -57,11 +86,17 @@ class Registrar {
   static constexpr size_t kMaximumBindings = 32;
   static constexpr size_t kMaximumContacts = 16;
 
+  static constexpr uint32_t kConnectionWatchSeconds = 4000000;
+
   explicit Registrar(LibraryClock& clock) : m_clock(clock), m_authenticator(clock) { tmr_init(&m_sweep); }
   ~Registrar();
   Registrar(Registrar const&) = delete;
   Registrar& operator=(Registrar const&) = delete;
 
+  // Before the first request: the stack that connections and NAT pings
+  // belong to, the range for faces that give none, and the NAT ping
+  // interval (0 for none).
+  void start(sip& stack, ExpiryRange const& expiry, uint32_t natPingSeconds);
   void handle(Exchange& exchange);
   Authenticator& authenticator() { return m_authenticator; }
 
@@ -96,26 +131,37 @@ class Registrar {
   using Expiries = std::multimap<uint64_t, Binding*>;
   // What a binding holds: what the registration said and where it came from.
   struct Binding {
+    Binding() = default;
+    ~Binding() { mem_deref(connection); }
+    Binding(Binding const&) = delete;
+    Binding& operator=(Binding const&) = delete;
+
+    Registrar* registrar;
     Bindings* owner;
-    CNameAddr contact;
+    CNameAddr contact;  // as filed on the face: where calls go
+    std::string uri;    // the Contact's URI as registered
+    std::string parameters;
+    std::string instance;
+    std::string regId;
     std::string callId;
     uint32_t cseq;
     uint64_t expiresAtMs;       // on the stack's clock, tmr_jiffies()
     sa source;                  // where the REGISTER came from
     sip_transp transport;       // and over what
     Expiries::iterator expiry;  // its entry in m_expiries
+    // Over TCP or TLS, for a NATed contact: the watch on its connection.
+    sip_keepalive* connection = nullptr;
   };
-  // One identity's bindings, by contact text.
+  // One identity's bindings, oldest first.
   struct Bindings {
     RefPtr<LS_IIdentity> identity;
     bool dynamic = false;  // created by this registrar for a "DEFAULT" user
     RefPtr<LS_IRegistrationInbound> face;
-    std::map<std::string, std::unique_ptr<Binding>> byContact;
+    std::vector<std::unique_ptr<Binding>> all;
   };
   // One Contact of a REGISTER, checked and with its expiry worked out.
   struct ContactRequest {
-    CNameAddr contact;
-    std::string key;
+    ContactHeader header;
     uint32_t expires;
   };
 
@@ -131,15 +177,28 @@ class Registrar {
   // What the request's CSeq makes of it against the bindings it names (all
   // of them for a wildcard) that carry its Call-ID.
   enum class Order { NEW, RETRANSMITTED, OUT_OF_ORDER };
-  static Order order(Bindings const& bindings,
+  static Order order(Bindings& bindings,
                      std::vector<ContactRequest> const& requests,
                      bool wildcard,
                      pl const& callId,
                      uint32_t cseq);
-  void add(Bindings& bindings,
-           ContactRequest const& request,
-           sip_msg const& message,
-           CHostPort const& received);
+  // The binding a contact names, or null.
+  static Binding* find(Bindings& bindings, ContactHeader const& contact);
+  // Files the contact on the face as binding (null for a new one); the
+  // binding, or null when the face refused it.
+  Binding* add(Bindings& bindings,
+               ContactRequest const& request,
+               sip_msg const& message,
+               CHostPort const& received,
+               Binding* binding);
+  // Makes room for one more binding: removes the one that expires first
+  // among those not in kept, and logs it.
+  void giveWay(Exchange& exchange,
+               Bindings& bindings,
+               std::vector<Binding*> const& kept,
+               ContactRequest const& newcomer);
+  // Drops the binding from the table only, when its face no longer has it.
+  void forget(Binding& binding);
   // Leaves telling the identity to the caller.
   void removeAll(Bindings& bindings);
   // Removes one binding from its face and the table; tells the identity when
@@ -147,6 +206,7 @@ class Registrar {
   void remove(Binding& binding);
   // Tells the identity when its first binding came or its last went.
   void reportTransition(Bindings& bindings, size_t before);
+  // The 200's own header lines: the bindings, the date, what is supported.
   static std::string bindingHeaders(Bindings const& bindings);
   // (Re)files the binding under its time; sets the stack timer when it is
   // now the earliest.
@@ -158,8 +218,17 @@ class Registrar {
   void drop(std::map<LS_IIdentity*, Bindings>::iterator entry);
   // Removes every binding whose time has run out.
   static void onSweep(void* registrar);
+  // Removes a binding outside a request: expired (reason null), or its way
+  // in gone, its connection closed or its NAT pings unanswered (logged with
+  // reason).
+  void lose(Binding& binding, char const* reason);
+  static void onConnectionClosed(int error, void* binding);
+  static void onPingsUnanswered(void const* binding, void* registrar);
 
   LibraryClock& m_clock;
+  sip* m_stack = nullptr;
+  ExpiryRange m_expiry;
+  std::unique_ptr<NatPinger> m_pinger;
   Authenticator m_authenticator;
   std::map<LS_IIdentity*, Bindings> m_bindings;
   Expiries m_expiries;

@@ -33,6 +33,10 @@ class Exchange {
   RefPtr<LS_IIdentity> resolveOrAnswer(pl const& uri, CNameAddr& nameAddr, bool answerNotFound = true);
   bool answered() const { return m_answered; }
 
+  // What the log line says about the lookup, for a part that looked
+  // without resolveOrAnswer: "service/identity" or the error text in quotes.
+  void setResult(std::string result) { m_result = std::move(result); }
+
   // Sends the final answer without a server transaction, as a stateless
   // registrar and redirect server may: the stack keeps nothing once it has
   // left, and a retransmitted request is simply answered again. A server

@@ -4,11 +4,10 @@
 #include <cstring>
 
 #include "SipStatistics.h"
+#include "sip/Capabilities.h"
 #include "sip/Exchange.h"
 
 namespace {
-
-char const kAllow[] = "Allow: REGISTER, INVITE, ACK, CANCEL, MESSAGE, SUBSCRIBE, OPTIONS\r\n";
 
 // Hash table sizes of the stack: client transactions, server transactions,
 // TCP connections. Every request is answered statelessly (see
@@ -42,32 +41,31 @@ SipFrontEnd::~SipFrontEnd() {
   mem_deref(m_stack);
 }
 
-bool SipFrontEnd::start(std::string const& listen, std::string& bound, std::string& error) {
-  sa address;
-  if (sa_decode(&address, listen.c_str(), listen.size()) != 0) {
-    error = "cannot read the listen address " + listen + " (ADDR:PORT)";
+bool SipFrontEnd::start(Settings const& settings, std::string& error) {
+  if (!m_dns.open(settings.dnsServers, error))
     return false;
-  }
-  int result = sip_alloc(&m_stack, nullptr, kClientTransactions, kServerTransactions, kConnections,
-                         "location-gateway", onClosed, this);
-  if (result == 0)
-    result = sip_transp_add(m_stack, SIP_TRANSP_UDP, &address);
-  if (result == 0)
-    result = sip_transp_laddr(m_stack, &address, SIP_TRANSP_UDP, nullptr);
-  if (result == 0)
-    result = sip_listen(&m_listener, m_stack, true, onRequest, this);
+  int const result = sip_alloc(&m_stack, m_dns.client(), kClientTransactions, kServerTransactions,
+                               kConnections, "location-gateway", onClosed, this);
   if (result != 0) {
-    error = "cannot listen on " + listen + ": " + std::strerror(result);
+    error = std::string("the SIP stack cannot start: ") + std::strerror(result);
     return false;
   }
-  // TCP is a convenience: a port taken for TCP leaves the gateway on UDP.
-  sip_transp_add(m_stack, SIP_TRANSP_TCP, &address);
-  char text[64];
-  re_snprintf(text, sizeof text, "%J", &address);
-  bound = text;
-  CHostPort own;
-  own.Parse(bound.data(), bound.size());
-  m_session.stack().localHostPorts.add(own);
+  if (!m_listeners.open(*m_stack, settings.listen, error))
+    return false;
+  m_registrar.start(*m_stack, settings.expiry, settings.natPingSeconds);
+  if (sip_listen(&m_listener, m_stack, true, onRequest, this) != 0) {
+    error = "the SIP stack cannot take requests";
+    return false;
+  }
+  for (Listeners::Listener const& listener : m_listeners.listeners()) {
+    if (listener.transport != SIP_TRANSP_UDP)
+      continue;
+    char text[64];
+    re_snprintf(text, sizeof text, "%J", &listener.address);
+    CHostPort own;
+    if (own.Parse(text, std::char_traits<char>::length(text)))
+      m_session.stack().localHostPorts.add(own);
+  }
   m_trunks = std::make_unique<TrunkRegistrations>(*m_stack, m_session, m_clock);
   m_trunks->useCaFile(m_caFile);
   m_trunks->start();
@@ -130,13 +128,10 @@ bool SipFrontEnd::onRequest(sip_msg const* request, void* argument) {
     exchange.answer(416, "Unsupported URI Scheme");
     return true;
   }
+  if (frontEnd.m_admission.answered(exchange))
+    return true;
   if (pl_strcmp(&message.met, "REGISTER") == 0) {
     frontEnd.m_registrar.handle(exchange);
-    return true;
-  }
-  bool const toUser = message.uri.user.l != 0;
-  if (pl_strcmp(&message.met, "OPTIONS") == 0 && !toUser) {
-    exchange.answer(200, "OK", kAllow);
     return true;
   }
   if (pl_strcmp(&message.met, "CANCEL") == 0) {
@@ -148,7 +143,7 @@ bool SipFrontEnd::onRequest(sip_msg const* request, void* argument) {
     frontEnd.m_redirector.handle(exchange);
     return true;
   }
-  exchange.answer(405, "Method Not Allowed", kAllow);
+  exchange.answer(405, "Method Not Allowed", Capabilities::kAllow);
   return true;
 }
 

@@ -1,12 +1,13 @@
 // SipFrontEnd: the SIP side of the gateway on libre: the stack with its
 // transports, the listener that hands each request to the part that answers
-// its method (Registrar for REGISTER, Redirector for requests to a user, 200
-// for OPTIONS to the gateway itself, 405 with Allow for the rest), and the
-// trunk registrations. Malformed messages never reach it: libre drops what it
+// it (Admission first, for what the gateway answers itself; then Registrar
+// for REGISTER, Redirector for requests to a user, 405 with Allow for the
+// rest), and the trunk registrations. Malformed messages never reach it: libre drops what it
 // cannot parse, and every length read here is bounded by the parts.
 //
-// Built after the scripts have run; the listen address joins the stack
-// settings' local host-ports. Owned by main; shutDown() unregisters the
+// Built after the scripts have run; every address listened on joins the
+// stack settings' local host-ports, and the stack resolves names through
+// its DnsClient. Owned by main; shutDown() unregisters the
 // trunks and closes the stack within a bounded time, after which the object
 // may die.
 #pragma once
@@ -20,8 +21,12 @@
 #include "metrics/GatewayStatistics.h"
 #include "metrics/LibraryClock.h"
 #include "redirect/Redirector.h"
+#include "registrar/ExpiryRange.h"
 #include "registrar/Registrar.h"
+#include "sip/Admission.h"
+#include "sip/DnsClient.h"
 #include "sip/Libre.h"
+#include "sip/Listeners.h"
 #include "sip/RequestLog.h"
 #include "sip/SecureTransports.h"
 #include "sip/SourceRateLimit.h"
@@ -30,15 +35,29 @@
 class SipFrontEnd {
  public:
   SipFrontEnd(ScriptSession& session, LibraryClock& clock)
-      : m_session(session), m_clock(clock), m_registrar(clock) {}
+      : m_session(session), m_clock(clock), m_registrar(clock), m_admission(m_listeners) {}
   ~SipFrontEnd();
   SipFrontEnd(SipFrontEnd const&) = delete;
   SipFrontEnd& operator=(SipFrontEnd const&) = delete;
 
-  // Binds UDP (and TCP on the same port when it can) at listen, "ADDR:PORT";
-  // port 0 takes a free one. The bound address, "ADDR:PORT", or an error
-  // text in error.
-  bool start(std::string const& listen, std::string& bound, std::string& error);
+  struct Settings {
+    // "ADDR:PORT" each, UDP and TCP on each (see Listeners).
+    std::vector<std::string> listen;
+    // "ADDR:PORT" each; empty for the system's (see DnsClient).
+    std::vector<std::string> dnsServers;
+    // The registrar's lifetimes for faces that give none.
+    ExpiryRange expiry;
+    // OPTIONS to NATed UDP bindings every so many seconds (NatPinger); 0
+    // for none.
+    uint32_t natPingSeconds = 0;
+  };
+
+  // False with an error text when a DNS server, a listen address or the
+  // stack is refused.
+  bool start(Settings const& settings, std::string& error);
+  // What start() opened: "udp:ADDR:PORT tcp:ADDR:PORT ...".
+  std::string listening() const { return m_listeners.describe(); }
+  std::vector<std::string> const& dnsServers() const { return m_dns.servers(); }
   // After start(): TLS, WebSocket and secure WebSocket as options ask, each
   // bound one as "tls:ADDR:PORT" (and so on) in bound, else an error text.
   bool startSecure(SecureTransportOptions const& options,
@@ -81,6 +100,9 @@ class SipFrontEnd {
   RequestLog m_log;
   Registrar m_registrar;
   Redirector m_redirector;
+  DnsClient m_dns;
+  Listeners m_listeners;
+  Admission m_admission;
   SecureTransports m_secure;
   sip* m_stack = nullptr;
   sip_lsnr* m_listener = nullptr;

@@ -11,6 +11,18 @@
 
 namespace {
 
+// Why a request of the trunk found no registrar: libre reports a name
+// without any address as "destination address required".
+std::string failureCause(int error, std::string const& host) {
+  sa numeric;
+  bool const named = !host.empty() && host[0] != '[' && sa_set_str(&numeric, host.c_str(), 0) != 0;
+  if (named && error == EDESTADDRREQ)
+    return host + " does not resolve";
+  if (named)
+    return "resolving " + host + ": " + std::strerror(error);
+  return std::strerror(error);
+}
+
 std::string hostPortText(CHostPort const& hostPort) {
   std::string text = hostPort.GetHost().c_str();
   if (hostPort.GetPort() != 0)
@@ -23,6 +35,13 @@ std::string hostPortText(CHostPort const& hostPort) {
 void TrunkRegistrations::report(std::string const& line) {
   m_session.flushDebugLines();
   std::cerr << "location-gateway: " << line << std::endl;
+}
+
+void TrunkRegistrations::reportFailure(Trunk& trunk, std::string const& failure, unsigned int seconds) {
+  if (failure == trunk.lastFailure)
+    return;
+  trunk.lastFailure = failure;
+  report(failure + ", retrying in " + std::to_string(seconds) + " s");
 }
 
 TrunkRegistrations::~TrunkRegistrations() {
@@ -143,6 +162,7 @@ std::unique_ptr<TrunkRegistrations::Trunk> TrunkRegistrations::findTrunk(LS_IIde
   char const* const scheme = secure ? "sips:" : "sip:";
   std::string const transport = secure ? ";transport=tls" : "";
   trunk->registrarUri = "sip:" + hostPortText(registrar) + transport;
+  trunk->nextHop = registrar.GetHost().c_str();
   trunk->addressOfRecord = scheme + trunk->user + "@" + registrar.GetHost().c_str();
   trunk->lifetime = face->getLifetime();
   RefPtr<LS_IOutbound> outbound;
@@ -155,10 +175,12 @@ std::unique_ptr<TrunkRegistrations::Trunk> TrunkRegistrations::findTrunk(LS_IIde
     if (secure && !tlsProxy.GetHost().isEmpty())
       proxy = tlsProxy;
     trunk->route = "sip:" + hostPortText(proxy) + transport;
+    trunk->nextHop = proxy.GetHost().c_str();
   }
   if (secure)
-    trunk->tlsHost = (trunk->route.empty() ? registrar : proxy).GetHost().c_str();
+    trunk->tlsHost = trunk->nextHop;
   tmr_init(&trunk->timer);
+  trunk->keepAlive = std::make_unique<TrunkKeepAlive>(m_stack, onKeepAliveFailed, trunk.get());
   return trunk;
 }
 
@@ -175,10 +197,12 @@ void TrunkRegistrations::registerTrunk(Trunk& trunk) {
                             nullptr, nullptr);
   if (error == 0)
     return;
-  report("trunk " + trunk.path + " cannot register at " + trunk.registrarUri + ": " +
-         (tlsError.empty() ? std::strerror(error) : tlsError));
-  trunk.retryMs =
-      uint64_t{m_clock.measure([&] { return trunk.face->getRetryTimeoutOnSystemError(); })} * 1000;
+  unsigned int const seconds = m_clock.measure([&] { return trunk.face->getRetryTimeoutOnSystemError(); });
+  reportFailure(trunk,
+                "trunk " + trunk.path + " cannot register at " + trunk.registrarUri + ": " +
+                    (tlsError.empty() ? failureCause(error, trunk.nextHop) : tlsError),
+                seconds);
+  trunk.retryMs = uint64_t{seconds} * 1000;
   tmr_start(&trunk.timer, trunk.retryMs, onRetry, &trunk);
 }
 
@@ -216,19 +240,28 @@ void TrunkRegistrations::onResponse(int error, sip_msg const* response, void* ar
     registrar.Parse(address, std::char_traits<char>::length(address));
     clock.measure([&] { trunk.face->setRegistrarAddr(registrar); });
     trunk.registered = true;
+    trunk.lastFailure.clear();
     std::string transport = sip_transp_name(response->tp);
     std::transform(transport.begin(), transport.end(), transport.begin(),
                    [](char c) { return static_cast<char>(std::tolower(static_cast<unsigned char>(c))); });
     owner.report("trunk " + trunk.path + " registered at " + transport + ":" + address + " for " +
                  std::to_string(trunk.lifetime) + " s");
+    LS_KeepAliveMethod::Type method = LS_KeepAliveMethod::NONE;
+    unsigned int interval = 0;
+    clock.measure([&] {
+      method = trunk.face->getKeepAliveMethod();
+      interval = trunk.face->getKeepAliveInterval();
+    });
+    trunk.keepAlive->start(*response, method, interval, trunk.registrarUri, trunk.addressOfRecord);
     return;
   }
   trunk.registered = false;
+  trunk.keepAlive->stop();
   unsigned int seconds;
   std::string cause;
   if (error != 0 || !response) {
     seconds = clock.measure([&] { return trunk.face->getRetryTimeoutOnSystemError(); });
-    cause = std::strerror(error);
+    cause = failureCause(error, trunk.nextHop);
   } else if (response->scode >= 500 && response->scode < 600) {
     seconds = clock.measure([&] { return trunk.face->getRetryTimeoutOnServerError(); });
     cause = std::to_string(response->scode);
@@ -236,8 +269,7 @@ void TrunkRegistrations::onResponse(int error, sip_msg const* response, void* ar
     seconds = clock.measure([&] { return trunk.face->getRetryTimeoutOnClientError(); });
     cause = std::to_string(response->scode);
   }
-  owner.report("trunk " + trunk.path + " failed to register (" + cause + "), retrying in " +
-               std::to_string(seconds) + " s");
+  owner.reportFailure(trunk, "trunk " + trunk.path + " failed to register (" + cause + ")", seconds);
   trunk.retryMs = uint64_t{seconds} * 1000;
   tmr_start(&trunk.timer, 0, onDropFailed, &trunk);
 }
@@ -248,6 +280,18 @@ void TrunkRegistrations::onDropFailed(void* argument) {
   tmr_start(&trunk.timer, trunk.retryMs, onRetry, &trunk);
 }
 
+void TrunkRegistrations::onKeepAliveFailed(int error, void* argument) {
+  Trunk& trunk = *static_cast<Trunk*>(argument);
+  TrunkRegistrations& owner = *trunk.owner;
+  unsigned int const seconds =
+      owner.m_clock.measure([&] { return trunk.face->getRetryTimeoutOnSystemError(); });
+  trunk.registered = false;
+  owner.reportFailure(trunk, "trunk " + trunk.path + " lost its registrar (" + std::strerror(error) + ")",
+                      seconds);
+  trunk.retryMs = uint64_t{seconds} * 1000;
+  tmr_start(&trunk.timer, 0, onDropFailed, &trunk);
+}
+
 void TrunkRegistrations::onRetry(void* argument) {
   Trunk& trunk = *static_cast<Trunk*>(argument);
   trunk.owner->registerTrunk(trunk);
@@ -255,6 +299,7 @@ void TrunkRegistrations::onRetry(void* argument) {
 
 void TrunkRegistrations::unregisterTrunk(Trunk& trunk) {
   tmr_cancel(&trunk.timer);
+  trunk.keepAlive->stop();
   if (trunk.registered)
     report("trunk " + trunk.path + " unregistering");
   trunk.registered = false;

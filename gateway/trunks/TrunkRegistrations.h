@@ -18,7 +18,17 @@
 // failure), server (5xx) or client (any other final failure, 4xx and 6xx),
 // instead of sipreg's own back-off, so that the configuration decides. The
 // registrar's address (where the 2xx came from) is recorded with
-// setRegistrarAddr. Progress goes to standard error, one line per event.
+// setRegistrarAddr. Progress goes to standard error, one line per event; a
+// failure like the one before it is not told again, so that a carrier whose
+// name does not resolve, retried every few seconds for days, leaves one line
+// and not thousands.
+//
+// A registrar or proxy named by host name is found by the stack's DNS client
+// (RFC 3263), anew for every REGISTER sipreg sends, refreshes included, so
+// that a carrier moving its servers is followed without a restart. Between
+// registrations a TrunkKeepAlive keeps the path to the registrar open as
+// the face's keep-alive settings say; when it finds the registrar gone, the
+// trunk registers anew after the retry timeout for system errors.
 //
 // After a change made while serving, the registrations follow the model:
 // a trunk that is new registers, one that is gone (or no longer has a
@@ -45,6 +55,7 @@
 #include "ScriptSession.h"
 #include "metrics/LibraryClock.h"
 #include "sip/Libre.h"
+#include "trunks/TrunkKeepAlive.h"
 #include "trunks/TrunkTls.h"
 
 class TrunkRegistrations {
@@ -82,6 +93,11 @@ class TrunkRegistrations {
     std::string registrarUri;
     std::string addressOfRecord;
     std::string route;
+    // The host the stack resolves: the proxy's when there is one, else the
+    // registrar's.
+    std::string nextHop;
+    // The last failure reported, empty once registered.
+    std::string lastFailure;
     // The host whose certificate a TLS registration verifies; empty when
     // the trunk registers over a plain transport.
     std::string tlsHost;
@@ -92,6 +108,7 @@ class TrunkRegistrations {
     // retryMs and registers anew.
     tmr timer;
     uint64_t retryMs = 0;
+    std::unique_ptr<TrunkKeepAlive> keepAlive;
   };
 
   // Every trunk the model describes now, none registering yet.
@@ -105,9 +122,12 @@ class TrunkRegistrations {
   static bool same(Trunk const& a, Trunk const& b);
   // One progress line on standard error, after the library's debug lines.
   void report(std::string const& line);
+  // failure, with the retry time, unless it is the trunk's last one.
+  void reportFailure(Trunk& trunk, std::string const& failure, unsigned int seconds);
   static int onChallenge(char** user, char** password, char const* realm, void* trunk);
   static void onResponse(int error, sip_msg const* response, void* trunk);
   static void onDropFailed(void* trunk);
+  static void onKeepAliveFailed(int error, void* trunk);
   static void onRetry(void* trunk);
 
   sip& m_stack;

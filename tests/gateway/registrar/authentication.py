@@ -53,7 +53,7 @@ def sha256_registration_cannot_be_replayed(program, work, emulator):
         other = phone.send(register(phone, alice, phone.new_call_id(), 1, "sip:mallory@203.0.113.66", auth))
         check(other.status == 401, "nonce taken to another Call-ID: %d" % other.status)
         where = phone.send(phone.build("MESSAGE", alice, alice, phone.new_call_id(), 1))
-        check(where.status == 302 and where.all("Contact") == ["<sip:alice@192.0.2.1>"],
+        check(where.status == 302 and [c.split(">")[0] for c in where.all("Contact")] == ["<sip:alice@192.0.2.1"],
               "binding changed: %d %r" % (where.status, where.all("Contact")))
         # The phone's own next request: a higher nonce-count passes, and so
         # does MD5.

@@ -74,7 +74,7 @@ def phones_register_and_are_found_over_every_transport(program, work, emulator):
             check(register(phone, user, "sip:example.com", contact) == 200, "%s did not register" % transport)
             found = caller.send(caller.build("INVITE", "sip:%s@example.com" % user, "sip:%s@example.com" % user,
                                              caller.new_call_id(), 1))
-            check(found.status == 302 and found.all("Contact") == ["<%s>" % contact],
+            check(found.status == 302 and [c.split(">")[0] for c in found.all("Contact")] == ["<" + contact],
                   "%s phone not found: %d %r" % (transport, found.status, found.all("Contact")))
             if transport == "tls":
                 check(register(phone, "alice", "sips:example.com", contact) == 200, "sips: refused over TLS")

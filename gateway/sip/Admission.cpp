@@ -1,0 +1,107 @@
+#include "sip/Admission.h"
+
+#include <string>
+
+#include "CHostPort.h"
+#include "LS_ServiceResolution.h"
+#include "sip/Capabilities.h"
+#include "sip/HeaderValues.h"
+
+namespace {
+
+std::string text(pl const& value) {
+  return std::string(value.p, value.l);
+}
+
+// The request URI's host and port as the library reads a host, brackets
+// around an IPv6 address included.
+CHostPort hostPortOf(uri const& target) {
+  std::string host = text(target.host);
+  if (target.af == AF_INET6)
+    host = "[" + host + "]";
+  if (target.port != 0)
+    host += ":" + std::to_string(target.port);
+  CHostPort hostPort;
+  hostPort.ParseUriHostPort(host.data(), host.size());
+  return hostPort;
+}
+
+}  // namespace
+
+bool Admission::answered(Exchange& exchange) const {
+  sip_msg const& message = exchange.request();
+  if (pl_strcmp(&message.met, "CANCEL") != 0 && unsupportedExtension(exchange))
+    return true;
+  if (pl_strcmp(&message.met, "OPTIONS") == 0 && toGateway(exchange))
+    return true;
+  if (pl_strcmp(&message.met, "REGISTER") == 0)
+    return registrarDomainUnknown(exchange);
+  if (pl_isset(&message.to.tag)) {
+    exchange.answer(481, "Call/Transaction Does Not Exist");
+    return true;
+  }
+  return false;
+}
+
+bool Admission::unsupportedExtension(Exchange& exchange) const {
+  std::string unsupported;
+  forEachHeaderValue(exchange.request(), SIP_HDR_REQUIRE, [&](sip_hdr const& header) {
+    // The stack bounds a message, and so the answer that lists its tags.
+    if (!Capabilities::supports(header.val))
+      unsupported += (unsupported.empty() ? "" : ", ") + text(header.val);
+    return true;
+  });
+  if (unsupported.empty())
+    return false;
+  exchange.answer(420, "Bad Extension", "Unsupported: " + unsupported + "\r\n" + Capabilities::kSupported);
+  return true;
+}
+
+bool Admission::toGateway(Exchange& exchange) const {
+  sip_msg const& message = exchange.request();
+  bool own = !pl_isset(&message.uri.user);
+  if (!own && namesListener(message.uri)) {
+    CNameAddr target;
+    String error;
+    own = target.Parse(message.ruri.p, message.ruri.l) &&
+          !exchange.clock().measure([&] { return exchange.session().resolve(error, target); });
+  }
+  if (!own)
+    return false;
+  exchange.answer(200, "OK",
+                  std::string(Capabilities::kAllow) + Capabilities::kAccept + Capabilities::kSupported);
+  return true;
+}
+
+bool Admission::registrarDomainUnknown(Exchange& exchange) const {
+  ScriptSession& session = exchange.session();
+  ScriptSession::StackSettings const& stack = session.stack();
+  CHostPort const domain = hostPortOf(exchange.request().uri);
+  String error;
+  RefPtr<LS_ILocationService> service;
+  exchange.clock().measure([&] {
+    if (domain.GetHost().isEmpty())
+      return;
+    if (stack.services.isEmpty())
+      LS_getLocationService(error, service, domain, stack.localHostPorts, stack.imperative,
+                            session.locationMaster());
+    else
+      LS_getLocationService(error, service, domain, stack.services, stack.localHostPorts, stack.imperative,
+                            session.locationMaster());
+  });
+  if (service)
+    return false;
+  exchange.setResult("\"" + error.str() + "\"");
+  exchange.answer(404, "Not Found");
+  return true;
+}
+
+bool Admission::namesListener(uri const& target) const {
+  sa address;
+  if (sa_set(&address, &target.host, target.port != 0 ? target.port : 5060) != 0)
+    return false;
+  for (Listeners::Listener const& listener : m_listeners.listeners())
+    if (sa_cmp(&listener.address, &address, SA_ALL))
+      return true;
+  return false;
+}

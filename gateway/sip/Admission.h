@@ -1,0 +1,44 @@
+// Admission: what the gateway answers itself, before the part for a request's
+// method sees it. In this order:
+// - 420 Bad Extension, listing them in Unsupported, for a request whose
+//   Require names an extension the gateway does not support
+//   (Capabilities), before anything else, authentication included (RFC 3261
+//   section 8.2.2.3). CANCEL is exempt, as the section says.
+// - 200 with Allow, Accept and Supported for an OPTIONS to the gateway
+//   itself (RFC 3261 section 11.2): one whose request URI has no user part,
+//   or names one of the addresses the gateway listens on with a user that
+//   denotes no identity there. A user there that does denote one is a
+//   subscriber asked for, and redirected as any other: phones are called by
+//   the gateway's address as often as by a domain.
+// - 481 for a request with a To tag other than REGISTER: it belongs to a
+//   dialog, and a redirect server makes none (RFC 3261 section 12.2.2).
+//   REGISTER is exempt because registration clients (libre's among them)
+//   send their refreshes with the tag of the first answer.
+// - 404 for a REGISTER whose request URI names no domain of a location
+//   service, as the library finds the service for a host (RFC 3261
+//   section 10.3, step 1: the registrar has no bindings for that domain).
+//
+// Keeps no state of its own; the listeners it is given outlive it. Runs on
+// libre's thread.
+#pragma once
+
+#include "sip/Exchange.h"
+#include "sip/Listeners.h"
+
+class Admission {
+ public:
+  explicit Admission(Listeners const& listeners) : m_listeners(listeners) {}
+
+  // Whether the request has been answered here.
+  bool answered(Exchange& exchange) const;
+
+ private:
+  bool unsupportedExtension(Exchange& exchange) const;
+  bool toGateway(Exchange& exchange) const;
+  bool registrarDomainUnknown(Exchange& exchange) const;
+  // Whether the request URI's host and port (5060 when none) are those of
+  // a listener.
+  bool namesListener(uri const& target) const;
+
+  Listeners const& m_listeners;
+};
