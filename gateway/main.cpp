@@ -214,6 +214,7 @@ bool startOperations(ScriptSession& session,
     addScriptCommands(parts.table);
     addGatewayCommands(parts.table, frontEnd);
     parts.control = std::make_unique<ControlServer>(session, parts.table);
+    frontEnd.followChanges();
     Autosave* const autosave = parts.autosave.get();
     parts.control->onLine([&frontEnd] { frontEnd.beginChange(); },
                           [&frontEnd, autosave](bool applied) {

@@ -4,7 +4,7 @@
 # default build-gateway-bench/), loads SUBSCRIBERS (default 100,000)
 # subscribers inheriting "DEFAULT" (generate.sh), registers every one with
 # SIPp at REGISTER_RATE, then has SIPp refresh them at REFRESH_RATE (by
-# default 840/s, half the highest rate at which the storm ran clean in the
+# default 995/s, half the highest rate at which the storm ran clean in the
 # README's figures) while CHANGES lines go over the socket a second apart,
 # each setting the group's inbound-registration lifetime range anew (every
 # member inherits it, and every watcher of a member is told). Reports the
@@ -15,8 +15,8 @@ set -euo pipefail
 root="$(cd "$(dirname "$0")/../.." && pwd)"
 here="$root/bench/gateway"
 subscribers=${SUBSCRIBERS:-100000}
-register_rate=${REGISTER_RATE:-1500}
-refresh_rate=${REFRESH_RATE:-840}
+register_rate=${REGISTER_RATE:-2000}
+refresh_rate=${REFRESH_RATE:-995}
 changes=${CHANGES:-10}
 build=${BUILD:-"$root/build-gateway-bench"}
 work="$build/bench-live-change"
@@ -48,7 +48,7 @@ for _ in $(seq 600); do
   kill -0 "$gateway_pid" || { cat gateway.err >&2; exit 1; }
   sleep 0.1
 done
-address=$(sed -n 's/.*listening on udp:\(.*\)$/\1/p' gateway.err)
+address=$(sed -n 's/^location-gateway: listening on udp:\(127[^ ]*\).*$/\1/p' gateway.err | head -n 1)
 
 # statistic FILE NAME: field NAME of the last line of a SIPp statistics file.
 statistic() {

@@ -69,8 +69,11 @@ bool SipFrontEnd::start(Settings const& settings, std::string& error) {
   m_trunks = std::make_unique<TrunkRegistrations>(*m_stack, m_session, m_clock);
   m_trunks->useCaFile(m_caFile);
   m_trunks->start();
-  m_changes = std::make_unique<ModelChanges>(*m_session.locationMaster());
   return true;
+}
+
+void SipFrontEnd::followChanges() {
+  m_changes = std::make_unique<ModelChanges>(*m_session.locationMaster());
 }
 
 void SipFrontEnd::beginChange() {

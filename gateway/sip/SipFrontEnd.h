@@ -77,8 +77,12 @@ class SipFrontEnd {
   // are refused (SourceRateLimit); off unless called.
   void limitSourceRate(uint32_t perSecond) { m_rateLimit = std::make_unique<SourceRateLimit>(perSecond); }
 
-  // Around a change made while serving (a control line): the registrar
-  // drops the bindings of identities it removed, the trunks follow.
+  // Makes the gateway ready for changes while it serves (--control): from
+  // then on it observes every identity, which a gateway never changed
+  // need not pay for. Around each change (a control line), beginChange()
+  // and endChange(): the registrar drops the bindings of identities it
+  // removed, the trunks follow.
+  void followChanges();
   void beginChange();
   void endChange();
   GatewayStatistics statistics() const;

@@ -12,6 +12,10 @@ struct Answer {
   char const* message;
 };
 
+void PrintTo(Answer const& answer, std::ostream* out) {
+  *out << answer.name;
+}
+
 class ControlAnswerRoundTrip : public ::testing::TestWithParam<Answer> {};
 
 // Fed a byte at a time, as a slow socket may deliver it, the reader gives
