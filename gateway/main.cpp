@@ -29,6 +29,9 @@
 #include "control/GatewayCommands.h"
 #include "metrics/LibraryClock.h"
 #include "metrics/MetricsServer.h"
+#include "redirect/SourceFilter.h"
+#include "registrar/CredentialMask.h"
+#include "registrar/DigestAuthentication.h"
 #include "sip/Libre.h"
 #include "sip/SipFrontEnd.h"
 #include "store/BindingReplay.h"
@@ -40,7 +43,7 @@ char const kUsage[] =
     "usage: location-gateway [--listen ADDR:PORT]... [--dns-server ADDR:PORT]...\n"
     "                        [--min-expires S] [--max-expires S] [--default-expires S]\n"
     "                        [--nat-ping S] [--store WHERE] [--debug] [--statistics] [--control PATH]\n"
-    "                        [--autosave FILE] [--metrics ADDR:PORT] SCRIPT...\n"
+    "                        [--autosave FILE] [--metrics ADDR:PORT] [OPTION...] SCRIPT...\n"
     "\n"
     "Configures the library from the scripts (the console's language), then\n"
     "answers SIP requests over UDP and TCP on every ADDR:PORT given (default\n"
@@ -62,6 +65,20 @@ char const kUsage[] =
     "  --debug       show the library's debug lines\n"
     "  --statistics  at exit, the requests answered and the CPU time spent\n"
     "                in the library's calls\n"
+    "  --digest LIST the algorithms each challenge offers, in order\n"
+    "                (default SHA-256,MD5; both are always accepted)\n"
+    "  --redirect-from CIDR  answer INVITE and the other redirected requests\n"
+    "                only from this network (repeatable; default any source)\n"
+    "  --source-rate N  refuse a source address sending more than N requests\n"
+    "                a second for a while (default off)\n"
+    "  --tls ADDR:PORT  SIP over TLS too (needs --certificate)\n"
+    "  --ws ADDR:PORT, --wss ADDR:PORT  SIP over WebSocket, plain or secure\n"
+    "                (RFC 7118; --wss needs --certificate)\n"
+    "  --certificate FILE, --key FILE  the server's certificate and key (PEM)\n"
+    "  --ca-file FILE  verify TLS trunks' carriers against these CA\n"
+    "                certificates (PEM) instead of the system's\n"
+    "  --allow-vulnerable-websocket  WebSocket even on a libre before 4.8.1,\n"
+    "                which any peer can crash (CVE-2026-50161): tests only\n"
     "  --control PATH   a Unix socket (mode 0600) taking lines of the script\n"
     "                   language while serving: location-console --connect PATH\n"
     "  --autosave FILE  after a change over the socket, the configuration\n"
@@ -92,6 +109,11 @@ struct Options {
   std::string store = "location-gateway.sqlite";
   bool debug = false;
   bool statistics = false;
+  std::vector<DigestAlgorithm> digest{DigestAlgorithm::SHA256, DigestAlgorithm::MD5};
+  std::vector<std::string> redirectFrom;
+  unsigned long sourceRate = 0;
+  SecureTransportOptions secure;
+  std::string caFile;
   std::string control;
   std::string autosave;
   std::string metrics;
@@ -127,6 +149,27 @@ bool parse(int argc, char** argv, Options& options) {
       options.debug = true;
     else if (argument == "--statistics")
       options.statistics = true;
+    else if (argument == "--digest" && i + 1 < argc && parseDigestAlgorithms(argv[i + 1], options.digest))
+      ++i;
+    else if (argument == "--tls" && i + 1 < argc)
+      options.secure.tls = argv[++i];
+    else if (argument == "--ws" && i + 1 < argc)
+      options.secure.ws = argv[++i];
+    else if (argument == "--wss" && i + 1 < argc)
+      options.secure.wss = argv[++i];
+    else if (argument == "--certificate" && i + 1 < argc)
+      options.secure.certificate = argv[++i];
+    else if (argument == "--key" && i + 1 < argc)
+      options.secure.key = argv[++i];
+    else if (argument == "--ca-file" && i + 1 < argc)
+      options.caFile = argv[++i];
+    else if (argument == "--allow-vulnerable-websocket")
+      options.secure.allowVulnerableWebSocket = true;
+    else if (argument == "--redirect-from" && i + 1 < argc && SourceFilter().allow(argv[i + 1]))
+      options.redirectFrom.push_back(argv[++i]);
+    else if (argument == "--source-rate" && i + 1 < argc &&
+             (options.sourceRate = std::strtoul(argv[++i], nullptr, 10)) > 0)
+      continue;
     else if (argument.size() > 1 && argument[0] == '-')
       return false;
     else
@@ -217,6 +260,12 @@ int serve(ScriptSession& session, Options const& options) {
     return 1;
   }
   SipFrontEnd frontEnd(session, clock);
+  frontEnd.registrar().authenticator().offerAlgorithms(options.digest);
+  frontEnd.trustForTrunks(options.caFile);
+  for (std::string const& network : options.redirectFrom)
+    frontEnd.redirector().sources().allow(network);
+  if (options.sourceRate > 0)
+    frontEnd.limitSourceRate(static_cast<uint32_t>(options.sourceRate));
   BindingReplay replay(session, frontEnd.registrar(), clock);
   if (store && !replay.restore(*store, error)) {
     std::cerr << "location-gateway: " << error << "\n";
@@ -226,9 +275,16 @@ int serve(ScriptSession& session, Options const& options) {
     std::cerr << "location-gateway: " << error << "\n";
     return 1;
   }
+  std::vector<std::string> secure;
+  if (!frontEnd.startSecure(options.secure, secure, error)) {
+    std::cerr << "location-gateway: " << error << "\n";
+    return 1;
+  }
   if (frontEnd.dnsServers().empty())
     std::cerr << "location-gateway: no DNS server configured: host names will not resolve\n";
   std::cerr << "location-gateway: listening on " << frontEnd.listening() << std::endl;
+  for (std::string const& transport : secure)
+    std::cerr << "location-gateway: listening on " << transport << std::endl;
   {
     Operations operations;
     if (!startOperations(session, frontEnd, options, operations)) {
@@ -248,6 +304,8 @@ int serve(ScriptSession& session, Options const& options) {
 }  // namespace
 
 int main(int argc, char** argv) {
+  CredentialMask const maskedOutput(std::cout);
+  CredentialMask const maskedErrors(std::cerr);
   Options options;
   if (!parse(argc, argv, options)) {
     std::cerr << kUsage;

@@ -54,25 +54,51 @@ for attempt in 1 2 3; do
   echo "package-list update failed (attempt $attempt)" >&2
   sleep 5
 done
-# A library that is Multi-Arch: same must be at one version in every
+# A package that is Multi-Arch: same must be at one version in every
 # architecture. When another architecture's index lags behind the native
-# one's (its security mirror failing to update, say), the install fails on
-# that library: install it then in both architectures at the version the
-# other architecture has, and try once more.
+# one's (its security mirror failing to update, say), the resolver refuses
+# the install. Then every package its complaint names (those it could not
+# install and those they depend on or break) is installed in the native and
+# each foreign architecture at the highest version both have, and the
+# install is tried once more.
 log=$(mktemp)
 trap 'rm -f "$log"' EXIT
 if $sudo apt-get install -y --no-install-recommends "${wanted[@]}" 2>&1 | tee "$log"; then
   exit 0
 fi
+# The versions of PACKAGE the indexes offer, one a line.
+versions() { apt-cache madison "$1" | awk -F' [|] ' '{ print $2 }'; }
+foreign=$(printf '%s\n' "${wanted[@]}" | sed -n 's/^[^:]*:\(.*\)$/\1/p' | sort -u)
+named=$({
+  sed -n 's/^ *\([a-z0-9][a-z0-9.+-]*\)\(:[a-z0-9]*\)\{0,1\} : .*/\1/p' "$log"
+  sed -n 's/.*\(Depends\|Breaks\): \([a-z0-9][a-z0-9.+-]*\).*/\2/p' "$log"
+} | sort -u)
 aligned=()
-for library in $(sed -n 's/.* Depends: \([^ :]*\):\([^ ]*\) .*/\1:\2/p' "$log" | sort -u); do
-  version=$(apt-cache policy "$library" | sed -n 's/^ *Candidate: //p')
-  if [ -n "$version" ] && [ "$version" != "(none)" ]; then
-    aligned+=("${library%%:*}=$version" "$library=$version")
-  fi
+for name in $named; do
+  for architecture in $foreign; do
+    best=""
+    for version in $(versions "$name"); do
+      if versions "$name:$architecture" | grep -qxF "$version" &&
+        { [ -z "$best" ] || dpkg --compare-versions "$version" gt "$best"; }; then
+        best=$version
+      fi
+    done
+    if [ -n "$best" ]; then
+      aligned+=("$name=$best" "$name:$architecture=$best")
+    fi
+  done
 done
 if [ ${#aligned[@]} -eq 0 ]; then
   exit 1
 fi
 echo "Aligning ${aligned[*]}" >&2
-$sudo apt-get install -y --no-install-recommends --allow-downgrades "${aligned[@]}" "${wanted[@]}"
+# The packages wanted that were aligned go in at their aligned version only.
+rest=()
+for package in "${wanted[@]}"; do
+  native=${package%:*}
+  case " ${aligned[*]} " in
+    *" $package="* | *" $native="*) ;;
+    *) rest+=("$package") ;;
+  esac
+done
+$sudo apt-get install -y --no-install-recommends --allow-downgrades "${aligned[@]}" "${rest[@]}"

@@ -120,7 +120,7 @@ run_sipp() {
   start=$(date +%s.%N)
   local status=0
   timeout $((limit + 10)) sipp "$address" -sf "$here/$scenario" -inf users.csv -m "$calls" \
-    -r "$rate" -i 127.0.0.1 -nostdin -timeout "${limit}s" -timeout_error \
+    -r "$rate" -i 127.0.0.1 -auth_uri example.com -nostdin -timeout "${limit}s" -timeout_error \
     -trace_stat -stf "$label.csv" -fd 3600 >"$label.log" 2>&1 || status=$?
   end=$(date +%s.%N)
   ticks=$(($(server_ticks) - before))
@@ -179,7 +179,8 @@ start_server() { # TARGET
   address=""
   case $1 in
     gateway)
-      "$gateway" --listen 127.0.0.1:0 --store "$store" --statistics subscribers.script >gateway.out 2>gateway.err &
+      # SIPp answers only an MD5 first challenge.
+      "$gateway" --listen 127.0.0.1:0 --store "$store" --statistics --digest MD5 subscribers.script >gateway.out 2>gateway.err &
       server_pid=$!
       while [ -z "$address" ]; do
         if ! kill -0 "$server_pid" 2>/dev/null || [ $((SECONDS - start)) -gt 600 ]; then

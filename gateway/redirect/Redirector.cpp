@@ -27,6 +27,8 @@ std::string qText(unsigned int thousandths) {
 }  // namespace
 
 void Redirector::handle(Exchange& exchange) {
+  if (!m_sources.admits(exchange.request().src))
+    return exchange.answer(403, "Forbidden");
   CNameAddr target;
   RefPtr<LS_IIdentity> const identity = exchange.resolveOrAnswer(exchange.request().ruri, target);
   if (!identity)

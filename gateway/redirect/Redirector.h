@@ -10,15 +10,22 @@
 // registrar files a contact's q as its priority in thousandths, 1000 for a
 // contact registered without one; registrations of equal q keep the face's
 // order, oldest first.
+//
+// A source its SourceFilter does not admit gets 403 before any lookup.
 #pragma once
+
+#include "redirect/SourceFilter.h"
 
 class Exchange;
 
 class Redirector {
  public:
   void handle(Exchange& exchange);
+  SourceFilter& sources() { return m_sources; }
 
  private:
   // Each contact is sent as received, up to kMaximumContacts of them.
   static constexpr unsigned int kMaximumContacts = 32;
+
+  SourceFilter m_sources;
 };

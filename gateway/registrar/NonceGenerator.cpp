@@ -67,12 +67,15 @@ void NonceGenerator::useKey(std::array<uint8_t, 20> const& key) {
     std::abort();
 }
 
-std::string NonceGenerator::signature(uint64_t madeMs, pl const& realm) const {
+std::string NonceGenerator::signature(uint64_t stamp, pl const& realm, pl const& callId) const {
   char time[kTimeDigits + 1];
-  std::snprintf(time, sizeof time, "%016llx", static_cast<unsigned long long>(madeMs));
+  std::snprintf(time, sizeof time, "%016llx", static_cast<unsigned long long>(stamp));
+  // The realm's length goes first: both texts may hold any character, and
+  // "a:b" + "c" must not sign the same as "a" + "b:c".
   std::string data(time);
-  data += ':';
+  data += ':' + std::to_string(realm.l) + ':';
   data.append(realm.p, realm.l);
+  data.append(callId.p, callId.l);
   uint8_t mac[20];
   size_t length = 0;
   if (!EVP_MAC_init(m_mac, nullptr, 0, nullptr) ||
@@ -82,15 +85,20 @@ std::string NonceGenerator::signature(uint64_t madeMs, pl const& realm) const {
   return time + hex(mac, sizeof mac);
 }
 
-std::string NonceGenerator::make(pl const& realm, uint64_t nowMs) const {
-  return signature(nowMs, realm);
+std::string NonceGenerator::make(pl const& realm, pl const& callId, uint64_t nowMs) const {
+  ++m_serial;
+  return signature((nowMs << kSerialBits) | (m_serial & ((1u << kSerialBits) - 1)), realm, callId);
 }
 
-NonceGenerator::Check NonceGenerator::check(pl const& nonce, pl const& realm, uint64_t nowMs) const {
-  uint64_t madeMs = 0;
-  if (nonce.l != kTimeDigits + kSignatureDigits || !parseTime(nonce.p, madeMs))
+NonceGenerator::Check NonceGenerator::check(pl const& nonce,
+                                            pl const& realm,
+                                            pl const& callId,
+                                            uint64_t nowMs) const {
+  uint64_t stamp = 0;
+  if (nonce.l != kTimeDigits + kSignatureDigits || !parseTime(nonce.p, stamp))
     return Check::UNKNOWN;
-  std::string const expected = signature(madeMs, realm);
+  uint64_t const madeMs = stamp >> kSerialBits;
+  std::string const expected = signature(stamp, realm, callId);
   // Compared in full whatever differs first, so the time taken tells
   // nothing about how much of a forged signature was right.
   unsigned char difference = 0;
@@ -99,4 +107,11 @@ NonceGenerator::Check NonceGenerator::check(pl const& nonce, pl const& realm, ui
   if (difference != 0 || madeMs > nowMs)
     return Check::UNKNOWN;
   return nowMs - madeMs > kLifetimeMs ? Check::STALE : Check::VALID;
+}
+
+uint64_t NonceGenerator::madeAt(pl const& nonce) {
+  uint64_t stamp = 0;
+  if (nonce.l >= kTimeDigits)
+    parseTime(nonce.p, stamp);
+  return stamp >> kSerialBits;
 }

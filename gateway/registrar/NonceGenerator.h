@@ -1,16 +1,23 @@
 // NonceGenerator: the nonces of the digest challenges, made so that the
-// gateway can verify and expire them without storing any. A nonce is the
-// time it was made (milliseconds of the stack's monotonic clock, 16 hex
-// digits) followed by an HMAC-SHA1 over that time and the realm (40 hex
-// digits) under a key drawn at random for each process: only this process
-// can make one, one realm's nonce does not pass for another's, and a nonce
-// from before a restart is refused as unknown rather than stale.
+// gateway can verify and expire them without storing any. A nonce is a
+// stamp, the time it was made (milliseconds of the stack's monotonic clock)
+// shifted left by kSerialBits and a serial number of this process in those
+// bits (16 hex digits in all), followed by an HMAC-SHA1 over that time, the realm and the Call-ID
+// of the request it answers (40 hex digits) under a key drawn at random for
+// each process: only this process can make one, and a nonce serves only the
+// realm and the registration (Call-ID) it was made for, so that a captured
+// response cannot be carried over to another phone's registration. A nonce
+// from before a restart is refused as unknown rather than stale. The serial
+// keeps two challenges of one registration within a millisecond apart:
+// NonceTable lets a nonce serve once per nonce-count, and a phone answers
+// each challenge with count 1.
 //
 // Lifetime: kLifetimeMs (five minutes), long enough for a phone to answer a
 // challenge, short enough that a captured response stops working. An
 // authentic nonce past its lifetime is stale, and the phone is challenged
 // again with stale=true so that it retries without asking its user.
-// Replays within the lifetime are not detected: that would need state.
+// Replays within the lifetime are NonceTable's to detect: this part keeps
+// no state, so that a challenge costs no memory.
 //
 // The MAC is computed with one OpenSSL context keyed once and reset for
 // each nonce: a one-shot HMAC looks its algorithm up and sets the key anew
@@ -39,14 +46,19 @@ class NonceGenerator {
   NonceGenerator(NonceGenerator const&) = delete;
   NonceGenerator& operator=(NonceGenerator const&) = delete;
 
-  std::string make(pl const& realm, uint64_t nowMs) const;
-  Check check(pl const& nonce, pl const& realm, uint64_t nowMs) const;
+  std::string make(pl const& realm, pl const& callId, uint64_t nowMs) const;
+  Check check(pl const& nonce, pl const& realm, pl const& callId, uint64_t nowMs) const;
+  // When an authentic nonce was made, on the clock given to make().
+  static uint64_t madeAt(pl const& nonce);
 
  private:
-  std::string signature(uint64_t madeMs, pl const& realm) const;
+  std::string signature(uint64_t stamp, pl const& realm, pl const& callId) const;
 
   void useKey(std::array<uint8_t, 20> const& key);
 
+  static constexpr unsigned int kSerialBits = 16;
+
   // Keyed once; EVP_MAC_init without a key resets it for the next MAC.
   mutable EVP_MAC_CTX* m_mac = nullptr;
+  mutable uint32_t m_serial = 0;
 };

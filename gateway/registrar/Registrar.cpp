@@ -5,11 +5,9 @@
 #include <iostream>
 #include <vector>
 
-#include "LS_CredentialLookup.h"
 #include "LS_ILocationService.h"
 #include "LS_IdentityResolution.h"
 #include "LS_IdentityType.h"
-#include "registrar/DigestAuthentication.h"
 #include "registrar/NatTraversal.h"
 #include "registrar/SipUriComparison.h"
 #include "sip/Capabilities.h"
@@ -18,10 +16,6 @@
 
 namespace {
 
-// Authorization headers looked at per request, and the longest user name
-// passed to the library: more is an attack, not a phone.
-constexpr unsigned int kMaximumAuthorizations = 8;
-constexpr size_t kMaximumUserName = 256;
 // The Call-ID is kept with every binding; a longer one is refused.
 constexpr size_t kMaximumCallId = 256;
 
@@ -70,9 +64,16 @@ void Registrar::start(sip& stack, ExpiryRange const& expiry, uint32_t natPingSec
 }
 
 void Registrar::handle(Exchange& exchange) {
+  if (m_authenticator.refuseHeldSource(exchange))
+    return;
   CNameAddr to;
-  RefPtr<LS_IIdentity> const resolved = exchange.resolveOrAnswer(exchange.request().to.auri, to);
-  if (!resolved || !authenticated(exchange, resolved.get(), to))
+  RefPtr<LS_IIdentity> const resolved = exchange.resolveOrAnswer(exchange.request().to.auri, to, false);
+  if (!resolved) {
+    if (!exchange.answered())
+      m_authenticator.refuseUnknown(exchange, to);
+    return;
+  }
+  if (!m_authenticator.admit(exchange, resolved.get(), to))
     return;
   bool created = false;
   RefPtr<LS_IIdentity> const identity = registering(resolved.get(), to, created);
@@ -212,34 +213,6 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
   exchange.answer(200, "OK", bindingHeaders(bindings));
 }
 
-bool Registrar::authenticated(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to) {
-  bool stale = false;
-  if (checkCredentials(exchange.request(), identity, to, nullptr, stale) > 0)
-    return true;
-  String error;
-  Vector<LS_ProtocolRealm> realms;
-  m_clock.measure([&] { LS_getInboundAuthenticationChallenge(error, realms, identity, nullptr); });
-  if (realms.isEmpty())
-    return true;
-  int const verdict = checkCredentials(exchange.request(), identity, to, &realms, stale);
-  if (verdict > 0)
-    return true;
-  if (verdict < 0) {
-    ++m_failedAuthentications;
-    exchange.answer(403, "Forbidden");
-    return false;
-  }
-  uint64_t const now = tmr_jiffies();
-  std::string challenges;
-  for (LS_ProtocolRealm const& realm : realms) {
-    pl name;
-    pl_set_str(&name, realm.realm.c_str());
-    challenges += "WWW-Authenticate: " + digestChallenge(name, m_nonces.make(name, now), stale) + "\r\n";
-  }
-  exchange.answer(401, "Unauthorized", challenges);
-  return false;
-}
-
 void Registrar::dropRemoved(std::vector<LS_IIdentity const*> const& removed, bool checkAll) {
   for (LS_IIdentity const* identity : removed) {
     auto const found = m_bindings.find(const_cast<LS_IIdentity*>(identity));
@@ -292,51 +265,6 @@ void Registrar::drop(std::map<LS_IIdentity*, Bindings>::iterator entry) {
   removeAll(entry->second);
   reportTransition(entry->second, before);
   m_bindings.erase(entry);
-}
-
-int Registrar::checkCredentials(sip_msg const& message,
-                                LS_IIdentity* identity,
-                                CNameAddr const& to,
-                                Vector<LS_ProtocolRealm> const* realms,
-                                bool& stale) {
-  uint64_t const now = tmr_jiffies();
-  unsigned int looked = 0;
-  int verdict = 0;
-  forEachHeaderValue(message, SIP_HDR_AUTHORIZATION, [&](sip_hdr const& header) {
-    httpauth_digest_resp response;
-    if (++looked > kMaximumAuthorizations)
-      return false;
-    if (httpauth_digest_response_decode(&response, &header.val) != 0 ||
-        response.username.l > kMaximumUserName)
-      return true;
-    LS_AuthenticationProtocol::Type protocol = LS_AuthenticationProtocol::HTTP;
-    if (realms) {
-      auto const realm = std::find_if(realms->begin(), realms->end(), [&](LS_ProtocolRealm const& candidate) {
-        return pl_strcmp(&response.realm, candidate.realm.c_str()) == 0;
-      });
-      if (realm == realms->end())
-        return true;
-      protocol = realm->protocol;
-    }
-    NonceGenerator::Check const check = m_nonces.check(response.nonce, response.realm, now);
-    if (check != NonceGenerator::Check::VALID) {
-      stale = stale || check == NonceGenerator::Check::STALE;
-      return true;
-    }
-    String error;
-    Vector<String> passwords;
-    String const user(response.username.p, response.username.l);
-    String const realm(response.realm.p, response.realm.l);
-    m_clock.measure([&] {
-      LS_getInboundAuthenticationResponse(error, passwords, identity, to, protocol, realm, user, nullptr);
-    });
-    bool const matches = std::any_of(passwords.begin(), passwords.end(), [&](String const& password) {
-      return digestResponseMatches(response, message.met, password.c_str());
-    });
-    verdict = matches ? 1 : -1;
-    return false;
-  });
-  return verdict;
 }
 
 Registrar::Order Registrar::order(Bindings& bindings,

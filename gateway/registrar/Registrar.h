@@ -48,9 +48,8 @@
 //   member. The registrar removes that identity again when its last binding
 //   goes, so that the group answers the user as before. The group's own
 //   name cannot register (403).
-// - A digest response to a nonce this process did not make counts as no
-//   credentials (a fresh 401), one to an expired nonce gets 401 with
-//   stale=true; only a wrong password on a valid nonce gets 403.
+// - Who may register, and with what credentials, is the Authenticator's
+//   to decide; a To that denotes no identity is answered by it too.
 // - Stateless, as RFC 3261 section 10.3 lets a registrar be: nothing is kept
 //   for a request until it is authenticated, and its answer leaves without a
 //   server transaction. A contact whose binding has the request's Call-ID
@@ -80,14 +79,12 @@
 #include "CNameAddr.h"
 #include "LS_IIdentity.h"
 #include "LS_IRegistrationInbound.h"
-#include "LS_ProtocolRealm.h"
 #include "RefPtr.h"
-#include "Vector.h"
 #include "metrics/LibraryClock.h"
+#include "registrar/Authenticator.h"
 #include "registrar/ContactHeader.h"
 #include "registrar/ExpiryRange.h"
 #include "registrar/NatPinger.h"
-#include "registrar/NonceGenerator.h"
 #include "sip/Libre.h"
 #include "store/BindingStore.h"
 
@@ -100,7 +97,7 @@ class Registrar {
 
   static constexpr uint32_t kConnectionWatchSeconds = 4000000;
 
-  explicit Registrar(LibraryClock& clock) : m_clock(clock) { tmr_init(&m_sweep); }
+  explicit Registrar(LibraryClock& clock) : m_clock(clock), m_authenticator(clock) { tmr_init(&m_sweep); }
   ~Registrar();
   Registrar(Registrar const&) = delete;
   Registrar& operator=(Registrar const&) = delete;
@@ -110,6 +107,7 @@ class Registrar {
   // interval (0 for none).
   void start(sip& stack, ExpiryRange const& expiry, uint32_t natPingSeconds);
   void handle(Exchange& exchange);
+  Authenticator& authenticator() { return m_authenticator; }
 
   size_t bindingCount() const { return m_expiries.size(); }
 
@@ -124,7 +122,7 @@ class Registrar {
                std::vector<StoredBinding> const& bindings);
   // The identities holding bindings, as (service, identity) names.
   std::vector<BindingStore::IdentityName> boundIdentities() const;
-  uint64_t failedAuthentications() const { return m_failedAuthentications; }
+  uint64_t failedAuthentications() const { return m_authenticator.failures(); }
   uint64_t bindingsDropped() const { return m_bindingsDropped; }
   // Lets go of the bindings of identities a change removed (counted in
   // bindingsDropped): those listed, or, when checkAll (a whole location
@@ -200,22 +198,6 @@ class Registrar {
   // Drops the identity's table entry when it holds no binding, and a
   // dynamic identity made for it with it.
   void forgetIfUnbound(LS_IIdentity* identity, bool created);
-  // Whether the request carries valid credentials; answers 401 or 403
-  // itself when not. Credentials the library takes for their realm are
-  // accepted before the realms to challenge with are asked for: that list
-  // only matters when they are missing or wrong, and asking for it was the
-  // library's largest cost of an authenticated REGISTER.
-  bool authenticated(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to);
-  // The first Authorization header with a valid nonce checked against the
-  // library's passwords: 1 when one matches, -1 when none does, 0 when
-  // there is no such header. With realms, only a header for one of them
-  // counts; without, any realm, for HTTP digest. stale is set when a
-  // header's nonce has expired.
-  int checkCredentials(sip_msg const& message,
-                       LS_IIdentity* identity,
-                       CNameAddr const& to,
-                       Vector<LS_ProtocolRealm> const* realms,
-                       bool& stale);
   // What the request's CSeq makes of it against the bindings it names (all
   // of them for a wildcard) that carry its Call-ID.
   enum class Order { NEW, RETRANSMITTED, OUT_OF_ORDER };
@@ -278,10 +260,9 @@ class Registrar {
   sip* m_stack = nullptr;
   ExpiryRange m_expiry;
   std::unique_ptr<NatPinger> m_pinger;
-  NonceGenerator m_nonces;
+  Authenticator m_authenticator;
   std::map<LS_IIdentity*, Bindings> m_bindings;
   Expiries m_expiries;
   tmr m_sweep;
-  uint64_t m_failedAuthentications = 0;
   uint64_t m_bindingsDropped = 0;
 };

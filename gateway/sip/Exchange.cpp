@@ -29,7 +29,7 @@ uint64_t toTag(sip_msg const& request) {
 
 }  // namespace
 
-RefPtr<LS_IIdentity> Exchange::resolveOrAnswer(pl const& uri, CNameAddr& nameAddr) {
+RefPtr<LS_IIdentity> Exchange::resolveOrAnswer(pl const& uri, CNameAddr& nameAddr, bool answerNotFound) {
   if (uri.l > kMaximumUriLength || !nameAddr.Parse(uri.p, uri.l)) {
     answer(400, "Bad URI");
     return nullptr;
@@ -43,7 +43,7 @@ RefPtr<LS_IIdentity> Exchange::resolveOrAnswer(pl const& uri, CNameAddr& nameAdd
   m_result = "\"" + error.str() + "\"";
   if (nameAddr.GetUriKind() == CNameAddr::URI_OTHER)
     answer(416, "Unsupported URI Scheme");
-  else
+  else if (answerNotFound)
     answer(404, "Not Found");
   return nullptr;
 }
@@ -54,6 +54,7 @@ void Exchange::answer(uint16_t code, char const* reason, std::string const& head
   // read by nothing but the answer.
   const_cast<sip_msg&>(m_request).tag = toTag(m_request);
   sip_replyf(&m_stack, &m_request, code, reason, "%sContent-Length: 0\r\n\r\n", headers.c_str());
+  m_answered = true;
   m_log.write(m_request, m_result, code);
   m_session.flushDebugLines();
 }

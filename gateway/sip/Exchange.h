@@ -26,10 +26,12 @@ class Exchange {
   LibraryClock& clock() const { return m_clock; }
 
   // The identity that uri (a request URI or a To address, as received)
-  // denotes, recorded for the log line; nameAddr receives the parsed URI. Null when there is none, and then
-  // already answered: 400 for no name-addr, 416 for a scheme the library
-  // refuses, else 404.
-  RefPtr<LS_IIdentity> resolveOrAnswer(pl const& uri, CNameAddr& nameAddr);
+  // denotes, recorded for the log line; nameAddr receives the parsed URI.
+  // Null when there is none, and then answered: 400 for no name-addr, 416
+  // for a scheme the library refuses, else 404 unless answerNotFound is
+  // false (see answered()).
+  RefPtr<LS_IIdentity> resolveOrAnswer(pl const& uri, CNameAddr& nameAddr, bool answerNotFound = true);
+  bool answered() const { return m_answered; }
 
   // What the log line says about the lookup, for a part that looked
   // without resolveOrAnswer: "service/identity" or the error text in quotes.
@@ -54,4 +56,5 @@ class Exchange {
   RequestLog& m_log;
   LibraryClock& m_clock;
   std::string m_result = "-";
+  bool m_answered = false;
 };

@@ -13,6 +13,19 @@ void writeToken(pl const& token) {
   }
 }
 
+// The Request-URI, with the password of a "user:password@" part masked:
+// RFC 3261 advises against one, which does not keep a phone from sending it.
+void writeUri(sip_msg const& request) {
+  pl const& password = request.uri.password;
+  if (!pl_isset(&password) || password.p < request.ruri.p ||
+      password.p + password.l > request.ruri.p + request.ruri.l)
+    return writeToken(request.ruri);
+  writeToken(pl{request.ruri.p, static_cast<size_t>(password.p - request.ruri.p)});
+  std::fputs("****", stdout);
+  char const* const rest = password.p + password.l;
+  writeToken(pl{rest, static_cast<size_t>(request.ruri.p + request.ruri.l - rest)});
+}
+
 }  // namespace
 
 RequestLog::~RequestLog() {
@@ -29,7 +42,7 @@ void RequestLog::write(sip_msg const& request, std::string const& result, uint16
   m_answers.count(request.met, code);
   writeToken(request.met);
   std::putchar(' ');
-  writeToken(request.ruri);
+  writeUri(request);
   std::printf(" %s %u\n", result.c_str(), static_cast<unsigned int>(code));
   if (!tmr_isrunning(&m_flush))
     tmr_start(&m_flush, kFlushMs, onFlush, this);

@@ -1,7 +1,8 @@
 // RequestLog: the one line on standard output for each request the gateway
 // answers, "METHOD REQUEST-URI RESULT CODE". RESULT is the identity found
 // ("service/identity"), the library's error text in double quotes, or "-"
-// when no identity was looked up.
+// when no identity was looked up. A password in the Request-URI's user
+// part ("sip:alice:secret@host") is written as ****.
 //
 // Decision: the lines go through stdio's buffer and are flushed kFlushMs
 // after the first line that found it empty, and when the log dies, rather

@@ -67,6 +67,7 @@ bool SipFrontEnd::start(Settings const& settings, std::string& error) {
       m_session.stack().localHostPorts.add(own);
   }
   m_trunks = std::make_unique<TrunkRegistrations>(*m_stack, m_session, m_clock);
+  m_trunks->useCaFile(m_caFile);
   m_trunks->start();
   return true;
 }
@@ -123,7 +124,13 @@ bool SipFrontEnd::onRequest(sip_msg const* request, void* argument) {
     return true;
   if (message.tp == SIP_TRANSP_UDP)
     frontEnd.enlarge(message.sock);
+  if (frontEnd.m_rateLimit && !frontEnd.m_rateLimit->admit(*frontEnd.m_stack, message))
+    return true;
   Exchange exchange(*frontEnd.m_stack, message, frontEnd.m_session, frontEnd.m_log, frontEnd.m_clock);
+  if (SecureTransports::sipsOverPlainTransport(message)) {
+    exchange.answer(416, "Unsupported URI Scheme");
+    return true;
+  }
   if (frontEnd.m_admission.answered(exchange))
     return true;
   if (pl_strcmp(&message.met, "REGISTER") == 0) {

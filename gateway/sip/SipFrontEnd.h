@@ -28,6 +28,8 @@
 #include "sip/Libre.h"
 #include "sip/Listeners.h"
 #include "sip/RequestLog.h"
+#include "sip/SecureTransports.h"
+#include "sip/SourceRateLimit.h"
 #include "trunks/TrunkRegistrations.h"
 
 class SipFrontEnd {
@@ -56,11 +58,24 @@ class SipFrontEnd {
   // What start() opened: "udp:ADDR:PORT tcp:ADDR:PORT ...".
   std::string listening() const { return m_listeners.describe(); }
   std::vector<std::string> const& dnsServers() const { return m_dns.servers(); }
+  // After start(): TLS, WebSocket and secure WebSocket as options ask, each
+  // bound one as "tls:ADDR:PORT" (and so on) in bound, else an error text.
+  bool startSecure(SecureTransportOptions const& options,
+                   std::vector<std::string>& bound,
+                   std::string& error) {
+    return m_secure.add(*m_stack, options, bound, error);
+  }
   // Unregisters the trunks and lets the stack finish, at most kShutDownMs.
   void shutDown();
 
   unsigned long requests() const { return m_log.requests(); }
   Registrar& registrar() { return m_registrar; }
+  Redirector& redirector() { return m_redirector; }
+  // --ca-file: what a TLS trunk's carrier is verified against; before start().
+  void trustForTrunks(std::string const& caFile) { m_caFile = caFile; }
+  // --source-rate: more than perSecond requests a second from one address
+  // are refused (SourceRateLimit); off unless called.
+  void limitSourceRate(uint32_t perSecond) { m_rateLimit = std::make_unique<SourceRateLimit>(perSecond); }
 
   // Makes the gateway ready for changes while it serves (--control): from
   // then on it observes every identity, which a gateway never changed
@@ -92,9 +107,12 @@ class SipFrontEnd {
   DnsClient m_dns;
   Listeners m_listeners;
   Admission m_admission;
+  SecureTransports m_secure;
   sip* m_stack = nullptr;
   sip_lsnr* m_listener = nullptr;
   std::unique_ptr<TrunkRegistrations> m_trunks;
   std::unique_ptr<ModelChanges> m_changes;
   std::vector<void*> m_enlarged;  // the UDP sockets enlarge() has seen
+  std::unique_ptr<SourceRateLimit> m_rateLimit;
+  std::string m_caFile;
 };

@@ -154,8 +154,14 @@ std::unique_ptr<TrunkRegistrations::Trunk> TrunkRegistrations::findTrunk(LS_IIde
   trunk->face = face;
   trunk->path = path;
   trunk->user = identity->getName().str();
-  char const* const scheme = face->getUriScheme() == LS_UriScheme::SIPS ? "sips:" : "sip:";
-  trunk->registrarUri = scheme + hostPortText(registrar);
+  bool const secure = face->getUriScheme() == LS_UriScheme::SIPS || !tlsRegistrar.GetHost().isEmpty();
+  if (!tlsRegistrar.GetHost().isEmpty())
+    registrar = tlsRegistrar;
+  // libre's requests take sip: URIs only: TLS is asked for with
+  // transport=tls, which libre then uses for the hop.
+  char const* const scheme = secure ? "sips:" : "sip:";
+  std::string const transport = secure ? ";transport=tls" : "";
+  trunk->registrarUri = "sip:" + hostPortText(registrar) + transport;
   trunk->nextHop = registrar.GetHost().c_str();
   trunk->addressOfRecord = scheme + trunk->user + "@" + registrar.GetHost().c_str();
   trunk->lifetime = face->getLifetime();
@@ -166,9 +172,13 @@ std::unique_ptr<TrunkRegistrations::Trunk> TrunkRegistrations::findTrunk(LS_IIde
   bool strictRoute = false;
   if (outbound && outbound->getNumberOfProxies() != 0 &&
       outbound->getProxy(0, proxy, tlsProxy, strictRoute).isSuccess() && !proxy.GetHost().isEmpty()) {
-    trunk->route = scheme + hostPortText(proxy);
+    if (secure && !tlsProxy.GetHost().isEmpty())
+      proxy = tlsProxy;
+    trunk->route = "sip:" + hostPortText(proxy) + transport;
     trunk->nextHop = proxy.GetHost().c_str();
   }
+  if (secure)
+    trunk->tlsHost = trunk->nextHop;
   tmr_init(&trunk->timer);
   trunk->keepAlive = std::make_unique<TrunkKeepAlive>(m_stack, onKeepAliveFailed, trunk.get());
   return trunk;
@@ -176,17 +186,21 @@ std::unique_ptr<TrunkRegistrations::Trunk> TrunkRegistrations::findTrunk(LS_IIde
 
 void TrunkRegistrations::registerTrunk(Trunk& trunk) {
   char const* routes[] = {trunk.route.c_str()};
+  std::string tlsError;
   int const error =
-      sipreg_register(&trunk.registration, &m_stack, trunk.registrarUri.c_str(),
-                      trunk.addressOfRecord.c_str(), nullptr, trunk.addressOfRecord.c_str(), trunk.lifetime,
-                      trunk.user.c_str(), trunk.route.empty() ? nullptr : routes, trunk.route.empty() ? 0 : 1,
-                      0, onChallenge, &trunk, false, onResponse, &trunk, nullptr, nullptr);
+      !trunk.tlsHost.empty() && !m_tls.verify(m_stack, trunk.tlsHost, m_caFile, tlsError)
+          ? EPROTO
+          : sipreg_register(&trunk.registration, &m_stack, trunk.registrarUri.c_str(),
+                            trunk.addressOfRecord.c_str(), nullptr, trunk.addressOfRecord.c_str(),
+                            trunk.lifetime, trunk.user.c_str(), trunk.route.empty() ? nullptr : routes,
+                            trunk.route.empty() ? 0 : 1, 0, onChallenge, &trunk, false, onResponse, &trunk,
+                            nullptr, nullptr);
   if (error == 0)
     return;
   unsigned int const seconds = m_clock.measure([&] { return trunk.face->getRetryTimeoutOnSystemError(); });
   reportFailure(trunk,
                 "trunk " + trunk.path + " cannot register at " + trunk.registrarUri + ": " +
-                    failureCause(error, trunk.nextHop),
+                    (tlsError.empty() ? failureCause(error, trunk.nextHop) : tlsError),
                 seconds);
   trunk.retryMs = uint64_t{seconds} * 1000;
   tmr_start(&trunk.timer, trunk.retryMs, onRetry, &trunk);

@@ -8,6 +8,11 @@
 // library's outbound credentials for the challenge's realm; sipreg refreshes a
 // registration before it expires.
 //
+// A trunk registers over TLS when its face's URI scheme is sips or the face
+// names a TLS registrar (which then takes the place of the plain one); its
+// proxy is then reached over TLS too, and the carrier's certificate is
+// verified (TrunkTls, against --ca-file when given).
+//
 // On failure the registration is dropped and made anew after the face's
 // retry timeout for that class of error: system (no answer, transport
 // failure), server (5xx) or client (any other final failure, 4xx and 6xx),
@@ -51,6 +56,7 @@
 #include "metrics/LibraryClock.h"
 #include "sip/Libre.h"
 #include "trunks/TrunkKeepAlive.h"
+#include "trunks/TrunkTls.h"
 
 class TrunkRegistrations {
  public:
@@ -60,6 +66,9 @@ class TrunkRegistrations {
   TrunkRegistrations(TrunkRegistrations const&) = delete;
   TrunkRegistrations& operator=(TrunkRegistrations const&) = delete;
 
+  // The CA certificates a TLS carrier is verified against instead of the
+  // system's; before start().
+  void useCaFile(std::string const& file) { m_caFile = file; }
   void start();
   void follow(std::vector<RefPtr<LS_IIdentity>> const& touched,
               std::vector<LS_IIdentity const*> const& removed);
@@ -89,6 +98,9 @@ class TrunkRegistrations {
     std::string nextHop;
     // The last failure reported, empty once registered.
     std::string lastFailure;
+    // The host whose certificate a TLS registration verifies; empty when
+    // the trunk registers over a plain transport.
+    std::string tlsHost;
     uint32_t lifetime;
     sipreg* registration = nullptr;
     bool registered = false;
@@ -126,4 +138,6 @@ class TrunkRegistrations {
   // the unregistration is answered, and may still ask its challenge
   // handler for credentials with the trunk as argument.
   std::vector<std::unique_ptr<Trunk>> m_retired;
+  std::string m_caFile;
+  TrunkTls m_tls;
 };

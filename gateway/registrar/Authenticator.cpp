@@ -1,0 +1,247 @@
+#include "registrar/Authenticator.h"
+
+#include <algorithm>
+#include <iostream>
+
+#include "LS_CredentialLookup.h"
+#include "LS_ILocationService.h"
+#include "LS_IRegistrationInbound.h"
+#include "LS_IdentityResolution.h"
+#include "LS_ServiceResolution.h"
+#include "sip/Exchange.h"
+
+namespace {
+
+// Authorization headers looked at per request, and the longest user name
+// passed to the library: more is an attack, not a phone.
+constexpr unsigned int kMaximumAuthorizations = 8;
+constexpr size_t kMaximumUserName = 256;
+
+template <class Visit>
+void forEachHeader(sip_msg const& message, sip_hdrid id, Visit visit) {
+  for (le const* entry = list_head(&message.hdrl); entry; entry = entry->next) {
+    sip_hdr const* header = static_cast<sip_hdr const*>(entry->data);
+    if (header->id == id && !visit(*header))
+      return;
+  }
+}
+
+// What a REGISTER would change, digested: a retransmission has the same, a
+// replay with another Contact, CSeq, To or Expires does not.
+uint64_t fingerprintOf(sip_msg const& message) {
+  uint64_t hash = 14695981039346656037ull;
+  auto mix = [&](char const* bytes, size_t length) {
+    for (size_t i = 0; i < length; ++i) {
+      hash ^= static_cast<unsigned char>(bytes[i]);
+      hash *= 1099511628211ull;
+    }
+    hash ^= 0x100;  // a field's end
+    hash *= 1099511628211ull;
+  };
+  mix(message.to.auri.p, message.to.auri.l);
+  uint32_t const cseq = message.cseq.num;
+  mix(reinterpret_cast<char const*>(&cseq), sizeof cseq);
+  mix(message.expires.p, message.expires.l);
+  forEachHeader(message, SIP_HDR_CONTACT, [&](sip_hdr const& header) {
+    mix(header.val.p, header.val.l);
+    return true;
+  });
+  return hash;
+}
+
+// A user name from the network as a log line may show it: no line breaks
+// or quotes that could forge another line or field.
+std::string printable(pl const& text) {
+  std::string result;
+  for (size_t i = 0; i < text.l && i < kMaximumUserName; ++i) {
+    unsigned char const c = static_cast<unsigned char>(text.p[i]);
+    result += c < 0x20 || c == 0x7f || c == '"' || c == '\\' ? '?' : static_cast<char>(c);
+  }
+  return result;
+}
+
+std::string addressOf(sa const& source) {
+  char text[64];
+  re_snprintf(text, sizeof text, "%j port %u", &source, static_cast<unsigned int>(sa_port(&source)));
+  return text;
+}
+
+}  // namespace
+
+Authenticator::Authenticator(LibraryClock& clock) : m_clock(clock) {}
+
+bool Authenticator::refuseHeldSource(Exchange& exchange) {
+  if (!m_failingSources.held(exchange.request().src, tmr_jiffies()))
+    return false;
+  exchange.answer(403, "Forbidden");
+  return true;
+}
+
+bool Authenticator::admit(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to) {
+  String error;
+  Outcome const quick = evaluate(exchange.request(), nullptr, [&](String const& realm, String const& user) {
+    Vector<String> passwords;
+    m_clock.measure([&] {
+      LS_getInboundAuthenticationResponse(error, passwords, identity, to, LS_AuthenticationProtocol::HTTP,
+                                          realm, user, nullptr);
+    });
+    return passwords;
+  });
+  if (quick.accepted)
+    return true;
+  Vector<LS_ProtocolRealm> realms;
+  m_clock.measure([&] { LS_getInboundAuthenticationChallenge(error, realms, identity, nullptr); });
+  if (realms.isEmpty()) {
+    RefPtr<LS_IRegistrationInbound> face;
+    m_clock.measure([&] { LS_getFaceIf(identity, LS_IdentityFace::REGISTRATION_INBOUND, face); });
+    if (face)
+      return true;
+    exchange.answer(403, "Forbidden");
+    return false;
+  }
+  std::vector<std::string> names;
+  for (LS_ProtocolRealm const& realm : realms)
+    names.push_back(realm.realm.str());
+  RefPtr<LS_ILocationService> service;
+  m_clock.measure([&] {
+    adoptInterface(service,
+                   [&](UUID const& iid, void** raw) { return identity->getLocationServiceIf(iid, raw); });
+  });
+  if (service && m_realmsByService.count(service.get()) == 0)
+    m_realmsByService.emplace(service.get(), names);
+  return check(exchange, names, [&](String const& realm, String const& user) {
+    Vector<String> passwords;
+    auto const found = std::find_if(realms.begin(), realms.end(), [&](LS_ProtocolRealm const& candidate) {
+      return candidate.realm == realm;
+    });
+    if (found == realms.end())
+      return passwords;
+    m_clock.measure([&] {
+      LS_getInboundAuthenticationResponse(error, passwords, identity, to, found->protocol, realm, user,
+                                          nullptr);
+    });
+    return passwords;
+  });
+}
+
+void Authenticator::refuseUnknown(Exchange& exchange, CNameAddr const& to) {
+  ScriptSession::StackSettings const& stack = exchange.session().stack();
+  String error;
+  String user;
+  CHostPort host;
+  RefPtr<LS_ILocationService> service;
+  m_clock.measure([&] {
+    if (LS_splitNameAddr(error, user, host, to).isFailure())
+      return;
+    if (stack.services.isEmpty())
+      LS_getLocationService(error, service, host, stack.localHostPorts, stack.imperative,
+                            exchange.session().locationMaster());
+    else
+      LS_getLocationService(error, service, host, stack.services, stack.localHostPorts, stack.imperative,
+                            exchange.session().locationMaster());
+  });
+  if (!service)
+    return exchange.answer(404, "Not Found");
+  auto const known = m_realmsByService.find(service.get());
+  std::vector<std::string> const realms =
+      known != m_realmsByService.end() ? known->second : std::vector<std::string>{host.GetHost().c_str()};
+  check(exchange, realms, [](String const&, String const&) { return Vector<String>(); });
+}
+
+Authenticator::Outcome Authenticator::evaluate(sip_msg const& message,
+                                               std::vector<std::string> const* realms,
+                                               Passwords const& passwordsOf) {
+  uint64_t const now = tmr_jiffies();
+  unsigned int looked = 0;
+  Outcome outcome;
+  forEachHeader(message, SIP_HDR_AUTHORIZATION, [&](sip_hdr const& header) {
+    if (++looked > kMaximumAuthorizations)
+      return false;
+    DigestResponse response;
+    if (!decodeDigestResponse(header.val, response) || response.fields.username.l > kMaximumUserName)
+      return true;
+    httpauth_digest_resp const& fields = response.fields;
+    if (realms && std::none_of(realms->begin(), realms->end(), [&](std::string const& candidate) {
+          return pl_strcmp(&fields.realm, candidate.c_str()) == 0;
+        }))
+      return true;
+    switch (m_nonces.check(fields.nonce, fields.realm, message.callid, now)) {
+      case NonceGenerator::Check::UNKNOWN:
+        return true;
+      case NonceGenerator::Check::STALE:
+        outcome.stale = true;
+        return true;
+      case NonceGenerator::Check::VALID:
+        break;
+    }
+    outcome.user = fields.username;
+    if (pl_cmp(&fields.uri, &message.ruri) != 0) {
+      outcome.failure = "digest uri is not the request URI";
+      return false;
+    }
+    Vector<String> const passwords =
+        passwordsOf(String(fields.realm.p, fields.realm.l), String(fields.username.p, fields.username.l));
+    bool const matches = std::any_of(passwords.begin(), passwords.end(), [&](String const& password) {
+      return m_digest.matches(response, message.met, password.c_str());
+    });
+    if (!matches) {
+      outcome.failure = "wrong user or password";
+      return false;
+    }
+    uint32_t const count = pl_isset(&fields.qop) ? pl_x32(&fields.nc) : 0;
+    if (pl_isset(&fields.qop) && count == 0) {
+      outcome.failure = "no nonce-count";
+      return false;
+    }
+    switch (m_used.use(fields.nonce, NonceGenerator::madeAt(fields.nonce), count, fingerprintOf(message))) {
+      case NonceTable::Use::FORGOTTEN:
+      case NonceTable::Use::REPLAYED:
+        outcome.stale = true;
+        return true;
+      case NonceTable::Use::FIRST_OR_NEWER:
+      case NonceTable::Use::REPEATED:
+        outcome.accepted = true;
+        return false;
+    }
+    return false;
+  });
+  return outcome;
+}
+
+bool Authenticator::check(Exchange& exchange,
+                          std::vector<std::string> const& realms,
+                          Passwords const& passwordsOf) {
+  Outcome const outcome = evaluate(exchange.request(), &realms, passwordsOf);
+  if (outcome.accepted)
+    return true;
+  if (outcome.failure) {
+    fail(exchange, outcome.user, outcome.failure);
+    return false;
+  }
+  challenge(exchange, realms, outcome.stale);
+  return false;
+}
+
+void Authenticator::challenge(Exchange& exchange, std::vector<std::string> const& realms, bool stale) {
+  uint64_t const now = tmr_jiffies();
+  std::string challenges;
+  for (std::string const& realm : realms) {
+    pl name;
+    pl_set_str(&name, realm.c_str());
+    std::string const nonce = m_nonces.make(name, exchange.request().callid, now);
+    for (DigestAlgorithm algorithm : m_offered)
+      challenges += "WWW-Authenticate: " + digestChallenge(name, nonce, algorithm, stale) + "\r\n";
+  }
+  exchange.answer(401, "Unauthorized", challenges);
+}
+
+void Authenticator::fail(Exchange& exchange, pl const& user, char const* reason) {
+  ++m_failures;
+  sa const& source = exchange.request().src;
+  std::cerr << "location-gateway: authentication failed for \"" << printable(user) << "\" from "
+            << addressOf(source) << ": " << reason << std::endl;
+  if (m_failingSources.count(source, tmr_jiffies()) == SourceThrottle::Verdict::HELD_NOW)
+    std::cerr << "location-gateway: " << addressOf(source) << " refused for " << kFailureHoldMs / 1000
+              << " s after " << kFailureLimit << " failed authentications" << std::endl;
+  exchange.answer(403, "Forbidden");
+}

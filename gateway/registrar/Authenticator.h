@@ -1,0 +1,128 @@
+// Authenticator: whether a REGISTER may change the bindings of the identity
+// its To names, answering 401 or 403 itself when not. The library says which
+// realms an identity is challenged in and which passwords answer them; the
+// digest arithmetic is DigestAuthentication's, the nonces NonceGenerator's
+// and NonceTable's. Nothing here touches a binding.
+//
+// Decisions, with their reasons:
+// - Credentials the library takes for the realm they name (HTTP digest) are
+//   accepted before the realms to challenge with are asked for: that list
+//   only matters when credentials are missing or wrong, and asking for it
+//   was the library's largest cost of an authenticated REGISTER. Such a
+//   password can only come from the identity's own inbound authentication,
+//   so an identity accepted that way is a challenged one.
+// - An identity the library does not challenge registers only when it or
+//   its group has an inbound-registration face (configured, or dynamic from
+//   an earlier registration that passed this same test); any other gets 403.
+//   Otherwise an identity configured only to register a trunk upstream would
+//   take anyone's unauthenticated REGISTER, and its calls would go to them.
+// - A user of a served domain that no identity answers gets the challenge a
+//   known user of that location service got last (the realms of the first
+//   challenged identity seen there; before any, the domain's host name),
+//   and whatever it answers with is a failed authentication (403): a 404
+//   before any challenge would tell who exists. A domain served by no
+//   location service still gets 404: that says nothing about users.
+// - Each challenge offers SHA-256 first and MD5 second for every realm, one
+//   nonce per realm shared by both (RFC 8760): a phone takes the first it
+//   implements. Some phones take the first challenge whatever it is, and
+//   fail on SHA-256 (SIPp 3.6 among them): offerAlgorithms() changes what
+//   is offered, never what is accepted.
+// - The digest uri must be the Request-URI, byte for byte (RFC 3261 section
+//   22.4, RFC 7616 section 3.4.6): a response computed for another URI is a
+//   failed authentication.
+// - A nonce is bound to the realm and the Call-ID (NonceGenerator) and used
+//   at most once per nonce-count (NonceTable). A nonce used again, or one
+//   the table no longer remembers, gets 401 with stale=true, like an expired
+//   one, as Kamailio answers a nonce-count that did not increase: a replay
+//   gains nothing from it, and a phone that reuses its nonce carelessly
+//   gets a fresh one instead of a refusal its user would have to clear.
+//   Such a request is not a failed authentication: the password was right.
+// - A failed authentication (wrong password or user, a digest over another
+//   URI) gets 403 and one line on standard error naming the user and the
+//   source address, for an operator's fail2ban; a source with kFailureLimit
+//   of them within kFailureWindowMs is then refused with 403 for
+//   kFailureHoldMs without any lookup (one more line when that starts).
+//
+// Owned by the Registrar; everything runs on libre's thread.
+#pragma once
+
+#include <functional>
+#include <map>
+#include <string>
+#include <vector>
+
+#include "CNameAddr.h"
+#include "LS_IIdentity.h"
+#include "String.h"
+#include "Vector.h"
+#include "metrics/LibraryClock.h"
+#include "registrar/DigestAuthentication.h"
+#include "registrar/NonceGenerator.h"
+#include "registrar/NonceTable.h"
+#include "sip/Libre.h"
+#include "sip/SourceThrottle.h"
+
+class Exchange;
+
+class Authenticator {
+ public:
+  // 16 K nonces of 32 bytes: half a megabyte, a few seconds of a storm of
+  // new registrations before a phone's own nonce could be pushed out.
+  static constexpr size_t kNonceCapacity = 16 * 1024;
+  static constexpr uint32_t kFailureLimit = 10;
+  static constexpr uint64_t kFailureWindowMs = 60 * 1000;
+  static constexpr uint64_t kFailureHoldMs = 60 * 1000;
+  static constexpr size_t kFailureSources = 1024;
+
+  explicit Authenticator(LibraryClock& clock);
+
+  // What each challenge offers per realm, in this order; not empty.
+  void offerAlgorithms(std::vector<DigestAlgorithm> const& algorithms) { m_offered = algorithms; }
+
+  // Failed authentications answered so far (for the statistics).
+  uint64_t failures() const { return m_failures; }
+
+  // True, after answering 403, when the request's source is held.
+  bool refuseHeldSource(Exchange& exchange);
+  // Whether identity, which to denotes, may register with this request.
+  bool admit(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to);
+  // Answers a REGISTER whose To (to, parsed) denotes no identity.
+  void refuseUnknown(Exchange& exchange, CNameAddr const& to);
+
+ private:
+  // The passwords that answer the realm for the user.
+  using Passwords = std::function<Vector<String>(String const& realm, String const& user)>;
+  // What the request's Authorization headers come to.
+  struct Outcome {
+    bool accepted = false;
+    bool stale = false;             // a nonce expired, used or forgotten
+    char const* failure = nullptr;  // why a failed authentication failed
+    pl user{};                      // whose it was
+  };
+
+  // The first Authorization header with an authentic nonce for one of the
+  // realms (for any realm when realms is null) checked, and its nonce used
+  // when it passes. Answers nothing, logs nothing: a request may be
+  // evaluated again with the realms after failing without them.
+  Outcome evaluate(sip_msg const& message,
+                   std::vector<std::string> const* realms,
+                   Passwords const& passwordsOf);
+  // The evaluation against realms, answering 401 or 403 when it does not pass.
+  bool check(Exchange& exchange, std::vector<std::string> const& realms, Passwords const& passwords);
+  void challenge(Exchange& exchange, std::vector<std::string> const& realms, bool stale);
+  void fail(Exchange& exchange, pl const& user, char const* reason);
+
+  LibraryClock& m_clock;
+  uint64_t m_failures = 0;
+  std::vector<DigestAlgorithm> m_offered{DigestAlgorithm::SHA256, DigestAlgorithm::MD5};
+  NonceGenerator m_nonces;
+  NonceTable m_used{kNonceCapacity};
+  DigestAuthentication m_digest;
+  // The throttle passes its limit and holds at the next one.
+  SourceThrottle m_failingSources{kFailureLimit - 1, kFailureWindowMs, kFailureHoldMs, kFailureSources};
+  // The realms the first challenged identity of each location service was
+  // challenged in: as many entries as services configured. The key is only
+  // compared, never followed: a service removed and another made at its
+  // address would only lend the new one its realms.
+  std::map<void const*, std::vector<std::string>> m_realmsByService;
+};

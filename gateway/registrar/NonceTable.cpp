@@ -1,0 +1,53 @@
+#include "registrar/NonceTable.h"
+
+namespace {
+
+// FNV-1a, 64 bits on every platform: two nonces sharing a key would make
+// the second look like a replay of the first.
+uint64_t keyOf(pl const& nonce) {
+  uint64_t hash = 14695981039346656037ull;
+  for (size_t i = 0; i < nonce.l; ++i) {
+    hash ^= static_cast<unsigned char>(nonce.p[i]);
+    hash *= 1099511628211ull;
+  }
+  return hash;
+}
+
+}  // namespace
+
+NonceTable::NonceTable(size_t capacity) : m_buckets(capacity / kWays + (capacity % kWays != 0 ? 1 : 0)) {
+  if (m_buckets.empty())
+    m_buckets.resize(1);
+}
+
+NonceTable::Use NonceTable::use(pl const& nonce, uint64_t madeMs, uint32_t count, uint64_t fingerprint) {
+  uint64_t const key = keyOf(nonce);
+  Bucket& bucket = m_buckets[static_cast<size_t>(key % m_buckets.size())];
+  // A free entry, else the one made earliest.
+  Entry* victim = &bucket.entries[0];
+  for (Entry& entry : bucket.entries) {
+    if (entry.occupied && entry.key == key) {
+      if (count == entry.count && fingerprint == entry.fingerprint)
+        return Use::REPEATED;
+      if (count <= entry.count)
+        return Use::REPLAYED;
+      entry.count = count;
+      entry.fingerprint = fingerprint;
+      return Use::FIRST_OR_NEWER;
+    }
+    if (victim->occupied && (!entry.occupied || entry.madeMs < victim->madeMs))
+      victim = &entry;
+  }
+  if (bucket.evicted && madeMs <= bucket.floorMs)
+    return Use::FORGOTTEN;
+  if (victim->occupied) {
+    bucket.floorMs = bucket.evicted && bucket.floorMs > victim->madeMs ? bucket.floorMs : victim->madeMs;
+    bucket.evicted = true;
+  }
+  victim->key = key;
+  victim->madeMs = madeMs;
+  victim->count = count;
+  victim->fingerprint = fingerprint;
+  victim->occupied = true;
+  return Use::FIRST_OR_NEWER;
+}

@@ -1,0 +1,166 @@
+#!/usr/bin/python3
+"""End to end: who may register at the gateway, with which digest, and that a
+captured registration cannot be used again.
+
+    authentication.py GATEWAY WORK-DIR [EMULATOR...]
+
+The phone is sipphone.Phone (SIPp cannot do these cases: see there).
+"""
+
+import os
+import re
+import sys
+
+sys.path.insert(0, os.path.join(os.path.dirname(os.path.abspath(__file__)), ".."))
+from sipphone import Failure, Gateway, Phone, authorization, check, run  # noqa: E402
+
+HERE = os.path.dirname(os.path.abspath(__file__))
+SCRIPTS = [os.path.join(HERE, "subscribers.script"), os.path.join(HERE, "security.script")]
+PASSWORDS = ["secret", "welcome", "erin-password", "topsecret"]
+# The README's fail2ban filter.
+FAIL2BAN = re.compile(r'^location-gateway: authentication failed for ".*" from (?P<host>\S+) port \d+', re.M)
+
+
+def register(phone, to, call_id, cseq, contact=None, auth=None, uri="sip:example.com"):
+    headers = []
+    if contact:
+        headers += ["Contact: <%s>" % contact, "Expires: 300"]
+    if auth:
+        headers.append(auth)
+    return phone.build("REGISTER", uri, to, call_id, cseq, headers)
+
+
+def sha256_registration_cannot_be_replayed(program, work, emulator):
+    gateway = Gateway(program, emulator, work, "replay", SCRIPTS, ["--debug"])
+    try:
+        phone = Phone(gateway.port)
+        alice = "sip:alice@example.com"
+        call_id = phone.new_call_id()
+        first = phone.send(register(phone, alice, call_id, 1, "sip:alice@192.0.2.1"))
+        check(first.status == 401, "no challenge: %d" % first.status)
+        challenges = first.challenges()
+        check([c[2] for c in challenges] == ["SHA-256", "MD5"], "challenges offered: %r" % challenges)
+        auth = authorization(challenges[0], "REGISTER", "sip:example.com", "alice", "secret")
+        accepted = register(phone, alice, call_id, 2, "sip:alice@192.0.2.1", auth)
+        check(phone.send(accepted).status == 200, "SHA-256 response refused")
+        check(phone.send(accepted).status == 200, "a retransmission refused")
+        # The captured header with the attacker's Contact: same CSeq, then a
+        # higher one; and on another registration (Call-ID).
+        for cseq in (2, 3):
+            replay = phone.send(register(phone, alice, call_id, cseq, "sip:mallory@203.0.113.66", auth))
+            check(replay.status == 401 and all(c[3] for c in replay.challenges()),
+                  "replay with CSeq %d answered %d %r" % (cseq, replay.status, replay.challenges()))
+        other = phone.send(register(phone, alice, phone.new_call_id(), 1, "sip:mallory@203.0.113.66", auth))
+        check(other.status == 401, "nonce taken to another Call-ID: %d" % other.status)
+        where = phone.send(phone.build("MESSAGE", alice, alice, phone.new_call_id(), 1))
+        check(where.status == 302 and [c.split(">")[0] for c in where.all("Contact")] == ["<sip:alice@192.0.2.1"],
+              "binding changed: %d %r" % (where.status, where.all("Contact")))
+        # The phone's own next request: a higher nonce-count passes, and so
+        # does MD5.
+        auth2 = authorization(challenges[0], "REGISTER", "sip:example.com", "alice", "secret", nc=2)
+        check(phone.send(register(phone, alice, call_id, 4, "sip:alice@192.0.2.1", auth2)).status == 200,
+              "a higher nonce-count refused")
+        carol = "sip:carol@example.com"
+        carol_call = phone.new_call_id()
+        md5 = phone.send(register(phone, carol, carol_call, 1, "sip:carol@192.0.2.3")).challenges()[1]
+        auth = authorization(md5, "REGISTER", "sip:example.com", "carol", "welcome")
+        check(phone.send(register(phone, carol, carol_call, 2, "sip:carol@192.0.2.3", auth)).status == 200,
+              "MD5 response refused")
+        # A password in a Request-URI, as RFC 3261 advises against.
+        phone.send(phone.build("MESSAGE", "sip:alice:topsecret@example.com", alice, phone.new_call_id(), 1))
+        phone.close()
+        gateway.stop()
+        printed = gateway.output() + gateway.errors()
+        check("sip:alice:****@example.com" in printed, "the request log lost the masked URI")
+        check("debug: " in printed, "--debug printed no debug line")
+        for secret in PASSWORDS:
+            check(secret not in printed, "the output shows the password " + secret)
+        check("response=" not in printed, "the output shows an Authorization")
+    finally:
+        gateway.kill()
+
+
+def digest_over_another_uri_refused_and_logged(program, work, emulator):
+    gateway = Gateway(program, emulator, work, "uri", SCRIPTS)
+    try:
+        phone = Phone(gateway.port)
+        alice = "sip:alice@example.com"
+        call_id = phone.new_call_id()
+        challenge = phone.send(register(phone, alice, call_id, 1, "sip:alice@192.0.2.1")).challenges()[0]
+        auth = authorization(challenge, "REGISTER", "sip:other.example", "alice", "secret")
+        answer = phone.send(register(phone, alice, call_id, 2, "sip:alice@192.0.2.1", auth))
+        check(answer.status == 403, "a digest over another URI answered %d" % answer.status)
+        phone.close()
+        gateway.stop()
+        lines = FAIL2BAN.findall(gateway.errors())
+        check(lines == ["127.0.0.1"], "fail2ban's filter found %r in %r" % (lines, gateway.errors()))
+        check('"alice"' in gateway.errors(), "the failure does not name the user")
+    finally:
+        gateway.kill()
+
+
+def only_challenged_or_registering_identities_register(program, work, emulator):
+    gateway = Gateway(program, emulator, work, "who", SCRIPTS)
+    try:
+        phone = Phone(gateway.port)
+        trunk = phone.send(register(phone, "sip:trunk@example.com", phone.new_call_id(), 1, "sip:x@203.0.113.66"))
+        check(trunk.status == 403, "a trunk-only identity answered REGISTER with %d" % trunk.status)
+        # A known and an unknown user of a domain without a "DEFAULT" group.
+        answers = {}
+        for user in ("erin", "zed"):
+            call_id = phone.new_call_id()
+            to = "sip:%s@other.example" % user
+            first = phone.send(register(phone, to, call_id, 1, "sip:x@192.0.2.5", uri="sip:other.example"))
+            answers[user] = (first.status, [(c[0], c[2], c[3]) for c in first.challenges()])
+            auth = authorization(first.challenges()[0], "REGISTER", "sip:other.example", user, "erin-password")
+            second = phone.send(register(phone, to, call_id, 2, "sip:x@192.0.2.5", auth, uri="sip:other.example"))
+            check(second.status == (200 if user == "erin" else 403),
+                  "%s answered with credentials: %d" % (user, second.status))
+        check(answers["erin"] == answers["zed"] and answers["erin"][0] == 401,
+              "known and unknown users answered differently: %r" % answers)
+        elsewhere = phone.send(register(phone, "sip:zed@elsewhere.org", phone.new_call_id(), 1,
+                                        uri="sip:elsewhere.org"))
+        check(elsewhere.status == 404, "a domain nobody serves answered %d" % elsewhere.status)
+        phone.close()
+        gateway.stop()
+    finally:
+        gateway.kill()
+
+
+def repeated_failures_hold_the_source(program, work, emulator):
+    gateway = Gateway(program, emulator, work, "failures", SCRIPTS)
+    try:
+        phone = Phone(gateway.port)
+        alice = "sip:alice@example.com"
+        for attempt in range(12):
+            call_id = phone.new_call_id()
+            first = phone.send(register(phone, alice, call_id, 1, "sip:alice@192.0.2.1"))
+            if attempt >= 10:
+                check(first.status == 403, "attempt %d after 10 failures answered %d" % (attempt, first.status))
+                continue
+            check(first.status == 401, "attempt %d: %d" % (attempt, first.status))
+            auth = authorization(first.challenges()[0], "REGISTER", "sip:example.com", "alice", "guess%d" % attempt)
+            check(phone.send(register(phone, alice, call_id, 2, "sip:alice@192.0.2.1", auth)).status == 403,
+                  "a wrong password accepted")
+        # Another source is still challenged.
+        neighbour = Phone(gateway.port, "127.0.0.2")
+        check(neighbour.send(register(neighbour, alice, neighbour.new_call_id(), 1)).status == 401,
+              "another source was held too")
+        neighbour.close()
+        phone.close()
+        gateway.stop()
+        held = re.findall(r"127\.0\.0\.1 port \d+ refused for \d+ s after 10 failed", gateway.errors())
+        check(len(held) == 1, "the hold was logged %d times" % len(held))
+    finally:
+        gateway.kill()
+
+
+if __name__ == "__main__":
+    if len(sys.argv) < 3:
+        sys.exit("usage: authentication.py GATEWAY WORK-DIR [EMULATOR...]")
+    sys.exit(run([("sha256_registration_cannot_be_replayed", sha256_registration_cannot_be_replayed),
+                  ("digest_over_another_uri_refused_and_logged", digest_over_another_uri_refused_and_logged),
+                  ("only_challenged_or_registering_identities_register",
+                   only_challenged_or_registering_identities_register),
+                  ("repeated_failures_hold_the_source", repeated_failures_hold_the_source)],
+                 sys.argv[1], sys.argv[2], sys.argv[3:]))
