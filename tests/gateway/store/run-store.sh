@@ -65,7 +65,8 @@ start_gateway() {
   shift 2
   # A restart's log is its own; the earlier one stays beside it.
   [[ -e $name.err ]] && mv "$name.err" "$name.before.err"
-  "${emulator[@]}" "$gateway" --listen 127.0.0.1:0 --store "$store" "$subscribers" "$@" \
+  # SIPp 3.6 answers only an MD5 challenge (see run-scenario.sh).
+  "${emulator[@]}" "$gateway" --listen 127.0.0.1:0 --store "$store" --digest MD5 "$subscribers" "$@" \
     >"$name.out" 2>"$name.err" &
   pids[$name]=$!
   await_line "$name.err" "listening on udp:" || fail "gateway $name did not start"
@@ -92,7 +93,8 @@ sipp_run() {
 # register GATEWAY-NAME USER PASSWORD EXPIRES CONTACT-PORT: SIPp sends from
 # the contact's own port, so that the gateway sees no NAT to correct for.
 register() {
-  sipp_run register "$1" "$2" -au "$2" -ap "$3" -key expires "$4" -key contact_port "$5" -p "$5" ||
+  sipp_run register "$1" "$2" -au "$2" -ap "$3" -auth_uri example.com -key expires "$4" -key contact_port "$5" \
+    -p "$5" ||
     fail "$2 could not register at $1 for $4 s"
 }
 # Contact ports, one a phone: random, since a fixed one may be taken.
