@@ -312,34 +312,36 @@ Registrar::Binding* Registrar::find(Bindings& bindings, ContactHeader const& con
   return nullptr;
 }
 
-Registrar::Binding* Registrar::add(Bindings& bindings,
-                                   ContactRequest const& request,
-                                   sip_msg const& message,
-                                   CHostPort const& received,
-                                   Binding* binding) {
-  ContactHeader const& header = request.header;
-  std::string const callId = text(message.callid);
-  std::string natedTarget;
+CNameAddr Registrar::targetOf(ContactHeader const& header, sa const& source, std::string& natedTarget) {
   pl uri;
   pl_set_str(&uri, header.uri.c_str());
-  bool const nated = NatTraversal::natedTarget(uri, message.src, natedTarget);
   CNameAddr target = header.contact;
-  if (nated && !target.Parse(natedTarget.data(), natedTarget.size()))
+  if (NatTraversal::natedTarget(uri, source, natedTarget) &&
+      !target.Parse(natedTarget.data(), natedTarget.size()))
     target = header.contact;
+  return target;
+}
+
+Registrar::Binding* Registrar::file(Bindings& bindings,
+                                    Binding* binding,
+                                    ContactHeader const& header,
+                                    CNameAddr const& target,
+                                    std::string const& callId,
+                                    sa const& source,
+                                    CHostPort const& received,
+                                    uint32_t expires) {
   // The face knows a contact by its text: one filed under another target
   // (a new NAT mapping, or an instance's new URI) goes first.
   if (binding && binding->contact != target)
     m_clock.measure([&] { bindings.face->removeContact(binding->contact, binding->callId.c_str()); });
-  XCode const added = m_clock.measure([&] {
-    return bindings.face->addContact(callId.c_str(), target, received, "", "", header.q, request.expires);
-  });
+  XCode const added = m_clock.measure(
+      [&] { return bindings.face->addContact(callId.c_str(), target, received, "", "", header.q, expires); });
   // A contact configured statically on the face stands as registered already.
   if (added.isFailure()) {
     if (binding)
       forget(*binding);
     return nullptr;
   }
-  bool const fresh = !binding;
   if (!binding) {
     bindings.all.push_back(std::make_unique<Binding>());
     binding = bindings.all.back().get();
@@ -354,8 +356,24 @@ Registrar::Binding* Registrar::add(Bindings& bindings,
   binding->instance = header.instance;
   binding->regId = header.regId;
   binding->callId = callId;
+  binding->source = source;
+  return binding;
+}
+
+Registrar::Binding* Registrar::add(Bindings& bindings,
+                                   ContactRequest const& request,
+                                   sip_msg const& message,
+                                   CHostPort const& received,
+                                   Binding* binding) {
+  std::string natedTarget;
+  CNameAddr const target = targetOf(request.header, message.src, natedTarget);
+  bool const nated = !natedTarget.empty();
+  bool const fresh = !binding;
+  binding = file(bindings, binding, request.header, target, text(message.callid), message.src, received,
+                 request.expires);
+  if (!binding)
+    return nullptr;
   binding->cseq = message.cseq.num;
-  binding->source = message.src;
   binding->transport = message.tp;
   binding->expiresAtMs = tmr_jiffies() + uint64_t{request.expires} * 1000;
   schedule(*binding);
@@ -573,41 +591,14 @@ void Registrar::restore(Bindings& bindings, StoredBinding const& stored, uint64_
   uint32_t const expires =
       static_cast<uint32_t>(std::min<uint64_t>((stored.expiresAtMs - now + 999) / 1000, UINT32_MAX));
   std::string natedTarget;
-  pl uri;
-  pl_set_str(&uri, header.uri.c_str());
-  CNameAddr target = header.contact;
-  if (NatTraversal::natedTarget(uri, source, natedTarget) &&
-      !target.Parse(natedTarget.data(), natedTarget.size()))
-    target = header.contact;
-  Binding* binding = find(bindings, header);
-  if (binding && binding->contact != target)
-    m_clock.measure([&] { bindings.face->removeContact(binding->contact, binding->callId.c_str()); });
+  CNameAddr const target = targetOf(header, source, natedTarget);
   CHostPort received;
   received.Parse(stored.source.data(), stored.source.size());
-  XCode const added = m_clock.measure([&] {
-    return bindings.face->addContact(stored.callId.c_str(), target, received, "", "", header.q, expires);
-  });
-  if (added.isFailure()) {
-    if (binding)
-      forget(*binding);
+  Binding* const binding =
+      file(bindings, find(bindings, header), header, target, stored.callId, source, received, expires);
+  if (!binding)
     return;
-  }
-  if (!binding) {
-    bindings.all.push_back(std::make_unique<Binding>());
-    binding = bindings.all.back().get();
-    binding->registrar = this;
-    binding->owner = &bindings;
-  } else {
-    unschedule(*binding);
-  }
-  binding->contact = target;
-  binding->uri = header.uri;
-  binding->parameters = header.parameters;
-  binding->instance = header.instance;
-  binding->regId = header.regId;
-  binding->callId = stored.callId;
   binding->cseq = stored.cseq;
-  binding->source = source;
   binding->transport = SIP_TRANSP_UDP;
   for (sip_transp transport : {SIP_TRANSP_TCP, SIP_TRANSP_TLS})
     if (stored.transport == transportName(transport))

@@ -223,6 +223,22 @@ class Registrar {
                ContactRequest const& newcomer);
   // The table entry for identity, its names read when it is new.
   Bindings& entryOf(RefPtr<LS_IIdentity> const& identity);
+  // Where calls to a contact registered from source go: the contact, or
+  // for a NATed one the source, whose URI natedTarget then receives (it
+  // stays empty otherwise).
+  static CNameAddr targetOf(ContactHeader const& header, sa const& source, std::string& natedTarget);
+  // What add() and restore() share: files header on the face under target
+  // as binding (null for a new one) and records what it says and where it
+  // came from. Null when the face refused it. The caller sets the rest
+  // (CSeq, transport, expiry) and schedules the binding.
+  Binding* file(Bindings& bindings,
+                Binding* binding,
+                ContactHeader const& header,
+                CNameAddr const& target,
+                std::string const& callId,
+                sa const& source,
+                CHostPort const& received,
+                uint32_t expires);
   // Files a stored binding on the face as add() files a REGISTER's.
   void restore(Bindings& bindings, StoredBinding const& stored, uint64_t now);
   void record(StoreChange::Kind kind, Binding const& binding);
