@@ -67,7 +67,7 @@ if $sudo apt-get install -y --no-install-recommends "${wanted[@]}" 2>&1 | tee "$
   exit 0
 fi
 # The versions of PACKAGE the indexes offer, one a line.
-versions() { apt-cache madison "$1" | awk -F' [|] ' '{ print $2 }'; }
+versions() { apt-cache madison "$1" | awk -F'|' '{ gsub(/ /, "", $2); print $2 }'; }
 foreign=$(printf '%s\n' "${wanted[@]}" | sed -n 's/^[^:]*:\(.*\)$/\1/p' | sort -u)
 named=$({
   sed -n 's/^ *\([a-z0-9][a-z0-9.+-]*\)\(:[a-z0-9]*\)\{0,1\} : .*/\1/p' "$log"
