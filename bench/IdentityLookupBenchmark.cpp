@@ -11,8 +11,11 @@
 // given at the same size, which stay flat from 1,000 to 100,000 when their
 // cost does not grow with the service; challenge and response as ratios to the
 // map lookup alone. Also: how long one change of a group takes to reach the
-// registration observers of its 10,000 members. What one member of a group
-// takes in memory is identity_memory's (IdentityMemory.cpp).
+// registration observers of its 10,000 members, and its 100,000 members when
+// nobody watches them; and an identity's first registration (its own
+// inbound-registration face made and a contact added) as a ratio to
+// resolving by name. What one member of a group takes in memory is
+// identity_memory's (IdentityMemory.cpp).
 #include <benchmark/benchmark.h>
 #include <malloc.h>
 
@@ -29,6 +32,8 @@
 #include "LS_CMasterLocationService.h"
 #include "LS_CredentialLookup.h"
 #include "LS_IAuthenticationConfig.h"
+#include "LS_IRegistrationInbound.h"
+#include "LS_IRegistrationInboundConfig.h"
 #include "LS_IRegistrationOutboundConfig.h"
 #include "LS_IRegistrationOutboundObserver.h"
 #include "LS_IRegistrationOutboundSubject.h"
@@ -341,6 +346,56 @@ void BM_GroupChangeReachesEveryMember(benchmark::State& state) {
 }
 BENCHMARK(BM_GroupChangeReachesEveryMember)->Arg(10000)->Unit(benchmark::kMillisecond);
 
+// The same change where nobody watches the members, as in a gateway whose
+// subscribers inherit the "DEFAULT" group's inbound-registration face: the
+// group's lifetime range changed, every member's face told.
+void BM_GroupChangeReachesUnwatchedMembers(benchmark::State& state) {
+  int const count = static_cast<int>(state.range(0));
+  Model model(0);
+  RefPtr<LS_IIdentityConfig> const group = model.identity("DEFAULT", "", LS_IdentityType::IDENTITY_GROUP);
+  RefPtr<LS_IRegistrationInboundConfig> const registration =
+      faceOf<LS_IRegistrationInboundConfig>(group.get(), LS_IdentityFace::REGISTRATION_INBOUND);
+  for (int i = 0; i < count; ++i)
+    model.identity(("member-" + std::to_string(i)).c_str(), "DEFAULT", LS_IdentityType::IDENTITY);
+  unsigned int maximum = 7200;
+  for (auto _ : state)
+    registration->setConfigLifetimeRange(60, ++maximum, 3600);
+}
+BENCHMARK(BM_GroupChangeReachesUnwatchedMembers)->Arg(100000)->Unit(benchmark::kMillisecond);
+
+// A storm's first registration of a member of the group: the member's own
+// inbound-registration face made (inheriting the group's lifetime range) and
+// a contact added to it, for each of count members in turn, as a gateway
+// does when every phone registers after an outage.
+void BM_FirstRegistration(benchmark::State& state) {
+  int const count = static_cast<int>(state.range(0));
+  Model model(0);
+  RefPtr<LS_IIdentityConfig> const group = model.identity("DEFAULT", "", LS_IdentityType::IDENTITY_GROUP);
+  faceOf<LS_IAuthenticationConfig>(group.get(), LS_IdentityFace::AUTHENTICATION_INBOUND)
+      ->insertConfigAuthenticate(0, "http", "");
+  faceOf<LS_IRegistrationInboundConfig>(group.get(), LS_IdentityFace::REGISTRATION_INBOUND)
+      ->setConfigLifetimeRange(60, 7200, 3600);
+  std::vector<RefPtr<LS_IIdentity>> members;
+  for (int i = 0; i < count; ++i) {
+    RefPtr<LS_IIdentity> member;
+    model.identity(("member-" + std::to_string(i)).c_str(), "DEFAULT", LS_IdentityType::IDENTITY)->queryIf(member);
+    members.push_back(member);
+  }
+  CNameAddr const contact = nameAddrOf("phone");
+  CHostPort const received = Model::hostPortOf("192.0.2.1:5060");
+  String const callId("call-id");
+  size_t next = 0;
+  for (auto _ : state) {
+    LS_IIdentity* const member = members[next++ % members.size()].get();
+    RefPtr<LS_IRegistrationInbound> face;
+    adoptInterface(face, [&](UUID const& iid, void** raw) {
+      return member->createDynamicFaceIf(LS_IdentityFace::REGISTRATION_INBOUND, iid, raw);
+    });
+    face->addContact(callId, contact, received, "", "", 1000, 3600);
+  }
+}
+BENCHMARK(BM_FirstRegistration)->Arg(100000)->Iterations(100000);
+
 }  // namespace
 
 int main(int argc, char** argv) {
@@ -354,6 +409,7 @@ int main(int argc, char** argv) {
     for (char const* measured : {"BM_InboundChallenge", "BM_InboundResponse"})
       ratios.push_back({measured + size, "BM_MapFloor" + size});
   }
+  ratios.push_back({"BM_FirstRegistration/100000/iterations:100000", "BM_ResolveDirect/100000"});
   RatioReporter reporter(ratios);
   benchmark::RunSpecifiedBenchmarks(&reporter);
   for (auto const& first : firstLookups())
