@@ -4,7 +4,7 @@
 # default build-gateway-bench/), loads SUBSCRIBERS (default 100,000)
 # subscribers inheriting "DEFAULT" (generate.sh), registers every one with
 # SIPp at REGISTER_RATE, then has SIPp refresh them at REFRESH_RATE (by
-# default 995/s, half the highest rate at which the storm ran clean in the
+# default 4,900/s, half the highest rate at which the storm ran clean in the
 # README's figures) while CHANGES lines go over the socket a second apart,
 # each setting the group's inbound-registration lifetime range anew (every
 # member inherits it, and every watcher of a member is told). Reports the
@@ -16,7 +16,7 @@ root="$(cd "$(dirname "$0")/../.." && pwd)"
 here="$root/bench/gateway"
 subscribers=${SUBSCRIBERS:-100000}
 register_rate=${REGISTER_RATE:-2000}
-refresh_rate=${REFRESH_RATE:-995}
+refresh_rate=${REFRESH_RATE:-4900}
 changes=${CHANGES:-10}
 build=${BUILD:-"$root/build-gateway-bench"}
 work="$build/bench-live-change"
