@@ -196,6 +196,12 @@ void LS_CContainer::forgetBase() {
 }
 
 void LS_CContainer::onChange(ObserverEvent<LS_IElement>& event) {
+  // The base tells this container of its own changes as well; what changed
+  // in it arrives through the shadows, each under its name. A base is never
+  // a child of the container inheriting from it, so nothing in the tables
+  // could match: a group's change passes here for every member.
+  if (event.getSubject() == baseElement())
+    return;
   // Names first: the notifications may change the tables.
   Vector<String> changed;
   for (ElementTable const* table : {&m_localElements, &m_shadowElements}) {
@@ -247,14 +253,16 @@ void LS_CContainer::onElementChange(ObserverEvent<LS_IContainer>&) {}
 void LS_CContainer::notifyElementAdd(String const& name) {
   LS_DEBUG("LS_CElement(%p)::notifyElementAdd(%s)\n", logAddress(), name.c_str());
   onElementAdd(name);
-  m_containerObservers.broadcastEvent(EvElement(this, name), &LS_IContainerObserver::onElementAdd);
+  if (!m_containerObservers.isEmpty())
+    m_containerObservers.broadcastEvent(EvElement(this, name), &LS_IContainerObserver::onElementAdd);
   notifyChange();
 }
 
 void LS_CContainer::notifyElementRemove(String const& name, LS_IElement* element) {
   LS_DEBUG("LS_CElement(%p)::notifyElementRemove(%s)\n", logAddress(), name.c_str());
   onElementRemove(name);
-  m_containerObservers.broadcastEvent(EvElement(this, name), &LS_IContainerObserver::onElementRemove);
+  if (!m_containerObservers.isEmpty())
+    m_containerObservers.broadcastEvent(EvElement(this, name), &LS_IContainerObserver::onElementRemove);
   notifyChange();
   LockedPtr<LS_IElement>(element)->notifyDestroying();
 }
@@ -262,7 +270,8 @@ void LS_CContainer::notifyElementRemove(String const& name, LS_IElement* element
 void LS_CContainer::notifyElementChange(String const& name) {
   LS_DEBUG("LS_CElement(%p)::notifyElementChange(%s)\n", logAddress(), name.c_str());
   onElementChange(name);
-  m_containerObservers.broadcastEvent(EvElement(this, name), &LS_IContainerObserver::onElementChange);
+  if (!m_containerObservers.isEmpty())
+    m_containerObservers.broadcastEvent(EvElement(this, name), &LS_IContainerObserver::onElementChange);
   notifyChange();
 }
 

@@ -20,7 +20,8 @@ void LS_CElement::removeElementObserver(LS_IElementObserver* observer) {
 
 void LS_CElement::notifyChange() {
   LS_DEBUG("LS_CElement(%p)::notifyChange()\n", logAddress());
-  m_observers.broadcastEvent(ObserverEvent<LS_IElement>(this), &LS_IElementObserver::onChange);
+  if (!m_observers.isEmpty())
+    m_observers.broadcastEvent(ObserverEvent<LS_IElement>(this), &LS_IElementObserver::onChange);
 }
 
 void LS_CElement::notifyDestroying() {

@@ -198,6 +198,10 @@ class ObserverContainer {
       compact();
   }
 
+  // No registration at all: a subject checks this before building an event
+  // that nobody would receive (a group's change is told to every member).
+  bool isEmpty() const { return !m_word; }
+
   // Registrations still linked, dead ones awaiting housekeeping included.
   unsigned int getSize() const {
     if (!m_word)

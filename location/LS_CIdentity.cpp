@@ -127,6 +127,8 @@ void broadcastFaceEvent(LS_CIdentity* identity,
                         ObserverContainer<Face, Observer>& observers,
                         void (Observer::*handler)(ObserverEvent<Face>&),
                         bool onlyWithFace) {
+  if (observers.isEmpty())
+    return;
   RefPtr<Face> face;
   LS_getFaceIf(identity, kind, face);
   if (onlyWithFace && !face)
