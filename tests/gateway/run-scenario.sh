@@ -68,16 +68,7 @@ cleanup() {
 }
 trap cleanup EXIT
 
-# Waits until file holds a line matching pattern; false after wait_limit s.
-await_line() {
-  local file=$1 pattern=$2 tenths=$((wait_limit * 10))
-  while ((tenths-- > 0)); do
-    grep -q -- "$pattern" "$file" 2>/dev/null && return 0
-    [[ -n $gateway_pid ]] && ! kill -0 "$gateway_pid" 2>/dev/null && return 1
-    sleep 0.1
-  done
-  return 1
-}
+source "$(cd "$(dirname "$0")" && pwd)/await-line.sh"
 
 # Starts the gateway on a free IPv4 loopback port, gateway_port, and with
 # "--listen [::1]:0" among the arguments also an IPv6 one, gateway_port6.

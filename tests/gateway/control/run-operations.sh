@@ -56,15 +56,7 @@ cleanup() {
 }
 trap cleanup EXIT
 
-await_line() {
-  local file=$1 pattern=$2 tenths=$((wait_limit * 10))
-  while ((tenths-- > 0)); do
-    grep -q -- "$pattern" "$file" 2>/dev/null && return 0
-    [[ -n $gateway_pid ]] && ! kill -0 "$gateway_pid" 2>/dev/null && return 1
-    sleep 0.1
-  done
-  return 1
-}
+source "$here/../await-line.sh"
 
 console() {
   timeout "$wait_limit" "${emulator[@]}" "$console" "$@"

@@ -49,15 +49,7 @@ cleanup() {
 }
 trap cleanup EXIT
 
-# Waits until file holds a line matching pattern; false after wait_limit s.
-await_line() {
-  local file=$1 pattern=$2 tenths=$((wait_limit * 10))
-  while ((tenths-- > 0)); do
-    grep -q -- "$pattern" "$file" 2>/dev/null && return 0
-    sleep 0.1
-  done
-  return 1
-}
+source "$here/../await-line.sh"
 
 # start_gateway NAME STORE [SCRIPT...]: its port in ports[NAME].
 start_gateway() {
