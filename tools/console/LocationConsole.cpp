@@ -49,6 +49,27 @@ char const kUsage[] =
     "Exit status: 0, 1 when a line could not be applied, 2 for a usage error,\n"
     "a script that cannot be read, or a gateway that cannot be reached.\n";
 
+// Runs each script in turn, "-" being standard input (with a prompt when it
+// is a terminal), until a failed line stops the run (stopped set then).
+// False, told on standard error, when a script cannot be read.
+bool runScripts(ScriptRunner& runner, std::vector<std::string> const& scripts, bool& stopped) {
+  for (std::string const& name : scripts) {
+    if (name == "-") {
+      stopped = !runner.run(std::cin, "<stdin>", isatty(STDIN_FILENO) != 0);
+    } else {
+      std::ifstream file(name);
+      if (!file) {
+        std::cerr << "location-console: cannot read " << name << ": " << std::strerror(errno) << "\n";
+        return false;
+      }
+      stopped = !runner.run(file, name, false);
+    }
+    if (stopped)
+      break;
+  }
+  return true;
+}
+
 // The scripts run on a gateway: the same runner, each line sent over the
 // socket. "-" and no script read standard input.
 int runConnected(std::string const& path, std::vector<std::string> scripts, bool keepGoing) {
@@ -65,21 +86,9 @@ int runConnected(std::string const& path, std::vector<std::string> scripts, bool
   if (scripts.empty())
     scripts.push_back("-");
   try {
-    for (std::string const& name : scripts) {
-      bool stopped = false;
-      if (name == "-") {
-        stopped = !runner.run(std::cin, "<stdin>", isatty(STDIN_FILENO) != 0);
-      } else {
-        std::ifstream file(name);
-        if (!file) {
-          std::cerr << "location-console: cannot read " << name << ": " << std::strerror(errno) << "\n";
-          return 2;
-        }
-        stopped = !runner.run(file, name, false);
-      }
-      if (stopped)
-        break;
-    }
+    bool stopped = false;
+    if (!runScripts(runner, scripts, stopped))
+      return 2;
   } catch (std::runtime_error const& lost) {
     std::cerr << "location-console: " << lost.what() << "\n";
     return 2;
@@ -150,20 +159,8 @@ int main(int argc, char** argv) {
     std::istringstream script(defaultSession());
     stopped = !runner.run(script, "<default>", false);
   }
-  for (std::string const& name : scripts) {
-    if (name == "-") {
-      stopped = !runner.run(std::cin, "<stdin>", isatty(STDIN_FILENO) != 0);
-    } else {
-      std::ifstream file(name);
-      if (!file) {
-        std::cerr << "location-console: cannot read " << name << ": " << std::strerror(errno) << "\n";
-        return 2;
-      }
-      stopped = !runner.run(file, name, false);
-    }
-    if (stopped)
-      break;
-  }
+  if (!runScripts(runner, scripts, stopped))
+    return 2;
   int const status = runner.anyLineFailed() ? 1 : 0;
   if (saveTo.empty())
     return status;
