@@ -136,9 +136,13 @@ void WriteBehindStore::run() {
       catchUp = false;
     }
     {
+      // Changes recorded after flush() took the queue and before close()
+      // said so are written before the thread ends.
       std::lock_guard<std::mutex> lock(m_mutex);
-      if (m_closing)
+      if (m_closing && m_queue.empty())
         return;
+      if (m_closing)
+        continue;
     }
     bool notified = false;
     if (wait(-1, notified))

@@ -14,6 +14,7 @@
 #include "sip/Libre.h"
 #include "store/BindingStore.h"
 #include "store/StoreSchema.h"
+#include "store/WriteBehindStore.h"
 
 namespace {
 
@@ -128,6 +129,32 @@ TEST_F(SqliteStoreTest, BindingsComeBackWithTheirFieldsAndRemainingLifetime) {
   // The expired binding was deleted, not only skipped.
   store.reset();
   EXPECT_EQ(1, rowCount(m_path));
+}
+
+// A disk that takes its time over each batch, so that changes arrive while
+// the writer is inside one.
+class SlowDisk : public SqliteBackend {
+ public:
+  using SqliteBackend::SqliteBackend;
+  bool write(std::vector<StoreChange> const& changes, std::string& error) override {
+    std::this_thread::sleep_for(std::chrono::milliseconds(300));
+    return SqliteBackend::write(changes, error);
+  }
+};
+
+TEST_F(SqliteStoreTest, AChangeRecordedWhileABatchIsWrittenIsWrittenAtClose) {
+  {
+    WriteBehindStore store(std::make_unique<SlowDisk>(m_path), m_path);
+    std::string error;
+    ASSERT_TRUE(store.connect(error)) << error;
+    store.start(nullptr);
+    store.record(StoreChange::Kind::ADDED, binding("alice", "sip:alice@192.0.2.1", 600000));
+    // Past the batch window: the writer is inside alice's batch.
+    std::this_thread::sleep_for(std::chrono::milliseconds(150));
+    store.record(StoreChange::Kind::ADDED, binding("bob", "sip:bob@192.0.2.2", 600000));
+    store.close();
+  }
+  EXPECT_EQ(2, rowCount(m_path));
 }
 
 TEST_F(SqliteStoreTest, ChangesAreWrittenWhileTheGatewayRuns) {
