@@ -1,6 +1,7 @@
 #include "GatewayHarness.h"
 
 #include <atomic>
+#include <cerrno>
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
