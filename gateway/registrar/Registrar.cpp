@@ -312,11 +312,14 @@ Registrar::Binding* Registrar::find(Bindings& bindings, ContactHeader const& con
   return nullptr;
 }
 
-CNameAddr Registrar::targetOf(ContactHeader const& header, sa const& source, std::string& natedTarget) {
+CNameAddr Registrar::targetOf(ContactHeader const& header,
+                              sa const& source,
+                              sip_transp transport,
+                              std::string& natedTarget) {
   pl uri;
   pl_set_str(&uri, header.uri.c_str());
   CNameAddr target = header.contact;
-  if (NatTraversal::natedTarget(uri, source, natedTarget) &&
+  if (NatTraversal::natedTarget(uri, source, transport, natedTarget) &&
       !target.Parse(natedTarget.data(), natedTarget.size()))
     target = header.contact;
   return target;
@@ -366,7 +369,7 @@ Registrar::Binding* Registrar::add(Bindings& bindings,
                                    CHostPort const& received,
                                    Binding* binding) {
   std::string natedTarget;
-  CNameAddr const target = targetOf(request.header, message.src, natedTarget);
+  CNameAddr const target = targetOf(request.header, message.src, message.tp, natedTarget);
   bool const nated = !natedTarget.empty();
   bool const fresh = !binding;
   binding = file(bindings, binding, request.header, target, text(message.callid), message.src, received,
@@ -590,8 +593,12 @@ void Registrar::restore(Bindings& bindings, StoredBinding const& stored, uint64_
   header.uri = stored.uri;
   uint32_t const expires =
       static_cast<uint32_t>(std::min<uint64_t>((stored.expiresAtMs - now + 999) / 1000, UINT32_MAX));
+  sip_transp transport = SIP_TRANSP_UDP;
+  for (sip_transp each : {SIP_TRANSP_TCP, SIP_TRANSP_TLS})
+    if (stored.transport == transportName(each))
+      transport = each;
   std::string natedTarget;
-  CNameAddr const target = targetOf(header, source, natedTarget);
+  CNameAddr const target = targetOf(header, source, transport, natedTarget);
   CHostPort received;
   received.Parse(stored.source.data(), stored.source.size());
   Binding* const binding =
@@ -599,10 +606,7 @@ void Registrar::restore(Bindings& bindings, StoredBinding const& stored, uint64_
   if (!binding)
     return;
   binding->cseq = stored.cseq;
-  binding->transport = SIP_TRANSP_UDP;
-  for (sip_transp transport : {SIP_TRANSP_TCP, SIP_TRANSP_TLS})
-    if (stored.transport == transportName(transport))
-      binding->transport = transport;
+  binding->transport = transport;
   binding->expiresAtMs = stored.expiresAtMs;
   schedule(*binding);
 }

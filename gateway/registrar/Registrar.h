@@ -223,10 +223,13 @@ class Registrar {
                ContactRequest const& newcomer);
   // The table entry for identity, its names read when it is new.
   Bindings& entryOf(RefPtr<LS_IIdentity> const& identity);
-  // Where calls to a contact registered from source go: the contact, or
-  // for a NATed one the source, whose URI natedTarget then receives (it
-  // stays empty otherwise).
-  static CNameAddr targetOf(ContactHeader const& header, sa const& source, std::string& natedTarget);
+  // Where calls to a contact registered from source over transport go:
+  // the contact, or for a NATed one the source, whose URI natedTarget then
+  // receives (it stays empty otherwise).
+  static CNameAddr targetOf(ContactHeader const& header,
+                            sa const& source,
+                            sip_transp transport,
+                            std::string& natedTarget);
   // What add() and restore() share: files header on the face under target
   // as binding (null for a new one) and records what it says and where it
   // came from. Null when the face refused it. The caller sets the rest
