@@ -198,7 +198,12 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
       remove(*binding);
   }
   CHostPort const received = sourceOf(message);
+  // Named before any newcomer is filed, so that a refresh listed after a
+  // new contact never gives way to it.
   std::vector<Binding*> kept;
+  for (ContactRequest const& request : requests)
+    if (Binding* const binding = request.expires != 0 ? find(bindings, request.header) : nullptr)
+      kept.push_back(binding);
   for (ContactRequest const& request : requests) {
     if (request.expires == 0)
       continue;
