@@ -13,6 +13,7 @@
 #include "sip/Capabilities.h"
 #include "sip/Exchange.h"
 #include "sip/HeaderValues.h"
+#include "sip/MonotonicClock.h"
 
 namespace {
 
@@ -244,7 +245,7 @@ void Registrar::dropRemoved(std::vector<LS_IIdentity const*> const& removed, boo
 }
 
 std::vector<Registrar::BindingView> Registrar::bindings(LS_IIdentity const* identity) const {
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = MonotonicClock::nowMs();
   std::vector<BindingView> views;
   for (auto const& entry : m_bindings) {
     if (identity && entry.first != identity)
@@ -383,7 +384,7 @@ Registrar::Binding* Registrar::add(Bindings& bindings,
     return nullptr;
   binding->cseq = message.cseq.num;
   binding->transport = message.tp;
-  binding->expiresAtMs = tmr_jiffies() + uint64_t{request.expires} * 1000;
+  binding->expiresAtMs = MonotonicClock::nowMs() + uint64_t{request.expires} * 1000;
   schedule(*binding);
   record(fresh ? StoreChange::Kind::ADDED : StoreChange::Kind::REFRESHED, *binding);
   binding->connection = static_cast<sip_keepalive*>(mem_deref(binding->connection));
@@ -455,7 +456,7 @@ void Registrar::reportTransition(Bindings& bindings, size_t before) {
 }
 
 std::string Registrar::bindingHeaders(Bindings const& bindings) {
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = MonotonicClock::nowMs();
   std::string headers;
   for (auto const& binding : bindings.all) {
     uint64_t const remainingMs = binding->expiresAtMs > now ? binding->expiresAtMs - now : 0;
@@ -482,14 +483,14 @@ void Registrar::unschedule(Binding& binding) {
 void Registrar::rearm() {
   if (m_expiries.empty())
     return tmr_cancel(&m_sweep);
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = MonotonicClock::nowMs();
   uint64_t const first = m_expiries.begin()->first;
   tmr_start(&m_sweep, first > now ? first - now : 0, onSweep, this);
 }
 
 void Registrar::onSweep(void* argument) {
   Registrar& registrar = *static_cast<Registrar*>(argument);
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = MonotonicClock::nowMs();
   while (!registrar.m_expiries.empty() && registrar.m_expiries.begin()->first <= now)
     registrar.lose(*registrar.m_expiries.begin()->second, nullptr);
   registrar.rearm();
@@ -578,7 +579,7 @@ bool Registrar::replace(RefPtr<LS_IIdentity> const& identity,
     if (!wanted)
       remove(binding);
   }
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = MonotonicClock::nowMs();
   for (StoredBinding const& each : stored)
     restore(bindings, each, now);
   m_replacing = false;

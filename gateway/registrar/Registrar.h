@@ -114,7 +114,7 @@ class Registrar {
   // Borrowed; null for none. Set before the first request; the registrar
   // reports nothing to it once it is being destroyed.
   void setStore(BindingStore* store) { m_store = store; }
-  // Makes the identity's bindings exactly these (on the loop's clock),
+  // Makes the identity's bindings exactly these (on MonotonicClock),
   // without reporting to the store; dynamic: the identity was created for
   // them. False when the identity has no registration face to hold them.
   bool replace(RefPtr<LS_IIdentity> const& identity,
@@ -166,7 +166,7 @@ class Registrar {
     std::string regId;
     std::string callId;
     uint32_t cseq;
-    uint64_t expiresAtMs;       // on the stack's clock, tmr_jiffies()
+    uint64_t expiresAtMs;       // on MonotonicClock
     sa source;                  // where the REGISTER came from
     sip_transp transport;       // and over what
     Expiries::iterator expiry;  // its entry in m_expiries

@@ -1,0 +1,34 @@
+// MonotonicClock: the clock every part of the gateway measures durations on:
+// binding lifetimes, nonce lifetimes, source holds, the autosave's spacing
+// and the store's back-off. Wall-clock time stays out of
+// the gateway's own arithmetic; the store alone converts to it, at its
+// boundary, since its rows outlive the process (StoredBinding).
+//
+// Decisions, with their reasons:
+// - libre's tmr_jiffies() is not used: the libre Debian ships (1.1.0)
+//   derives it from gettimeofday(), so a step of the system clock back
+//   stalled every expiry by the step, and a step forward expired every
+//   binding at once and deleted it from the store.
+// - CLOCK_BOOTTIME: never stepped, like CLOCK_MONOTONIC, and it also counts
+//   the time the machine was suspended, so that a binding runs out when the
+//   phone's own registration does.
+//
+// Safe on any thread.
+#pragma once
+
+#include <time.h>
+
+#include <cstdint>
+
+namespace MonotonicClock {
+
+constexpr clockid_t kClock = CLOCK_BOOTTIME;
+
+// Milliseconds since an arbitrary start (the machine's boot).
+inline uint64_t nowMs() {
+  timespec now{};
+  clock_gettime(kClock, &now);
+  return static_cast<uint64_t>(now.tv_sec) * 1000 + static_cast<uint64_t>(now.tv_nsec) / 1000000;
+}
+
+}  // namespace MonotonicClock
