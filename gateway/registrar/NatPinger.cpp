@@ -12,13 +12,11 @@ char const kCallIdPrefix[] = "nat-ping-";
 
 NatPinger::NatPinger(sip& stack, uint32_t intervalSeconds, Lost lost, void* argument)
     : m_stack(stack), m_intervalMs(uint64_t{intervalSeconds} * 1000), m_lost(lost), m_argument(argument) {
-  tmr_init(&m_timer);
   sip_listen(&m_listener, &m_stack, false, onResponse, this);
-  tmr_start(&m_timer, m_intervalMs, onTick, this);
+  m_timer.start(m_intervalMs, onTick, this);
 }
 
 NatPinger::~NatPinger() {
-  tmr_cancel(&m_timer);
   mem_deref(m_listener);
 }
 
@@ -70,7 +68,7 @@ void NatPinger::ping(Entry& entry) {
 
 void NatPinger::onTick(void* argument) {
   NatPinger& pinger = *static_cast<NatPinger*>(argument);
-  tmr_start(&pinger.m_timer, pinger.m_intervalMs, onTick, &pinger);
+  pinger.m_timer.start(pinger.m_intervalMs, onTick, &pinger);
   std::vector<void const*> lost;
   for (auto& entry : pinger.m_entries) {
     Entry& watched = entry.second;

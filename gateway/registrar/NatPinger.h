@@ -21,7 +21,11 @@
 //   A ping still unanswered when the next is due counts as missed; after
 //   kMisses missed in a row the binding is lost.
 // - All watched bindings are pinged on one timer tick; a binding watched
-//   anew (its registration refreshed) starts again with no misses.
+//   anew (its registration refreshed) starts again with no misses. The tick
+//   is a MonotonicTimer: on the stack's timers a step of the system clock
+//   forward would tick at once and count misses no phone could have
+//   avoided, and a step back would hold the pings, and the NAT mappings
+//   with them, for as long as the step.
 //
 // Owned by the registrar, which watches and forgets its bindings by an
 // opaque key; the stack outlives it. lost may forget or drop the binding.
@@ -33,6 +37,7 @@
 #include <string>
 
 #include "sip/Libre.h"
+#include "sip/MonotonicTimer.h"
 
 class NatPinger {
  public:
@@ -69,7 +74,7 @@ class NatPinger {
   uint64_t m_intervalMs;
   Lost m_lost;
   void* m_argument;
-  tmr m_timer;
+  MonotonicTimer m_timer;
   sip_lsnr* m_listener = nullptr;
   std::map<void const*, Entry> m_entries;
   std::map<uint64_t, void const*> m_byId;

@@ -54,7 +54,6 @@ Registrar::~Registrar() {
     removeAll(entry.second);
     reportTransition(entry.second, before);
   }
-  tmr_cancel(&m_sweep);
 }
 
 void Registrar::start(sip& stack, ExpiryRange const& expiry, uint32_t natPingSeconds) {
@@ -474,7 +473,7 @@ void Registrar::schedule(Binding& binding) {
     rearm();
 }
 
-// The stack timer stays set for an earlier binding that went: the sweep it
+// The timer stays set for an earlier binding that went: the sweep it
 // then makes finds nothing due and sets it again.
 void Registrar::unschedule(Binding& binding) {
   m_expiries.erase(binding.expiry);
@@ -482,10 +481,10 @@ void Registrar::unschedule(Binding& binding) {
 
 void Registrar::rearm() {
   if (m_expiries.empty())
-    return tmr_cancel(&m_sweep);
+    return m_sweep.cancel();
   uint64_t const now = MonotonicClock::nowMs();
   uint64_t const first = m_expiries.begin()->first;
-  tmr_start(&m_sweep, first > now ? first - now : 0, onSweep, this);
+  m_sweep.start(first > now ? first - now : 0, onSweep, this);
 }
 
 void Registrar::onSweep(void* argument) {

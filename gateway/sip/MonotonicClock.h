@@ -12,6 +12,15 @@
 // - CLOCK_BOOTTIME: never stepped, like CLOCK_MONOTONIC, and it also counts
 //   the time the machine was suspended, so that a binding runs out when the
 //   phone's own registration does.
+// - libre's timers (tmr_start) run on the same gettimeofday(), and the
+//   gateway cannot change that for the stack's own (transactions, the
+//   trunks' registration clients, DNS): a step back delays those by the
+//   step, a step forward fires them early. The gateway's own timers that
+//   decide a binding's fate, the registrar's expiry sweep and the NAT
+//   pings, run on MonotonicTimer instead, which libre's loop polls like a
+//   socket. Its other timers (the request log's flush, the autosave, the
+//   trunks' retries and keep-alives) stay on libre's: a step moves them by
+//   its size once, which costs a late write or a late retry, nothing lost.
 //
 // Safe on any thread.
 #pragma once
