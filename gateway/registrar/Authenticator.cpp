@@ -9,6 +9,7 @@
 #include "LS_IdentityResolution.h"
 #include "LS_ServiceResolution.h"
 #include "sip/Exchange.h"
+#include "sip/MonotonicClock.h"
 
 namespace {
 
@@ -71,7 +72,7 @@ std::string addressOf(sa const& source) {
 Authenticator::Authenticator(LibraryClock& clock) : m_clock(clock) {}
 
 bool Authenticator::refuseHeldSource(Exchange& exchange) {
-  if (!m_failingSources.held(exchange.request().src, tmr_jiffies()))
+  if (!m_failingSources.held(exchange.request().src, MonotonicClock::nowMs()))
     return false;
   exchange.answer(403, "Forbidden");
   return true;
@@ -151,7 +152,7 @@ void Authenticator::refuseUnknown(Exchange& exchange, CNameAddr const& to) {
 Authenticator::Outcome Authenticator::evaluate(sip_msg const& message,
                                                std::vector<std::string> const* realms,
                                                Passwords const& passwordsOf) {
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = MonotonicClock::nowMs();
   unsigned int looked = 0;
   Outcome outcome;
   forEachHeader(message, SIP_HDR_AUTHORIZATION, [&](sip_hdr const& header) {
@@ -223,7 +224,7 @@ bool Authenticator::check(Exchange& exchange,
 }
 
 void Authenticator::challenge(Exchange& exchange, std::vector<std::string> const& realms, bool stale) {
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = MonotonicClock::nowMs();
   std::string challenges;
   for (std::string const& realm : realms) {
     pl name;
@@ -240,7 +241,7 @@ void Authenticator::fail(Exchange& exchange, pl const& user, char const* reason)
   sa const& source = exchange.request().src;
   std::cerr << "location-gateway: authentication failed for \"" << printable(user) << "\" from "
             << addressOf(source) << ": " << reason << std::endl;
-  if (m_failingSources.count(source, tmr_jiffies()) == SourceThrottle::Verdict::HELD_NOW)
+  if (m_failingSources.count(source, MonotonicClock::nowMs()) == SourceThrottle::Verdict::HELD_NOW)
     std::cerr << "location-gateway: " << addressOf(source) << " refused for " << kFailureHoldMs / 1000
               << " s after " << kFailureLimit << " failed authentications" << std::endl;
   exchange.answer(403, "Forbidden");

@@ -13,6 +13,7 @@
 #include "sip/Capabilities.h"
 #include "sip/Exchange.h"
 #include "sip/HeaderValues.h"
+#include "sip/MonotonicClock.h"
 
 namespace {
 
@@ -53,7 +54,6 @@ Registrar::~Registrar() {
     removeAll(entry.second);
     reportTransition(entry.second, before);
   }
-  tmr_cancel(&m_sweep);
 }
 
 void Registrar::start(sip& stack, ExpiryRange const& expiry, uint32_t natPingSeconds) {
@@ -198,7 +198,12 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
       remove(*binding);
   }
   CHostPort const received = sourceOf(message);
+  // Named before any newcomer is filed, so that a refresh listed after a
+  // new contact never gives way to it.
   std::vector<Binding*> kept;
+  for (ContactRequest const& request : requests)
+    if (Binding* const binding = request.expires != 0 ? find(bindings, request.header) : nullptr)
+      kept.push_back(binding);
   for (ContactRequest const& request : requests) {
     if (request.expires == 0)
       continue;
@@ -239,7 +244,7 @@ void Registrar::dropRemoved(std::vector<LS_IIdentity const*> const& removed, boo
 }
 
 std::vector<Registrar::BindingView> Registrar::bindings(LS_IIdentity const* identity) const {
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = MonotonicClock::nowMs();
   std::vector<BindingView> views;
   for (auto const& entry : m_bindings) {
     if (identity && entry.first != identity)
@@ -312,11 +317,14 @@ Registrar::Binding* Registrar::find(Bindings& bindings, ContactHeader const& con
   return nullptr;
 }
 
-CNameAddr Registrar::targetOf(ContactHeader const& header, sa const& source, std::string& natedTarget) {
+CNameAddr Registrar::targetOf(ContactHeader const& header,
+                              sa const& source,
+                              sip_transp transport,
+                              std::string& natedTarget) {
   pl uri;
   pl_set_str(&uri, header.uri.c_str());
   CNameAddr target = header.contact;
-  if (NatTraversal::natedTarget(uri, source, natedTarget) &&
+  if (NatTraversal::natedTarget(uri, source, transport, natedTarget) &&
       !target.Parse(natedTarget.data(), natedTarget.size()))
     target = header.contact;
   return target;
@@ -366,7 +374,7 @@ Registrar::Binding* Registrar::add(Bindings& bindings,
                                    CHostPort const& received,
                                    Binding* binding) {
   std::string natedTarget;
-  CNameAddr const target = targetOf(request.header, message.src, natedTarget);
+  CNameAddr const target = targetOf(request.header, message.src, message.tp, natedTarget);
   bool const nated = !natedTarget.empty();
   bool const fresh = !binding;
   binding = file(bindings, binding, request.header, target, text(message.callid), message.src, received,
@@ -375,7 +383,7 @@ Registrar::Binding* Registrar::add(Bindings& bindings,
     return nullptr;
   binding->cseq = message.cseq.num;
   binding->transport = message.tp;
-  binding->expiresAtMs = tmr_jiffies() + uint64_t{request.expires} * 1000;
+  binding->expiresAtMs = MonotonicClock::nowMs() + uint64_t{request.expires} * 1000;
   schedule(*binding);
   record(fresh ? StoreChange::Kind::ADDED : StoreChange::Kind::REFRESHED, *binding);
   binding->connection = static_cast<sip_keepalive*>(mem_deref(binding->connection));
@@ -447,7 +455,7 @@ void Registrar::reportTransition(Bindings& bindings, size_t before) {
 }
 
 std::string Registrar::bindingHeaders(Bindings const& bindings) {
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = MonotonicClock::nowMs();
   std::string headers;
   for (auto const& binding : bindings.all) {
     uint64_t const remainingMs = binding->expiresAtMs > now ? binding->expiresAtMs - now : 0;
@@ -465,7 +473,7 @@ void Registrar::schedule(Binding& binding) {
     rearm();
 }
 
-// The stack timer stays set for an earlier binding that went: the sweep it
+// The timer stays set for an earlier binding that went: the sweep it
 // then makes finds nothing due and sets it again.
 void Registrar::unschedule(Binding& binding) {
   m_expiries.erase(binding.expiry);
@@ -473,15 +481,15 @@ void Registrar::unschedule(Binding& binding) {
 
 void Registrar::rearm() {
   if (m_expiries.empty())
-    return tmr_cancel(&m_sweep);
-  uint64_t const now = tmr_jiffies();
+    return m_sweep.cancel();
+  uint64_t const now = MonotonicClock::nowMs();
   uint64_t const first = m_expiries.begin()->first;
-  tmr_start(&m_sweep, first > now ? first - now : 0, onSweep, this);
+  m_sweep.start(first > now ? first - now : 0, onSweep, this);
 }
 
 void Registrar::onSweep(void* argument) {
   Registrar& registrar = *static_cast<Registrar*>(argument);
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = MonotonicClock::nowMs();
   while (!registrar.m_expiries.empty() && registrar.m_expiries.begin()->first <= now)
     registrar.lose(*registrar.m_expiries.begin()->second, nullptr);
   registrar.rearm();
@@ -570,7 +578,7 @@ bool Registrar::replace(RefPtr<LS_IIdentity> const& identity,
     if (!wanted)
       remove(binding);
   }
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = MonotonicClock::nowMs();
   for (StoredBinding const& each : stored)
     restore(bindings, each, now);
   m_replacing = false;
@@ -590,8 +598,12 @@ void Registrar::restore(Bindings& bindings, StoredBinding const& stored, uint64_
   header.uri = stored.uri;
   uint32_t const expires =
       static_cast<uint32_t>(std::min<uint64_t>((stored.expiresAtMs - now + 999) / 1000, UINT32_MAX));
+  sip_transp transport = SIP_TRANSP_UDP;
+  for (sip_transp each : {SIP_TRANSP_TCP, SIP_TRANSP_TLS})
+    if (stored.transport == transportName(each))
+      transport = each;
   std::string natedTarget;
-  CNameAddr const target = targetOf(header, source, natedTarget);
+  CNameAddr const target = targetOf(header, source, transport, natedTarget);
   CHostPort received;
   received.Parse(stored.source.data(), stored.source.size());
   Binding* const binding =
@@ -599,10 +611,7 @@ void Registrar::restore(Bindings& bindings, StoredBinding const& stored, uint64_
   if (!binding)
     return;
   binding->cseq = stored.cseq;
-  binding->transport = SIP_TRANSP_UDP;
-  for (sip_transp transport : {SIP_TRANSP_TCP, SIP_TRANSP_TLS})
-    if (stored.transport == transportName(transport))
-      binding->transport = transport;
+  binding->transport = transport;
   binding->expiresAtMs = stored.expiresAtMs;
   schedule(*binding);
 }

@@ -86,6 +86,7 @@
 #include "registrar/ExpiryRange.h"
 #include "registrar/NatPinger.h"
 #include "sip/Libre.h"
+#include "sip/MonotonicTimer.h"
 #include "store/BindingStore.h"
 
 class Exchange;
@@ -97,7 +98,7 @@ class Registrar {
 
   static constexpr uint32_t kConnectionWatchSeconds = 4000000;
 
-  explicit Registrar(LibraryClock& clock) : m_clock(clock), m_authenticator(clock) { tmr_init(&m_sweep); }
+  explicit Registrar(LibraryClock& clock) : m_clock(clock), m_authenticator(clock) {}
   ~Registrar();
   Registrar(Registrar const&) = delete;
   Registrar& operator=(Registrar const&) = delete;
@@ -114,7 +115,7 @@ class Registrar {
   // Borrowed; null for none. Set before the first request; the registrar
   // reports nothing to it once it is being destroyed.
   void setStore(BindingStore* store) { m_store = store; }
-  // Makes the identity's bindings exactly these (on the loop's clock),
+  // Makes the identity's bindings exactly these (on MonotonicClock),
   // without reporting to the store; dynamic: the identity was created for
   // them. False when the identity has no registration face to hold them.
   bool replace(RefPtr<LS_IIdentity> const& identity,
@@ -144,11 +145,11 @@ class Registrar {
  private:
   struct Bindings;
   struct Binding;
-  // Every binding by the time it runs out, earliest first. One stack timer
-  // serves them all, set for the earliest: the stack keeps its timers on
-  // one sorted list that each new timer walks, so a timer per binding would
-  // make every transaction's own timers cost as many steps as there are
-  // bindings.
+  // Every binding by the time it runs out, earliest first. One timer
+  // serves them all, set for the earliest: a timer per binding would cost a
+  // descriptor each, or on the stack's timers, which it keeps on one sorted
+  // list that each new timer walks, make every transaction's own timers
+  // cost as many steps as there are bindings.
   using Expiries = std::multimap<uint64_t, Binding*>;
   // What a binding holds: what the registration said and where it came from.
   struct Binding {
@@ -166,7 +167,7 @@ class Registrar {
     std::string regId;
     std::string callId;
     uint32_t cseq;
-    uint64_t expiresAtMs;       // on the stack's clock, tmr_jiffies()
+    uint64_t expiresAtMs;       // on MonotonicClock
     sa source;                  // where the REGISTER came from
     sip_transp transport;       // and over what
     Expiries::iterator expiry;  // its entry in m_expiries
@@ -223,10 +224,13 @@ class Registrar {
                ContactRequest const& newcomer);
   // The table entry for identity, its names read when it is new.
   Bindings& entryOf(RefPtr<LS_IIdentity> const& identity);
-  // Where calls to a contact registered from source go: the contact, or
-  // for a NATed one the source, whose URI natedTarget then receives (it
-  // stays empty otherwise).
-  static CNameAddr targetOf(ContactHeader const& header, sa const& source, std::string& natedTarget);
+  // Where calls to a contact registered from source over transport go:
+  // the contact, or for a NATed one the source, whose URI natedTarget then
+  // receives (it stays empty otherwise).
+  static CNameAddr targetOf(ContactHeader const& header,
+                            sa const& source,
+                            sip_transp transport,
+                            std::string& natedTarget);
   // What add() and restore() share: files header on the face under target
   // as binding (null for a new one) and records what it says and where it
   // came from. Null when the face refused it. The caller sets the rest
@@ -253,11 +257,11 @@ class Registrar {
   void reportTransition(Bindings& bindings, size_t before);
   // The 200's own header lines: the bindings, the date, what is supported.
   static std::string bindingHeaders(Bindings const& bindings);
-  // (Re)files the binding under its time; sets the stack timer when it is
-  // now the earliest.
+  // (Re)files the binding under its time; sets the timer when it is now
+  // the earliest.
   void schedule(Binding& binding);
   void unschedule(Binding& binding);
-  // Sets the stack timer for the earliest expiry, or stops it.
+  // Sets the timer for the earliest expiry, or stops it.
   void rearm();
   // Drops every binding of the table entry's identity, and the entry.
   void drop(std::map<LS_IIdentity*, Bindings>::iterator entry);
@@ -279,6 +283,6 @@ class Registrar {
   Authenticator m_authenticator;
   std::map<LS_IIdentity*, Bindings> m_bindings;
   Expiries m_expiries;
-  tmr m_sweep;
+  MonotonicTimer m_sweep;
   uint64_t m_bindingsDropped = 0;
 };

@@ -5,6 +5,7 @@
 #include <set>
 
 #include "sip/Libre.h"
+#include "sip/MonotonicClock.h"
 #include "store/StoreSchema.h"
 
 namespace {
@@ -165,7 +166,7 @@ bool PostgresBackend::read(IdentityName const* identity,
   PGresult* result = nullptr;
   if (!run(sql, parameters, error, &result))
     return false;
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = MonotonicClock::nowMs();
   int const rows = PQntuples(result);
   for (int row = 0; row < rows; ++row) {
     char const* columns[10];
@@ -190,7 +191,7 @@ bool PostgresBackend::write(std::vector<StoreChange> const& changes, std::string
     error = failure("cannot be written");
     return false;
   }
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = MonotonicClock::nowMs();
   std::set<IdentityName> touched;
   size_t pending = 0;
   // Sends one statement; every kPipelineDepth, waits for the answers so

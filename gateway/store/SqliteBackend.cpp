@@ -4,6 +4,7 @@
 #include <sys/stat.h>
 
 #include "sip/Libre.h"
+#include "sip/MonotonicClock.h"
 #include "store/StoreSchema.h"
 
 namespace {
@@ -181,7 +182,7 @@ bool SqliteBackend::read(IdentityName const* identity,
     return false;
   if (identity)
     bindAll(select, {identity->first, identity->second});
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = MonotonicClock::nowMs();
   int step;
   while ((step = sqlite3_step(select)) == SQLITE_ROW) {
     char const* columns[10];
@@ -205,7 +206,7 @@ bool SqliteBackend::deleteExpired(std::string& error) {
 bool SqliteBackend::write(std::vector<StoreChange> const& changes, std::string& error) {
   if (!execute("BEGIN", error))
     return false;
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = MonotonicClock::nowMs();
   for (StoreChange const& change : changes) {
     StoredBinding const& binding = change.binding;
     bool const removal = change.removal();

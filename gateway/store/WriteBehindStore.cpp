@@ -7,6 +7,8 @@
 #include <algorithm>
 #include <cstdio>
 
+#include "sip/MonotonicClock.h"
+
 namespace {
 
 void say(std::string const& line) {
@@ -109,8 +111,8 @@ void WriteBehindStore::run() {
       if (!reconnect()) {
         bool notified = false;
         // Woken early by changes too: those only wait for the next try.
-        uint64_t const until = tmr_jiffies() + backoff;
-        for (uint64_t now = tmr_jiffies(); now < until; now = tmr_jiffies()) {
+        uint64_t const until = MonotonicClock::nowMs() + backoff;
+        for (uint64_t now = MonotonicClock::nowMs(); now < until; now = MonotonicClock::nowMs()) {
           wait(static_cast<int>(until - now), notified);
           std::lock_guard<std::mutex> lock(m_mutex);
           if (m_closing)

@@ -12,6 +12,7 @@
 #include <thread>
 
 #include "sip/Libre.h"
+#include "sip/MonotonicClock.h"
 #include "store/BindingStore.h"
 #include "store/StoreSchema.h"
 #include "store/WriteBehindStore.h"
@@ -57,7 +58,7 @@ StoredBinding binding(std::string const& identity, std::string const& uri, uint6
   result.cseq = 7;
   result.source = "192.0.2.1:5062";
   result.transport = "tcp";
-  result.expiresAtMs = tmr_jiffies() + lifetimeMs;
+  result.expiresAtMs = MonotonicClock::nowMs() + lifetimeMs;
   return result;
 }
 
@@ -103,7 +104,7 @@ TEST_F(SqliteStoreTest, BindingsComeBackWithTheirFieldsAndRemainingLifetime) {
   store->record(StoreChange::Kind::ADDED, binding("carol", "sip:carol@192.0.2.3", 1));
   store->record(StoreChange::Kind::REMOVED, binding("bob", "sip:bob@192.0.2.2", 0));
   alice.callId = "call-refreshed";
-  alice.expiresAtMs = tmr_jiffies() + 300000;
+  alice.expiresAtMs = MonotonicClock::nowMs() + 300000;
   store->record(StoreChange::Kind::REFRESHED, alice);
   store->close();
   store.reset();
@@ -123,7 +124,7 @@ TEST_F(SqliteStoreTest, BindingsComeBackWithTheirFieldsAndRemainingLifetime) {
   EXPECT_EQ("192.0.2.1:5062", back.source);
   EXPECT_EQ("tcp", back.transport);
   EXPECT_TRUE(back.dynamic);
-  uint64_t const remaining = back.expiresAtMs - tmr_jiffies();
+  uint64_t const remaining = back.expiresAtMs - MonotonicClock::nowMs();
   EXPECT_GT(remaining, 290000u);
   EXPECT_LE(remaining, 300000u);
   // The expired binding was deleted, not only skipped.
