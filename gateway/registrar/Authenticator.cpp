@@ -26,8 +26,9 @@ void forEachHeader(sip_msg const& message, sip_hdrid id, Visit visit) {
   }
 }
 
-// What a REGISTER would change, digested: a retransmission has the same, a
-// replay with another Contact, CSeq, To or Expires does not.
+// What a REGISTER would change and where it came from, digested: a
+// retransmission has the same, a replay with another Contact, CSeq, To or
+// Expires, or from another address, port or transport, does not.
 uint64_t fingerprintOf(sip_msg const& message) {
   uint64_t hash = 14695981039346656037ull;
   auto mix = [&](char const* bytes, size_t length) {
@@ -46,6 +47,9 @@ uint64_t fingerprintOf(sip_msg const& message) {
     mix(header.val.p, header.val.l);
     return true;
   });
+  char source[80];
+  int const length = re_snprintf(source, sizeof source, "%s %J", sip_transp_name(message.tp), &message.src);
+  mix(source, length > 0 ? static_cast<size_t>(length) : 0);
   return hash;
 }
 
@@ -77,7 +81,7 @@ bool Authenticator::refuseHeldSource(Exchange& exchange) {
   return true;
 }
 
-bool Authenticator::admit(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to) {
+Authenticator::Admission Authenticator::admit(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to) {
   String error;
   Outcome const quick = evaluate(exchange.request(), nullptr, [&](String const& realm, String const& user) {
     Vector<String> passwords;
@@ -88,16 +92,16 @@ bool Authenticator::admit(Exchange& exchange, LS_IIdentity* identity, CNameAddr 
     return passwords;
   });
   if (quick.accepted)
-    return true;
+    return quick.repeated ? Admission::REPEATED : Admission::ACCEPTED;
   Vector<LS_ProtocolRealm> realms;
   m_clock.measure([&] { LS_getInboundAuthenticationChallenge(error, realms, identity, nullptr); });
   if (realms.isEmpty()) {
     RefPtr<LS_IRegistrationInbound> face;
     m_clock.measure([&] { LS_getFaceIf(identity, LS_IdentityFace::REGISTRATION_INBOUND, face); });
     if (face)
-      return true;
+      return Admission::ACCEPTED;
     exchange.answer(403, "Forbidden");
-    return false;
+    return Admission::REFUSED;
   }
   std::vector<std::string> names;
   for (LS_ProtocolRealm const& realm : realms)
@@ -193,13 +197,16 @@ Authenticator::Outcome Authenticator::evaluate(sip_msg const& message,
       outcome.failure = "no nonce-count";
       return false;
     }
-    switch (m_used.use(fields.nonce, NonceGenerator::madeAt(fields.nonce), count, fingerprintOf(message))) {
+    switch (m_used.use(fields.nonce, NonceGenerator::madeAt(fields.nonce), count, fingerprintOf(message), now)) {
       case NonceTable::Use::FORGOTTEN:
       case NonceTable::Use::REPLAYED:
         outcome.stale = true;
         return true;
-      case NonceTable::Use::FIRST_OR_NEWER:
       case NonceTable::Use::REPEATED:
+        outcome.repeated = true;
+        outcome.accepted = true;
+        return false;
+      case NonceTable::Use::FIRST_OR_NEWER:
         outcome.accepted = true;
         return false;
     }
@@ -208,18 +215,18 @@ Authenticator::Outcome Authenticator::evaluate(sip_msg const& message,
   return outcome;
 }
 
-bool Authenticator::check(Exchange& exchange,
-                          std::vector<std::string> const& realms,
-                          Passwords const& passwordsOf) {
+Authenticator::Admission Authenticator::check(Exchange& exchange,
+                                              std::vector<std::string> const& realms,
+                                              Passwords const& passwordsOf) {
   Outcome const outcome = evaluate(exchange.request(), &realms, passwordsOf);
   if (outcome.accepted)
-    return true;
+    return outcome.repeated ? Admission::REPEATED : Admission::ACCEPTED;
   if (outcome.failure) {
     fail(exchange, outcome.user, outcome.failure);
-    return false;
+    return Admission::REFUSED;
   }
   challenge(exchange, realms, outcome.stale);
-  return false;
+  return Admission::REFUSED;
 }
 
 void Authenticator::challenge(Exchange& exchange, std::vector<std::string> const& realms, bool stale) {

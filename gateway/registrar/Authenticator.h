@@ -31,7 +31,14 @@
 //   22.4, RFC 7616 section 3.4.6): a response computed for another URI is a
 //   failed authentication.
 // - A nonce is bound to the realm and the Call-ID (NonceGenerator) and used
-//   at most once per nonce-count (NonceTable). A nonce used again, or one
+//   at most once per nonce-count (NonceTable): an authenticated request is
+//   applied at most once. The same request again, from the same source
+//   within a client transaction's lifetime, is admitted as REPEATED and
+//   changes nothing; from anywhere else or later it is a replay. Before,
+//   a repeat was told apart only by the binding holding its Call-ID and
+//   CSeq, so once that binding was gone a replay was applied as new, and a
+//   query (no Contact) could be sent again from forged sources to have the
+//   bindings listed to them. A nonce used again, or one
 //   the table no longer remembers, gets 401 with stale=true, like an expired
 //   one, as Kamailio answers a nonce-count that did not increase: a replay
 //   gains nothing from it, and a phone that reuses its nonce carelessly
@@ -66,8 +73,8 @@ class Exchange;
 
 class Authenticator {
  public:
-  // 16 K nonces of 32 bytes: half a megabyte, a few seconds of a storm of
-  // new registrations before a phone's own nonce could be pushed out.
+  // 16 K nonces of 40 bytes: 640 KiB, a few seconds of a storm of new
+  // registrations before a phone's own nonce could be pushed out.
   static constexpr size_t kNonceCapacity = 16 * 1024;
   static constexpr uint32_t kFailureLimit = 10;
   static constexpr uint64_t kFailureWindowMs = 60 * 1000;
@@ -84,8 +91,13 @@ class Authenticator {
 
   // True, after answering 403, when the request's source is held.
   bool refuseHeldSource(Exchange& exchange);
-  // Whether identity, which to denotes, may register with this request.
-  bool admit(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to);
+  // What admit() makes of a request. REPEATED: credentials already used by
+  // this very request, from the same source, moments ago; the registrar
+  // answers it as the retransmission it is and applies nothing.
+  enum class Admission { REFUSED, ACCEPTED, REPEATED };
+  // Whether identity, which to denotes, may register with this request;
+  // REFUSED after answering it.
+  Admission admit(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to);
   // Answers a REGISTER whose To (to, parsed) denotes no identity.
   void refuseUnknown(Exchange& exchange, CNameAddr const& to);
 
@@ -95,6 +107,7 @@ class Authenticator {
   // What the request's Authorization headers come to.
   struct Outcome {
     bool accepted = false;
+    bool repeated = false;          // accepted as a retransmission
     bool stale = false;             // a nonce expired, used or forgotten
     char const* failure = nullptr;  // why a failed authentication failed
     pl user{};                      // whose it was
@@ -108,7 +121,7 @@ class Authenticator {
                    std::vector<std::string> const* realms,
                    Passwords const& passwordsOf);
   // The evaluation against realms, answering 401 or 403 when it does not pass.
-  bool check(Exchange& exchange, std::vector<std::string> const& realms, Passwords const& passwords);
+  Admission check(Exchange& exchange, std::vector<std::string> const& realms, Passwords const& passwords);
   void challenge(Exchange& exchange, std::vector<std::string> const& realms, bool stale);
   void fail(Exchange& exchange, pl const& user, char const* reason);
 

@@ -20,19 +20,24 @@ NonceTable::NonceTable(size_t capacity) : m_buckets(capacity / kWays + (capacity
     m_buckets.resize(1);
 }
 
-NonceTable::Use NonceTable::use(pl const& nonce, uint64_t madeMs, uint32_t count, uint64_t fingerprint) {
+NonceTable::Use NonceTable::use(pl const& nonce,
+                                uint64_t madeMs,
+                                uint32_t count,
+                                uint64_t fingerprint,
+                                uint64_t nowMs) {
   uint64_t const key = keyOf(nonce);
   Bucket& bucket = m_buckets[static_cast<size_t>(key % m_buckets.size())];
   // A free entry, else the one made earliest.
   Entry* victim = &bucket.entries[0];
   for (Entry& entry : bucket.entries) {
     if (entry.occupied && entry.key == key) {
-      if (count == entry.count && fingerprint == entry.fingerprint)
+      if (count == entry.count && fingerprint == entry.fingerprint && nowMs - entry.usedMs <= kRetransmissionMs)
         return Use::REPEATED;
       if (count <= entry.count)
         return Use::REPLAYED;
       entry.count = count;
       entry.fingerprint = fingerprint;
+      entry.usedMs = nowMs;
       return Use::FIRST_OR_NEWER;
     }
     if (victim->occupied && (!entry.occupied || entry.madeMs < victim->madeMs))
@@ -48,6 +53,7 @@ NonceTable::Use NonceTable::use(pl const& nonce, uint64_t madeMs, uint32_t count
   victim->madeMs = madeMs;
   victim->count = count;
   victim->fingerprint = fingerprint;
+  victim->usedMs = nowMs;
   victim->occupied = true;
   return Use::FIRST_OR_NEWER;
 }

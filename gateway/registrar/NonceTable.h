@@ -17,9 +17,12 @@
 // - With qop the nonce-count must increase; without qop (count 0) a nonce
 //   serves once. The one exception is the same count on the same request
 //   again (same fingerprint: the caller's digest of what the request would
-//   change, To, CSeq, Contacts, Expires): a retransmission over UDP, which
-//   the registrar answers as such. A replay that changes any of them, a
-//   Contact above all, is REPLAYED.
+//   change, To, CSeq, Contacts, Expires, and of where it came from) within
+//   kRetransmissionMs of its first use: a retransmission, which the
+//   registrar answers as such and never applies again. A replay that
+//   changes any of them, a Contact or the source above all, or that comes
+//   later than a client transaction retransmits (64*T1, RFC 3261 section
+//   17.1.2.2), is REPLAYED.
 //
 // Not thread-safe; everything runs on libre's thread.
 #pragma once
@@ -32,6 +35,7 @@
 class NonceTable {
  public:
   static constexpr size_t kWays = 4;
+  static constexpr uint64_t kRetransmissionMs = 64 * 500;
 
   enum class Use { FIRST_OR_NEWER, REPEATED, REPLAYED, FORGOTTEN };
 
@@ -39,14 +43,16 @@ class NonceTable {
   explicit NonceTable(size_t capacity);
 
   // Records the use of nonce, made at madeMs, with count (0 without qop) by
-  // the request of fingerprint. Only FIRST_OR_NEWER changes the table.
-  Use use(pl const& nonce, uint64_t madeMs, uint32_t count, uint64_t fingerprint);
+  // the request of fingerprint, at nowMs (a monotonic clock's). Only
+  // FIRST_OR_NEWER changes the table.
+  Use use(pl const& nonce, uint64_t madeMs, uint32_t count, uint64_t fingerprint, uint64_t nowMs);
 
  private:
   struct Entry {
     uint64_t key = 0;
     uint64_t madeMs = 0;
     uint64_t fingerprint = 0;
+    uint64_t usedMs = 0;  // when count was first used
     uint32_t count = 0;
     bool occupied = false;
   };

@@ -21,10 +21,10 @@ PASSWORDS = ["secret", "welcome", "erin-password", "topsecret"]
 FAIL2BAN = re.compile(r'^location-gateway: authentication failed for ".*" from (?P<host>\S+) port \d+', re.M)
 
 
-def register(phone, to, call_id, cseq, contact=None, auth=None, uri="sip:example.com"):
+def register(phone, to, call_id, cseq, contact=None, auth=None, uri="sip:example.com", expires=300):
     headers = []
     if contact:
-        headers += ["Contact: <%s>" % contact, "Expires: 300"]
+        headers += ["Contact: <%s>" % contact, "Expires: %d" % expires]
     if auth:
         headers.append(auth)
     return phone.build("REGISTER", uri, to, call_id, cseq, headers)
@@ -155,6 +155,84 @@ def repeated_failures_hold_the_source(program, work, emulator):
         gateway.kill()
 
 
+def contacts_of(phone, to):
+    """The Contact URIs of the 302 for to (none when there is no 302)."""
+    where = phone.send(phone.build("MESSAGE", to, to, phone.new_call_id(), 1))
+    return [c.split(">")[0].lstrip("<") for c in where.all("Contact")] if where.status == 302 else []
+
+
+def authenticated(phone, to, call_id, cseq, contact, password, expires=300):
+    """A REGISTER answering the challenge of the one before it (CSeq - 1)."""
+    first = phone.send(register(phone, to, call_id, cseq - 1, contact, expires=expires))
+    check(first.status == 401, "no challenge but %d" % first.status)
+    auth = authorization(first.challenges()[0], "REGISTER", "sip:example.com", to[4:].split("@")[0], password)
+    return register(phone, to, call_id, cseq, contact, auth, expires=expires)
+
+
+def resent(text, sender):
+    """A captured request as sender sends it again: only its Via, which no
+    digest covers, names sender, so that the answer comes back to it."""
+    return re.sub(r"(Via: SIP/2\.0/UDP )[^;]+", r"\g<1>%s:%d" % (sender.address, sender.port), text, count=1)
+
+
+def a_registration_is_applied_once(program, work, emulator):
+    gateway = Gateway(program, emulator, work, "once", SCRIPTS)
+    try:
+        phone = Phone(gateway.port)
+        alice = "sip:alice@example.com"
+        contact = "sip:alice@127.0.0.1:40001"
+        call_id = phone.new_call_id()
+        first = authenticated(phone, alice, call_id, 2, contact, "secret")
+        check(phone.send(first).status == 200, "registration refused")
+        check(phone.send(authenticated(phone, alice, call_id, 4, contact, "secret", 0)).status == 200,
+              "unregistration refused")
+        # The first request again, byte for byte, from another port and then
+        # from the phone's own: neither brings the binding back.
+        attacker = Phone(gateway.port)
+        replay = attacker.send(resent(first, attacker))
+        check(replay.status != 200, "a replay from another port answered 200")
+        found = contacts_of(phone, alice)
+        check(not any(str(attacker.port) in c for c in found), "the replay bound alice to the attacker: %r" % found)
+        again = phone.send(first)
+        check(again.status in (200, 401) and not again.all("Contact"),
+              "a late retransmission answered %d %r" % (again.status, again.all("Contact")))
+        check(not any(str(phone.port) in c for c in contacts_of(phone, alice)),
+              "a late retransmission brought the binding back")
+        attacker.close()
+        phone.close()
+        gateway.stop()
+    finally:
+        gateway.kill()
+
+
+def a_query_is_not_reflected(program, work, emulator):
+    gateway = Gateway(program, emulator, work, "reflect", SCRIPTS)
+    try:
+        phone = Phone(gateway.port)
+        alice = "sip:alice@example.com"
+        call_id = phone.new_call_id()
+        check(phone.send(authenticated(phone, alice, call_id, 2, "sip:alice@192.0.2.1", "secret")).status == 200,
+              "registration refused")
+        query = authenticated(phone, alice, call_id, 4, None, "secret")
+        check(phone.send(query).all("Contact"), "the query listed no binding")
+        for address in ("127.0.0.2", "127.0.0.3"):
+            victim = Phone(gateway.port, address)
+            copy = victim.send(resent(query, victim))
+            check(copy.status != 200 and not copy.all("Contact"),
+                  "a copy from %s answered %d %r" % (address, copy.status, copy.all("Contact")))
+            victim.close()
+        # A contact whose parameters would make every 200 large is refused.
+        long = "Contact: <sip:alice@192.0.2.9>;x=" + "a" * 600
+        challenge = phone.send(register(phone, alice, call_id, 5)).challenges()[0]
+        auth = authorization(challenge, "REGISTER", "sip:example.com", "alice", "secret")
+        answer = phone.send(phone.build("REGISTER", "sip:example.com", alice, call_id, 6, [long, auth]))
+        check(answer.status == 400, "a contact of 600 bytes answered %d" % answer.status)
+        phone.close()
+        gateway.stop()
+    finally:
+        gateway.kill()
+
+
 if __name__ == "__main__":
     if len(sys.argv) < 3:
         sys.exit("usage: authentication.py GATEWAY WORK-DIR [EMULATOR...]")
@@ -162,5 +240,7 @@ if __name__ == "__main__":
                   ("digest_over_another_uri_refused_and_logged", digest_over_another_uri_refused_and_logged),
                   ("only_challenged_or_registering_identities_register",
                    only_challenged_or_registering_identities_register),
-                  ("repeated_failures_hold_the_source", repeated_failures_hold_the_source)],
+                  ("repeated_failures_hold_the_source", repeated_failures_hold_the_source),
+                  ("a_registration_is_applied_once", a_registration_is_applied_once),
+                  ("a_query_is_not_reflected", a_query_is_not_reflected)],
                  sys.argv[1], sys.argv[2], sys.argv[3:]))
