@@ -64,6 +64,18 @@ std::string printable(pl const& text) {
   return result;
 }
 
+// What a nonce is bound to: the address over UDP, where a spoofed source
+// costs nothing and a NAT may move the port; the connection (transport,
+// address and port) over the others, which cannot be spoofed.
+std::string nonceSourceOf(sip_msg const& message) {
+  char text[80];
+  if (message.tp == SIP_TRANSP_UDP)
+    re_snprintf(text, sizeof text, "udp %j", &message.src);
+  else
+    re_snprintf(text, sizeof text, "%s %J", sip_transp_name(message.tp), &message.src);
+  return text;
+}
+
 std::string addressOf(sa const& source) {
   char text[64];
   re_snprintf(text, sizeof text, "%j port %u", &source, static_cast<unsigned int>(sa_port(&source)));
@@ -156,6 +168,7 @@ Authenticator::Outcome Authenticator::evaluate(sip_msg const& message,
                                                std::vector<std::string> const* realms,
                                                Passwords const& passwordsOf) {
   uint64_t const now = tmr_jiffies();
+  std::string const source = nonceSourceOf(message);
   unsigned int looked = 0;
   Outcome outcome;
   forEachHeader(message, SIP_HDR_AUTHORIZATION, [&](sip_hdr const& header) {
@@ -169,7 +182,7 @@ Authenticator::Outcome Authenticator::evaluate(sip_msg const& message,
           return pl_strcmp(&fields.realm, candidate.c_str()) == 0;
         }))
       return true;
-    switch (m_nonces.check(fields.nonce, fields.realm, message.callid, now)) {
+    switch (m_nonces.check(fields.nonce, fields.realm, message.callid, source, now)) {
       case NonceGenerator::Check::UNKNOWN:
         return true;
       case NonceGenerator::Check::STALE:
@@ -231,11 +244,12 @@ Authenticator::Admission Authenticator::check(Exchange& exchange,
 
 void Authenticator::challenge(Exchange& exchange, std::vector<std::string> const& realms, bool stale) {
   uint64_t const now = tmr_jiffies();
+  std::string const source = nonceSourceOf(exchange.request());
   std::string challenges;
   for (std::string const& realm : realms) {
     pl name;
     pl_set_str(&name, realm.c_str());
-    std::string const nonce = m_nonces.make(name, exchange.request().callid, now);
+    std::string const nonce = m_nonces.make(name, exchange.request().callid, source, now);
     for (DigestAlgorithm algorithm : m_offered)
       challenges += "WWW-Authenticate: " + digestChallenge(name, nonce, algorithm, stale) + "\r\n";
   }

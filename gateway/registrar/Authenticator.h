@@ -30,8 +30,9 @@
 // - The digest uri must be the Request-URI, byte for byte (RFC 3261 section
 //   22.4, RFC 7616 section 3.4.6): a response computed for another URI is a
 //   failed authentication.
-// - A nonce is bound to the realm and the Call-ID (NonceGenerator) and used
-//   at most once per nonce-count (NonceTable): an authenticated request is
+// - A nonce is bound to the realm, the Call-ID and the source
+//   (NonceGenerator) and used at most once per nonce-count (NonceTable):
+//   an authenticated request is
 //   applied at most once. The same request again, from the same source
 //   within a client transaction's lifetime, is admitted as REPEATED and
 //   changes nothing; from anywhere else or later it is a replay. Before,
@@ -49,6 +50,10 @@
 //   source address, for an operator's fail2ban; a source with kFailureLimit
 //   of them within kFailureWindowMs is then refused with 403 for
 //   kFailureHoldMs without any lookup (one more line when that starts).
+//   Only an answer to a nonce issued to that source can fail: the nonce
+//   is bound to it, so a forged UDP source with a nonce obtained elsewhere
+//   gets a challenge, and cannot set off the hold of the address it forges
+//   (a site's NAT address, and with it every phone behind).
 //
 // Owned by the Registrar; everything runs on libre's thread.
 #pragma once

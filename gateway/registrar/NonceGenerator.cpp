@@ -67,15 +67,20 @@ void NonceGenerator::useKey(std::array<uint8_t, 20> const& key) {
     std::abort();
 }
 
-std::string NonceGenerator::signature(uint64_t stamp, pl const& realm, pl const& callId) const {
+std::string NonceGenerator::signature(uint64_t stamp,
+                                      pl const& realm,
+                                      pl const& callId,
+                                      std::string const& source) const {
   char time[kTimeDigits + 1];
   std::snprintf(time, sizeof time, "%016llx", static_cast<unsigned long long>(stamp));
-  // The realm's length goes first: both texts may hold any character, and
+  // Each text's length goes first: they may hold any character, and
   // "a:b" + "c" must not sign the same as "a" + "b:c".
   std::string data(time);
   data += ':' + std::to_string(realm.l) + ':';
   data.append(realm.p, realm.l);
+  data += ':' + std::to_string(callId.l) + ':';
   data.append(callId.p, callId.l);
+  data += source;
   uint8_t mac[20];
   size_t length = 0;
   if (!EVP_MAC_init(m_mac, nullptr, 0, nullptr) ||
@@ -85,20 +90,24 @@ std::string NonceGenerator::signature(uint64_t stamp, pl const& realm, pl const&
   return time + hex(mac, sizeof mac);
 }
 
-std::string NonceGenerator::make(pl const& realm, pl const& callId, uint64_t nowMs) const {
+std::string NonceGenerator::make(pl const& realm,
+                                 pl const& callId,
+                                 std::string const& source,
+                                 uint64_t nowMs) const {
   ++m_serial;
-  return signature((nowMs << kSerialBits) | (m_serial & ((1u << kSerialBits) - 1)), realm, callId);
+  return signature((nowMs << kSerialBits) | (m_serial & ((1u << kSerialBits) - 1)), realm, callId, source);
 }
 
 NonceGenerator::Check NonceGenerator::check(pl const& nonce,
                                             pl const& realm,
                                             pl const& callId,
+                                            std::string const& source,
                                             uint64_t nowMs) const {
   uint64_t stamp = 0;
   if (nonce.l != kTimeDigits + kSignatureDigits || !parseTime(nonce.p, stamp))
     return Check::UNKNOWN;
   uint64_t const madeMs = stamp >> kSerialBits;
-  std::string const expected = signature(stamp, realm, callId);
+  std::string const expected = signature(stamp, realm, callId, source);
   // Compared in full whatever differs first, so the time taken tells
   // nothing about how much of a forged signature was right.
   unsigned char difference = 0;

@@ -2,11 +2,16 @@
 // gateway can verify and expire them without storing any. A nonce is a
 // stamp, the time it was made (milliseconds of the stack's monotonic clock)
 // shifted left by kSerialBits and a serial number of this process in those
-// bits (16 hex digits in all), followed by an HMAC-SHA1 over that time, the realm and the Call-ID
-// of the request it answers (40 hex digits) under a key drawn at random for
-// each process: only this process can make one, and a nonce serves only the
-// realm and the registration (Call-ID) it was made for, so that a captured
-// response cannot be carried over to another phone's registration. A nonce
+// bits (16 hex digits in all), followed by an HMAC-SHA1 over that time, the
+// realm, the Call-ID of the request it answers and its source (40 hex
+// digits) under a key drawn at random for each process: only this process
+// can make one, and a nonce serves only the realm, the registration
+// (Call-ID) and the source it was made for, so that a captured response
+// cannot be carried over to another phone's registration, and a nonce
+// obtained at one address cannot be answered from another. The source is
+// the caller's text: the address alone over UDP (a phone's port may move
+// between challenge and answer behind a NAT, its address rarely), the
+// connection over the others. A nonce
 // from before a restart is refused as unknown rather than stale. The serial
 // keeps two challenges of one registration within a millisecond apart:
 // NonceTable lets a nonce serve once per nonce-count, and a phone answers
@@ -46,13 +51,17 @@ class NonceGenerator {
   NonceGenerator(NonceGenerator const&) = delete;
   NonceGenerator& operator=(NonceGenerator const&) = delete;
 
-  std::string make(pl const& realm, pl const& callId, uint64_t nowMs) const;
-  Check check(pl const& nonce, pl const& realm, pl const& callId, uint64_t nowMs) const;
+  std::string make(pl const& realm, pl const& callId, std::string const& source, uint64_t nowMs) const;
+  Check check(pl const& nonce,
+              pl const& realm,
+              pl const& callId,
+              std::string const& source,
+              uint64_t nowMs) const;
   // When an authentic nonce was made, on the clock given to make().
   static uint64_t madeAt(pl const& nonce);
 
  private:
-  std::string signature(uint64_t stamp, pl const& realm, pl const& callId) const;
+  std::string signature(uint64_t stamp, pl const& realm, pl const& callId, std::string const& source) const;
 
   void useKey(std::array<uint8_t, 20> const& key);
 

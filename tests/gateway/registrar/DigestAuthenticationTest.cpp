@@ -111,29 +111,33 @@ TEST(DigestAuthentication, ChallengeListsParsed) {
   EXPECT_FALSE(parseDigestAlgorithms("SHA-1", algorithms));
 }
 
-TEST(NonceGenerator, HoldsForItsRealmCallIdAndLifetimeOnly) {
+TEST(NonceGenerator, HoldsForItsRealmCallIdSourceAndLifetimeOnly) {
   NonceGenerator nonces({1, 2, 3});
   pl const realm = text("example.com");
   pl const callId = text("a@b");
-  std::string const made = nonces.make(realm, callId, 1000);
+  std::string const source = "udp 192.0.2.1";
+  std::string const made = nonces.make(realm, callId, source, 1000);
   pl const nonce = text(made.c_str());
   EXPECT_EQ(1000u, NonceGenerator::madeAt(nonce));
   // Two challenges of one registration within a millisecond differ.
-  EXPECT_NE(made, nonces.make(realm, callId, 1000));
+  EXPECT_NE(made, nonces.make(realm, callId, source, 1000));
   EXPECT_EQ(NonceGenerator::Check::VALID,
-            nonces.check(nonce, realm, callId, 1000 + NonceGenerator::kLifetimeMs));
+            nonces.check(nonce, realm, callId, source, 1000 + NonceGenerator::kLifetimeMs));
   EXPECT_EQ(NonceGenerator::Check::STALE,
-            nonces.check(nonce, realm, callId, 1001 + NonceGenerator::kLifetimeMs));
-  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(nonce, text("example.org"), callId, 1000));
-  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(nonce, realm, text("a@c"), 1000));
-  // The realm's end cannot move into the Call-ID.
-  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(nonce, text("example.coma"), text("@b"), 1000));
-  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, NonceGenerator({4}).check(nonce, realm, callId, 1000));
+            nonces.check(nonce, realm, callId, source, 1001 + NonceGenerator::kLifetimeMs));
+  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(nonce, text("example.org"), callId, source, 1000));
+  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(nonce, realm, text("a@c"), source, 1000));
+  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(nonce, realm, callId, "udp 192.0.2.2", 1000));
+  // The realm's end cannot move into the Call-ID, nor the Call-ID's into
+  // the source.
+  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(nonce, text("example.coma"), text("@b"), source, 1000));
+  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(nonce, realm, text("a@bu"), "dp 192.0.2.1", 1000));
+  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, NonceGenerator({4}).check(nonce, realm, callId, source, 1000));
   // Another time under the same signature, or a nonce from the future.
   std::string forged = made;
   forged[15] = forged[15] == '0' ? '1' : '0';
-  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(text(forged.c_str()), realm, callId, 1000));
-  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(nonce, realm, callId, 999));
+  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(text(forged.c_str()), realm, callId, source, 1000));
+  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(nonce, realm, callId, source, 999));
 }
 
 }  // namespace

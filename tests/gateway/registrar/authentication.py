@@ -233,6 +233,30 @@ def a_query_is_not_reflected(program, work, emulator):
         gateway.kill()
 
 
+def spoofed_failures_do_not_hold_a_source(program, work, emulator):
+    gateway = Gateway(program, emulator, work, "spoofed", SCRIPTS)
+    try:
+        alice = "sip:alice@example.com"
+        # The attacker's own nonce, sent with wrong passwords "from" the
+        # site's address (a socket bound there stands for the forged source).
+        attacker = Phone(gateway.port, "127.0.0.2")
+        call_id = attacker.new_call_id()
+        challenge = attacker.send(register(attacker, alice, call_id, 1)).challenges()[0]
+        site = Phone(gateway.port)
+        for attempt in range(12):
+            auth = authorization(challenge, "REGISTER", "sip:example.com", "alice", "guess%d" % attempt)
+            check(site.send(register(site, alice, call_id, 2 + attempt, None, auth)).status != 200, "guess accepted")
+        phone = Phone(gateway.port)
+        answer = phone.send(authenticated(phone, alice, phone.new_call_id(), 2, "sip:alice@192.0.2.1", "secret"))
+        check(answer.status == 200, "a phone behind the spoofed address answered %d" % answer.status)
+        check("authentication failed" not in gateway.errors(), "a spoofed failure was counted")
+        for each in (attacker, site, phone):
+            each.close()
+        gateway.stop()
+    finally:
+        gateway.kill()
+
+
 if __name__ == "__main__":
     if len(sys.argv) < 3:
         sys.exit("usage: authentication.py GATEWAY WORK-DIR [EMULATOR...]")
@@ -242,5 +266,6 @@ if __name__ == "__main__":
                    only_challenged_or_registering_identities_register),
                   ("repeated_failures_hold_the_source", repeated_failures_hold_the_source),
                   ("a_registration_is_applied_once", a_registration_is_applied_once),
-                  ("a_query_is_not_reflected", a_query_is_not_reflected)],
+                  ("a_query_is_not_reflected", a_query_is_not_reflected),
+                  ("spoofed_failures_do_not_hold_a_source", spoofed_failures_do_not_hold_a_source)],
                  sys.argv[1], sys.argv[2], sys.argv[3:]))
