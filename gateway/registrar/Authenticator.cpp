@@ -1,6 +1,7 @@
 #include "registrar/Authenticator.h"
 
 #include <algorithm>
+#include <chrono>
 #include <iostream>
 
 #include "LS_CredentialLookup.h"
@@ -74,6 +75,14 @@ std::string nonceSourceOf(sip_msg const& message) {
   else
     re_snprintf(text, sizeof text, "%s %J", sip_transp_name(message.tp), &message.src);
   return text;
+}
+
+// The nonces' clock: the wall clock's milliseconds, which mean the same on
+// every gateway sharing the key and across a restart.
+uint64_t wallClockMs() {
+  return static_cast<uint64_t>(std::chrono::duration_cast<std::chrono::milliseconds>(
+                                   std::chrono::system_clock::now().time_since_epoch())
+                                   .count());
 }
 
 std::string addressOf(sa const& source) {
@@ -168,6 +177,7 @@ Authenticator::Outcome Authenticator::evaluate(sip_msg const& message,
                                                std::vector<std::string> const* realms,
                                                Passwords const& passwordsOf) {
   uint64_t const now = tmr_jiffies();
+  uint64_t const wallNow = wallClockMs();
   std::string const source = nonceSourceOf(message);
   unsigned int looked = 0;
   Outcome outcome;
@@ -182,10 +192,11 @@ Authenticator::Outcome Authenticator::evaluate(sip_msg const& message,
           return pl_strcmp(&fields.realm, candidate.c_str()) == 0;
         }))
       return true;
-    switch (m_nonces.check(fields.nonce, fields.realm, message.callid, source, now)) {
+    switch (m_nonces.check(fields.nonce, fields.realm, message.callid, source, wallNow)) {
       case NonceGenerator::Check::UNKNOWN:
         return true;
       case NonceGenerator::Check::STALE:
+      case NonceGenerator::Check::FOREIGN:
         outcome.stale = true;
         return true;
       case NonceGenerator::Check::VALID:
@@ -243,7 +254,7 @@ Authenticator::Admission Authenticator::check(Exchange& exchange,
 }
 
 void Authenticator::challenge(Exchange& exchange, std::vector<std::string> const& realms, bool stale) {
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = wallClockMs();
   std::string const source = nonceSourceOf(exchange.request());
   std::string challenges;
   for (std::string const& realm : realms) {

@@ -45,6 +45,12 @@
 //   gains nothing from it, and a phone that reuses its nonce carelessly
 //   gets a fresh one instead of a refusal its user would have to clear.
 //   Such a request is not a failed authentication: the password was right.
+//   The same goes for a nonce made under the shared key by another gateway
+//   of the cluster or by this one before a restart (NonceGenerator says why
+//   it is never accepted), so that a phone failing over retries at once.
+// - Two clocks: the nonces' stamps are the wall clock's (they must mean the
+//   same on every gateway), passed to NonceGenerator explicitly; the used
+//   nonces' retransmission window and the failure counts are the stack's.
 // - A failed authentication (wrong password or user, a digest over another
 //   URI) gets 403 and one line on standard error naming the user and the
 //   source address, for an operator's fail2ban; a source with kFailureLimit
@@ -88,6 +94,9 @@ class Authenticator {
 
   explicit Authenticator(LibraryClock& clock);
 
+  // The nonces' key, shared by the gateways of a cluster (--nonce-key-file);
+  // before the first request. Without it each process draws its own.
+  void useNonceKey(std::vector<uint8_t> const& key) { m_nonces.useKey(key); }
   // What each challenge offers per realm, in this order; not empty.
   void offerAlgorithms(std::vector<DigestAlgorithm> const& algorithms) { m_offered = algorithms; }
 

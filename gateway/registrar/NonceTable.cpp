@@ -21,7 +21,7 @@ NonceTable::NonceTable(size_t capacity) : m_buckets(capacity / kWays + (capacity
 }
 
 NonceTable::Use NonceTable::use(pl const& nonce,
-                                uint64_t madeMs,
+                                uint64_t made,
                                 uint32_t count,
                                 uint64_t fingerprint,
                                 uint64_t nowMs) {
@@ -40,17 +40,17 @@ NonceTable::Use NonceTable::use(pl const& nonce,
       entry.usedMs = nowMs;
       return Use::FIRST_OR_NEWER;
     }
-    if (victim->occupied && (!entry.occupied || entry.madeMs < victim->madeMs))
+    if (victim->occupied && (!entry.occupied || entry.made < victim->made))
       victim = &entry;
   }
-  if (bucket.evicted && madeMs <= bucket.floorMs)
+  if (bucket.evicted && made <= bucket.floor)
     return Use::FORGOTTEN;
   if (victim->occupied) {
-    bucket.floorMs = bucket.evicted && bucket.floorMs > victim->madeMs ? bucket.floorMs : victim->madeMs;
+    bucket.floor = bucket.evicted && bucket.floor > victim->made ? bucket.floor : victim->made;
     bucket.evicted = true;
   }
   victim->key = key;
-  victim->madeMs = madeMs;
+  victim->made = made;
   victim->count = count;
   victim->fingerprint = fingerprint;
   victim->usedMs = nowMs;

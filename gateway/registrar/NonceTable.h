@@ -10,8 +10,8 @@
 //   neither grows nor churns the table.
 // - Fixed size, set at construction: buckets of kWays entries chosen by a
 //   hash of the nonce. A nonce missing from a full bucket takes the place of
-//   the entry made earliest, and the bucket remembers that entry's time as
-//   its floor: a nonce made at or before the floor that the bucket does not
+//   the entry made earliest, and the bucket remembers when that entry was
+//   made as its floor: a nonce made at or before the floor that the bucket does not
 //   hold may have been used already, so it is answered as forgotten
 //   (stale=true, the phone retries with a fresh nonce), never accepted.
 // - With qop the nonce-count must increase; without qop (count 0) a nonce
@@ -42,15 +42,16 @@ class NonceTable {
   // capacity: entries, rounded up to whole buckets.
   explicit NonceTable(size_t capacity);
 
-  // Records the use of nonce, made at madeMs, with count (0 without qop) by
+  // Records the use of nonce, made as the made-th (NonceGenerator::madeAt(),
+  // greater for a later nonce), with count (0 without qop) by
   // the request of fingerprint, at nowMs (a monotonic clock's). Only
   // FIRST_OR_NEWER changes the table.
-  Use use(pl const& nonce, uint64_t madeMs, uint32_t count, uint64_t fingerprint, uint64_t nowMs);
+  Use use(pl const& nonce, uint64_t made, uint32_t count, uint64_t fingerprint, uint64_t nowMs);
 
  private:
   struct Entry {
     uint64_t key = 0;
-    uint64_t madeMs = 0;
+    uint64_t made = 0;
     uint64_t fingerprint = 0;
     uint64_t usedMs = 0;  // when count was first used
     uint32_t count = 0;
@@ -58,7 +59,7 @@ class NonceTable {
   };
   struct Bucket {
     Entry entries[kWays];
-    uint64_t floorMs = 0;  // see the header comment; 0 while nothing was evicted
+    uint64_t floor = 0;  // see the header comment; 0 while nothing was evicted
     bool evicted = false;
   };
 

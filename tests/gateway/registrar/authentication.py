@@ -257,6 +257,47 @@ def spoofed_failures_do_not_hold_a_source(program, work, emulator):
         gateway.kill()
 
 
+def a_nonce_of_another_gateway_is_stale(program, work, emulator):
+    key = os.path.join(work, "nonce.key")
+    if os.path.exists(key):
+        os.remove(key)
+    first = Gateway(program, emulator, work, "cluster-a", SCRIPTS, ["--nonce-key-file", key])
+    second = None
+    try:
+        check(os.stat(key).st_mode & 0o777 == 0o600, "the key file is not the owner's only")
+        second = Gateway(program, emulator, work, "cluster-b", SCRIPTS, ["--nonce-key-file", key])
+        alice = "sip:alice@example.com"
+        contact = "sip:alice@192.0.2.1"
+        # The phone fails over from the first gateway to the second.
+        phone = Phone(first.port)
+        call_id = phone.new_call_id()
+        challenge = phone.send(register(phone, alice, call_id, 1, contact)).challenges()[0]
+        auth = authorization(challenge, "REGISTER", "sip:example.com", "alice", "secret")
+        phone.target = ("127.0.0.1", second.port)
+        answer = phone.send(register(phone, alice, call_id, 2, contact, auth))
+        check(answer.status == 401 and answer.challenges() and all(c[3] for c in answer.challenges()),
+              "a nonce of the other gateway answered %d %r" % (answer.status, answer.challenges()))
+        auth = authorization(answer.challenges()[0], "REGISTER", "sip:example.com", "alice", "secret")
+        check(phone.send(register(phone, alice, call_id, 3, contact, auth)).status == 200,
+              "the fresh nonce refused")
+        # A key that is no key stops the start.
+        short = os.path.join(work, "short.key")
+        with open(short, "w") as out:
+            out.write("0123")
+        try:
+            Gateway(program, emulator, work, "short", SCRIPTS, ["--nonce-key-file", short]).kill()
+            raise Failure("a gateway started with a 4-byte key")
+        except Failure as failure:
+            check("nonce key file" in str(failure), "the start failed otherwise: %s" % failure)
+        phone.close()
+        second.stop()
+        first.stop()
+    finally:
+        first.kill()
+        if second:
+            second.kill()
+
+
 if __name__ == "__main__":
     if len(sys.argv) < 3:
         sys.exit("usage: authentication.py GATEWAY WORK-DIR [EMULATOR...]")
@@ -267,5 +308,6 @@ if __name__ == "__main__":
                   ("repeated_failures_hold_the_source", repeated_failures_hold_the_source),
                   ("a_registration_is_applied_once", a_registration_is_applied_once),
                   ("a_query_is_not_reflected", a_query_is_not_reflected),
-                  ("spoofed_failures_do_not_hold_a_source", spoofed_failures_do_not_hold_a_source)],
+                  ("spoofed_failures_do_not_hold_a_source", spoofed_failures_do_not_hold_a_source),
+                  ("a_nonce_of_another_gateway_is_stale", a_nonce_of_another_gateway_is_stale)],
                  sys.argv[1], sys.argv[2], sys.argv[3:]))
