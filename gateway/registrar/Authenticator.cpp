@@ -85,6 +85,33 @@ uint64_t wallClockMs() {
                                    .count());
 }
 
+// A registration as UnansweredChallenges knows it: its Call-ID and where
+// it comes from, port included (phones behind one NAT share the address).
+uint64_t registrationOf(sip_msg const& message) {
+  char source[80];
+  int const length = re_snprintf(source, sizeof source, "%s %J", sip_transp_name(message.tp), &message.src);
+  uint64_t hash = 14695981039346656037ull;
+  auto mix = [&](char const* bytes, size_t count) {
+    for (size_t i = 0; i < count; ++i) {
+      hash ^= static_cast<unsigned char>(bytes[i]);
+      hash *= 1099511628211ull;
+    }
+  };
+  mix(message.callid.p, message.callid.l);
+  mix("\n", 1);
+  mix(source, length > 0 ? static_cast<size_t>(length) : 0);
+  return hash;
+}
+
+bool hasCredentials(sip_msg const& message) {
+  bool found = false;
+  forEachHeader(message, SIP_HDR_AUTHORIZATION, [&](sip_hdr const&) {
+    found = true;
+    return false;
+  });
+  return found;
+}
+
 std::string addressOf(sa const& source) {
   char text[64];
   re_snprintf(text, sizeof text, "%j port %u", &source, static_cast<unsigned int>(sa_port(&source)));
@@ -103,6 +130,7 @@ bool Authenticator::refuseHeldSource(Exchange& exchange) {
 }
 
 Authenticator::Admission Authenticator::admit(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to) {
+  followChallenges(exchange);
   String error;
   Outcome const quick = evaluate(exchange.request(), nullptr, [&](String const& realm, String const& user) {
     Vector<String> passwords;
@@ -253,6 +281,26 @@ Authenticator::Admission Authenticator::check(Exchange& exchange,
   return Admission::REFUSED;
 }
 
+void Authenticator::followChallenges(Exchange& exchange) {
+  sip_msg const& message = exchange.request();
+  uint64_t const registration = registrationOf(message);
+  if (hasCredentials(message))
+    return m_unanswered.answered(registration);
+  if (!m_unanswered.gaveUp(registration, message.cseq.num))
+    return;
+  uint64_t const now = tmr_jiffies();
+  if (m_algorithmWarned && now - m_algorithmWarnedMs < kAlgorithmWarningMs)
+    return;
+  m_algorithmWarned = true;
+  m_algorithmWarnedMs = now;
+  exchange.session().flushDebugLines();
+  std::cerr << "location-gateway: \"" << printable(message.to.uri.user) << "\" from " << addressOf(message.src)
+            << " registers again without answering a challenge that offered SHA-256 first: it seems to read"
+               " only the first challenge and to know only MD5, as PJSIP before 2.12, Asterisk 18 and"
+               " FreeSWITCH 1.10 registering, and SIPp do; such phones need --digest MD5,SHA-256"
+            << std::endl;
+}
+
 void Authenticator::challenge(Exchange& exchange, std::vector<std::string> const& realms, bool stale) {
   uint64_t const now = wallClockMs();
   std::string const source = nonceSourceOf(exchange.request());
@@ -264,6 +312,8 @@ void Authenticator::challenge(Exchange& exchange, std::vector<std::string> const
     for (DigestAlgorithm algorithm : m_offered)
       challenges += "WWW-Authenticate: " + digestChallenge(name, nonce, algorithm, stale) + "\r\n";
   }
+  if (m_offered.front() == DigestAlgorithm::SHA256)
+    m_unanswered.challenged(registrationOf(exchange.request()), exchange.request().cseq.num);
   exchange.answer(401, "Unauthorized", challenges);
 }
 

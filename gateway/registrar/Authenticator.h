@@ -48,6 +48,12 @@
 //   The same goes for a nonce made under the shared key by another gateway
 //   of the cluster or by this one before a restart (NonceGenerator says why
 //   it is never accepted), so that a phone failing over retries at once.
+// - A registration challenged with SHA-256 first that answers nothing and
+//   starts over without credentials (UnansweredChallenges) gets one line on
+//   standard error naming the clients that need --digest MD5,SHA-256, at
+//   most once per kAlgorithmWarningMs: such phones take the first challenge
+//   whatever it is and give up on SHA-256, and nothing else shows why they
+//   never register.
 // - Two clocks: the nonces' stamps are the wall clock's (they must mean the
 //   same on every gateway), passed to NonceGenerator explicitly; the used
 //   nonces' retransmission window and the failure counts are the stack's.
@@ -77,6 +83,7 @@
 #include "registrar/DigestAuthentication.h"
 #include "registrar/NonceGenerator.h"
 #include "registrar/NonceTable.h"
+#include "registrar/UnansweredChallenges.h"
 #include "sip/Libre.h"
 #include "sip/SourceThrottle.h"
 
@@ -91,6 +98,7 @@ class Authenticator {
   static constexpr uint64_t kFailureWindowMs = 60 * 1000;
   static constexpr uint64_t kFailureHoldMs = 60 * 1000;
   static constexpr size_t kFailureSources = 1024;
+  static constexpr uint64_t kAlgorithmWarningMs = 60 * 1000;
 
   explicit Authenticator(LibraryClock& clock);
 
@@ -137,6 +145,9 @@ class Authenticator {
   // The evaluation against realms, answering 401 or 403 when it does not pass.
   Admission check(Exchange& exchange, std::vector<std::string> const& realms, Passwords const& passwords);
   void challenge(Exchange& exchange, std::vector<std::string> const& realms, bool stale);
+  // Notes whether the request answers its registration's last challenge,
+  // and warns when it starts over instead.
+  void followChallenges(Exchange& exchange);
   void fail(Exchange& exchange, pl const& user, char const* reason);
 
   LibraryClock& m_clock;
@@ -145,6 +156,9 @@ class Authenticator {
   NonceGenerator m_nonces;
   NonceTable m_used{kNonceCapacity};
   DigestAuthentication m_digest;
+  UnansweredChallenges m_unanswered{UnansweredChallenges::kCapacity};
+  uint64_t m_algorithmWarnedMs = 0;
+  bool m_algorithmWarned = false;
   // The throttle passes its limit and holds at the next one.
   SourceThrottle m_failingSources{kFailureLimit - 1, kFailureWindowMs, kFailureHoldMs, kFailureSources};
   // The realms the first challenged identity of each location service was

@@ -298,6 +298,37 @@ def a_nonce_of_another_gateway_is_stale(program, work, emulator):
             second.kill()
 
 
+SHA256_WARNING = re.compile(r'^location-gateway: "(\w+)" from .* registers again without answering a challenge '
+                            r'that offered SHA-256 first.*PJSIP before 2\.12.*--digest MD5,SHA-256$', re.M)
+
+
+def a_phone_giving_up_on_sha256_is_named(program, work, emulator):
+    gateway = Gateway(program, emulator, work, "giving-up", SCRIPTS)
+    try:
+        phone = Phone(gateway.port)
+        # A phone that reads both challenges: its refresh starts without
+        # credentials, and its first challenge came again (a lost 401).
+        alice = "sip:alice@example.com"
+        call_id = phone.new_call_id()
+        phone.send(register(phone, alice, call_id, 1, "sip:alice@192.0.2.1"))
+        check(phone.send(authenticated(phone, alice, call_id, 2, "sip:alice@192.0.2.1", "secret")).status == 200,
+              "registration refused")
+        check(phone.send(authenticated(phone, alice, call_id, 4, "sip:alice@192.0.2.1", "secret")).status == 200,
+              "refresh refused")
+        # One that gives up on SHA-256 and starts over later.
+        carol = "sip:carol@example.com"
+        call_id = phone.new_call_id()
+        for cseq in (1, 2):
+            check(phone.send(register(phone, carol, call_id, cseq, "sip:carol@192.0.2.3")).status == 401,
+                  "no challenge")
+        phone.close()
+        gateway.stop()
+        check(SHA256_WARNING.findall(gateway.errors()) == ["carol"],
+              "warnings: %r in %r" % (SHA256_WARNING.findall(gateway.errors()), gateway.errors()))
+    finally:
+        gateway.kill()
+
+
 if __name__ == "__main__":
     if len(sys.argv) < 3:
         sys.exit("usage: authentication.py GATEWAY WORK-DIR [EMULATOR...]")
@@ -309,5 +340,6 @@ if __name__ == "__main__":
                   ("a_registration_is_applied_once", a_registration_is_applied_once),
                   ("a_query_is_not_reflected", a_query_is_not_reflected),
                   ("spoofed_failures_do_not_hold_a_source", spoofed_failures_do_not_hold_a_source),
-                  ("a_nonce_of_another_gateway_is_stale", a_nonce_of_another_gateway_is_stale)],
+                  ("a_nonce_of_another_gateway_is_stale", a_nonce_of_another_gateway_is_stale),
+                  ("a_phone_giving_up_on_sha256_is_named", a_phone_giving_up_on_sha256_is_named)],
                  sys.argv[1], sys.argv[2], sys.argv[3:]))
