@@ -129,7 +129,9 @@ bool Authenticator::refuseHeldSource(Exchange& exchange) {
   return true;
 }
 
-Authenticator::Admission Authenticator::admit(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to) {
+Authenticator::Admission Authenticator::admit(Exchange& exchange,
+                                              LS_IIdentity* identity,
+                                              CNameAddr const& to) {
   followChallenges(exchange);
   String error;
   Outcome const quick = evaluate(exchange.request(), nullptr, [&](String const& realm, String const& user) {
@@ -249,7 +251,8 @@ Authenticator::Outcome Authenticator::evaluate(sip_msg const& message,
       outcome.failure = "no nonce-count";
       return false;
     }
-    switch (m_used.use(fields.nonce, NonceGenerator::madeAt(fields.nonce), count, fingerprintOf(message), now)) {
+    switch (
+        m_used.use(fields.nonce, NonceGenerator::madeAt(fields.nonce), count, fingerprintOf(message), now)) {
       case NonceTable::Use::FORGOTTEN:
       case NonceTable::Use::REPLAYED:
         outcome.stale = true;
@@ -294,7 +297,8 @@ void Authenticator::followChallenges(Exchange& exchange) {
   m_algorithmWarned = true;
   m_algorithmWarnedMs = now;
   exchange.session().flushDebugLines();
-  std::cerr << "location-gateway: \"" << printable(message.to.uri.user) << "\" from " << addressOf(message.src)
+  std::cerr << "location-gateway: \"" << printable(message.to.uri.user) << "\" from "
+            << addressOf(message.src)
             << " registers again without answering a challenge that offered SHA-256 first: it seems to read"
                " only the first challenge and to know only MD5, as PJSIP before 2.12, Asterisk 18 and"
                " FreeSWITCH 1.10 registering, and SIPp do; such phones need --digest MD5,SHA-256"

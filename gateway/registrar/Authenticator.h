@@ -24,24 +24,24 @@
 //   location service still gets 404: that says nothing about users.
 // - Each challenge offers SHA-256 first and MD5 second for every realm, one
 //   nonce per realm shared by both (RFC 8760): a phone takes the first it
-//   implements. Some phones take the first challenge whatever it is, and
-//   fail on SHA-256 (SIPp 3.6 among them): offerAlgorithms() changes what
-//   is offered, never what is accepted.
+//   implements. Some clients read only the first challenge and fail on
+//   SHA-256 (PJSIP before 2.12, Asterisk 18 and FreeSWITCH 1.10 as
+//   registering clients, SIPp 3.6): --digest MD5,SHA-256 serves them, and
+//   offerAlgorithms() changes what is offered, never what is accepted.
 // - The digest uri must be the Request-URI, byte for byte (RFC 3261 section
 //   22.4, RFC 7616 section 3.4.6): a response computed for another URI is a
 //   failed authentication.
 // - A nonce is bound to the realm, the Call-ID and the source
 //   (NonceGenerator) and used at most once per nonce-count (NonceTable):
-//   an authenticated request is
-//   applied at most once. The same request again, from the same source
-//   within a client transaction's lifetime, is admitted as REPEATED and
-//   changes nothing; from anywhere else or later it is a replay. Before,
-//   a repeat was told apart only by the binding holding its Call-ID and
-//   CSeq, so once that binding was gone a replay was applied as new, and a
-//   query (no Contact) could be sent again from forged sources to have the
-//   bindings listed to them. A nonce used again, or one
-//   the table no longer remembers, gets 401 with stale=true, like an expired
-//   one, as Kamailio answers a nonce-count that did not increase: a replay
+//   an authenticated request is applied at most once. The same request
+//   again, from the same source within a client transaction's lifetime, is
+//   admitted as REPEATED and changes nothing; from anywhere else or later it
+//   is a replay. The binding holding the request's Call-ID and CSeq cannot
+//   tell a repeat alone: once that binding is gone, a replay would be
+//   applied as new, and a query (no Contact) could be sent again from
+//   forged sources to have the bindings listed to them. A nonce used again,
+//   or one the table no longer remembers, gets 401 with stale=true, like an
+//   expired one, as Kamailio answers a nonce-count that did not increase: a replay
 //   gains nothing from it, and a phone that reuses its nonce carelessly
 //   gets a fresh one instead of a refusal its user would have to clear.
 //   Such a request is not a failed authentication: the password was right.

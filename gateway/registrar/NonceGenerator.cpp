@@ -164,8 +164,7 @@ NonceGenerator::Check NonceGenerator::check(pl const& nonce,
   if (nonce.l != kFields * kFieldDigits + kSignatureDigits || !parseField(nonce.p, madeMs) ||
       !parseField(nonce.p + kFieldDigits, issuer) || !parseField(nonce.p + 2 * kFieldDigits, sequence))
     return Check::UNKNOWN;
-  std::string const expected =
-      signature(std::string(nonce.p, kFields * kFieldDigits), realm, callId, source);
+  std::string const expected = signature(std::string(nonce.p, kFields * kFieldDigits), realm, callId, source);
   // Compared in full whatever differs first, so the time taken tells
   // nothing about how much of a forged signature was right.
   unsigned char difference = 0;

@@ -89,7 +89,10 @@ class NonceGenerator {
   static uint64_t madeAt(pl const& nonce);
 
  private:
-  std::string signature(std::string const& fields, pl const& realm, pl const& callId, std::string const& source) const;
+  std::string signature(std::string const& fields,
+                        pl const& realm,
+                        pl const& callId,
+                        std::string const& source) const;
 
   uint64_t m_issuer = 0;
   // Keyed once; EVP_MAC_init without a key resets it for the next MAC.

@@ -31,7 +31,8 @@ NonceTable::Use NonceTable::use(pl const& nonce,
   Entry* victim = &bucket.entries[0];
   for (Entry& entry : bucket.entries) {
     if (entry.occupied && entry.key == key) {
-      if (count == entry.count && fingerprint == entry.fingerprint && nowMs - entry.usedMs <= kRetransmissionMs)
+      if (count == entry.count && fingerprint == entry.fingerprint &&
+          nowMs - entry.usedMs <= kRetransmissionMs)
         return Use::REPEATED;
       if (count <= entry.count)
         return Use::REPLAYED;

@@ -128,7 +128,10 @@ void Registrar::forgetIfUnbound(LS_IIdentity* identity, bool created) {
   });
 }
 
-void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity, bool created, bool repeated) {
+void Registrar::update(Exchange& exchange,
+                       RefPtr<LS_IIdentity> const& identity,
+                       bool created,
+                       bool repeated) {
   sip_msg const& message = exchange.request();
   RefPtr<LS_IRegistrationInbound> face;
   m_clock.measure([&] {

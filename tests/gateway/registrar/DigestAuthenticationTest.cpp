@@ -132,7 +132,8 @@ TEST(NonceGenerator, HoldsForItsRealmCallIdSourceAndLifetimeOnly) {
   EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(nonce, realm, callId, "udp 192.0.2.2", 1000));
   // The realm's end cannot move into the Call-ID, nor the Call-ID's into
   // the source.
-  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(nonce, text("example.coma"), text("@b"), source, 1000));
+  EXPECT_EQ(NonceGenerator::Check::UNKNOWN,
+            nonces.check(nonce, text("example.coma"), text("@b"), source, 1000));
   EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(nonce, realm, text("a@bu"), "dp 192.0.2.1", 1000));
   EXPECT_EQ(NonceGenerator::Check::UNKNOWN, NonceGenerator({4}, 1).check(nonce, realm, callId, source, 1000));
   // Another time or issuer under the same signature.
@@ -163,13 +164,16 @@ TEST(NonceGenerator, SameKeyAnotherIssuerIsForeign) {
   NonceGenerator here({1, 2, 3}, 1);
   NonceGenerator there({1, 2, 3}, 2);
   std::string const made = there.make(text("r"), text("c"), "udp 192.0.2.1", 1000);
-  EXPECT_EQ(NonceGenerator::Check::FOREIGN, here.check(text(made.c_str()), text("r"), text("c"), "udp 192.0.2.1", 1000));
-  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, here.check(text(made.c_str()), text("r"), text("c"), "udp 192.0.2.2", 1000));
+  EXPECT_EQ(NonceGenerator::Check::FOREIGN,
+            here.check(text(made.c_str()), text("r"), text("c"), "udp 192.0.2.1", 1000));
+  EXPECT_EQ(NonceGenerator::Check::UNKNOWN,
+            here.check(text(made.c_str()), text("r"), text("c"), "udp 192.0.2.2", 1000));
   // A shared key installed later makes the nonces that follow checkable.
   NonceGenerator restarted({9}, 3);
   restarted.useKey({1, 2, 3});
   std::string const after = restarted.make(text("r"), text("c"), "udp 192.0.2.1", 1000);
-  EXPECT_EQ(NonceGenerator::Check::FOREIGN, here.check(text(after.c_str()), text("r"), text("c"), "udp 192.0.2.1", 1000));
+  EXPECT_EQ(NonceGenerator::Check::FOREIGN,
+            here.check(text(after.c_str()), text("r"), text("c"), "udp 192.0.2.1", 1000));
 }
 
 }  // namespace

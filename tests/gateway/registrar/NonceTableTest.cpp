@@ -35,7 +35,8 @@ TEST(NonceTable, SameRequestLaterThanARetransmissionIsReplayed) {
   std::string const nonce = "n1";
   uint64_t const used = 1000;
   ASSERT_EQ(NonceTable::Use::FIRST_OR_NEWER, table.use(text(nonce), 10, 1, 100, used));
-  EXPECT_EQ(NonceTable::Use::REPEATED, table.use(text(nonce), 10, 1, 100, used + NonceTable::kRetransmissionMs));
+  EXPECT_EQ(NonceTable::Use::REPEATED,
+            table.use(text(nonce), 10, 1, 100, used + NonceTable::kRetransmissionMs));
   EXPECT_EQ(NonceTable::Use::REPLAYED,
             table.use(text(nonce), 10, 1, 100, used + NonceTable::kRetransmissionMs + 1));
   // The window runs from the count's first use, not the nonce's.
