@@ -12,7 +12,7 @@ import re
 import sys
 
 sys.path.insert(0, os.path.join(os.path.dirname(os.path.abspath(__file__)), ".."))
-from sipphone import Failure, Gateway, Phone, authorization, check, run  # noqa: E402
+from sipphone import Failure, Gateway, Phone, StreamPhone, authorization, check, run  # noqa: E402
 
 HERE = os.path.dirname(os.path.abspath(__file__))
 SCRIPTS = [os.path.join(HERE, "subscribers.script"), os.path.join(HERE, "security.script")]
@@ -250,7 +250,16 @@ def spoofed_failures_do_not_hold_a_source(program, work, emulator):
         answer = phone.send(authenticated(phone, alice, phone.new_call_id(), 2, "sip:alice@192.0.2.1", "secret"))
         check(answer.status == 200, "a phone behind the spoofed address answered %d" % answer.status)
         check("authentication failed" not in gateway.errors(), "a spoofed failure was counted")
-        for each in (attacker, site, phone):
+        # Over TCP a nonce is its connection's, even from the same address.
+        first, second = StreamPhone(gateway.port, "tcp"), StreamPhone(gateway.port, "tcp")
+        call_id = first.new_call_id()
+        challenge = first.send(register(first, alice, call_id, 1, "sip:alice@192.0.2.1")).challenges()[0]
+        auth = authorization(challenge, "REGISTER", "sip:example.com", "alice", "secret")
+        answer = second.send(register(second, alice, call_id, 2, "sip:alice@192.0.2.1", auth))
+        check(answer.status == 401, "a nonce answered over another connection: %d" % answer.status)
+        check(first.send(register(first, alice, call_id, 3, "sip:alice@192.0.2.1", auth)).status == 200,
+              "the nonce refused over its own connection")
+        for each in (attacker, site, phone, first, second):
             each.close()
         gateway.stop()
     finally:
