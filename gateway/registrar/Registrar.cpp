@@ -73,13 +73,14 @@ void Registrar::handle(Exchange& exchange) {
       m_authenticator.refuseUnknown(exchange, to);
     return;
   }
-  if (!m_authenticator.admit(exchange, resolved.get(), to))
+  Authenticator::Admission const admission = m_authenticator.admit(exchange, resolved.get(), to);
+  if (admission == Authenticator::Admission::REFUSED)
     return;
   bool created = false;
   RefPtr<LS_IIdentity> const identity = registering(resolved.get(), to, created);
   if (!identity)
     return exchange.answer(403, "Forbidden");
-  update(exchange, identity, created);
+  update(exchange, identity, created, admission == Authenticator::Admission::REPEATED);
   forgetIfUnbound(identity.get(), created);
 }
 
@@ -127,7 +128,10 @@ void Registrar::forgetIfUnbound(LS_IIdentity* identity, bool created) {
   });
 }
 
-void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity, bool created) {
+void Registrar::update(Exchange& exchange,
+                       RefPtr<LS_IIdentity> const& identity,
+                       bool created,
+                       bool repeated) {
   sip_msg const& message = exchange.request();
   RefPtr<LS_IRegistrationInbound> face;
   m_clock.measure([&] {
@@ -160,7 +164,8 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
       return true;
     }
     ContactRequest request;
-    if (requests.size() == kMaximumContacts || !ContactHeader::parse(value, request.header)) {
+    if (requests.size() == kMaximumContacts || value.l > kMaximumContactText ||
+        !ContactHeader::parse(value, request.header)) {
       malformed = true;
       return false;
     }
@@ -187,6 +192,9 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
     case Order::RETRANSMITTED:
       return exchange.answer(200, "OK", bindingHeaders(bindings));
     case Order::NEW:
+      // Already applied once, whatever became of its bindings since.
+      if (repeated)
+        return exchange.answer(200, "OK", bindingHeaders(bindings));
       break;
   }
   size_t const before = bindings.all.size();

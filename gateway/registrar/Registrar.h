@@ -57,6 +57,15 @@
 //   answered again with the bindings in effect and changing nothing; a lower
 //   one fails the whole request with 400 (the section says only that it
 //   fails; 400 is what peers answer). Another Call-ID replaces the binding.
+//   That alone cannot tell a retransmission once its binding is gone: a
+//   request the Authenticator admits as REPEATED (its credentials used by
+//   the same request from the same source moments ago) is answered as a
+//   retransmission whatever the bindings say, and never applied again.
+// - A Contact value longer than kMaximumContactText is refused (400): each
+//   200 lists every binding with its parameters, and an answer a query can
+//   make many kilobytes long is an amplifier. 1 KiB leaves room for the
+//   push-notification parameters (pn-prid, pn-param, pn-provider) that
+//   mobile phones put in their Contact, several hundred bytes of them.
 //
 // - Every binding added, refreshed or removed (by a REGISTER, by running
 //   out, or by losing its way in) is reported to the binding store when
@@ -95,6 +104,9 @@ class Registrar {
  public:
   static constexpr size_t kMaximumBindings = 32;
   static constexpr size_t kMaximumContacts = 16;
+  // The longest Contact value kept (URI and parameters): with
+  // kMaximumBindings, what one 200 can list stays within 16 KiB.
+  static constexpr size_t kMaximumContactText = 1024;
 
   static constexpr uint32_t kConnectionWatchSeconds = 4000000;
 
@@ -194,8 +206,9 @@ class Registrar {
   // user the group answers, a dynamic identity of the user's name (created
   // set then). Null when there is none.
   RefPtr<LS_IIdentity> registering(LS_IIdentity* resolved, CNameAddr const& to, bool& created);
-  // The contacts of one accepted REGISTER applied and answered.
-  void update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity, bool created);
+  // The contacts of one accepted REGISTER applied and answered; repeated:
+  // the Authenticator found it applied already, and it is only answered.
+  void update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity, bool created, bool repeated);
   // Drops the identity's table entry when it holds no binding, and a
   // dynamic identity made for it with it.
   void forgetIfUnbound(LS_IIdentity* identity, bool created);
