@@ -13,6 +13,7 @@
 #include "sip/Capabilities.h"
 #include "sip/Exchange.h"
 #include "sip/HeaderValues.h"
+#include "store/StorableText.h"
 
 namespace {
 
@@ -145,6 +146,8 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
 
   if (message.callid.l > kMaximumCallId)
     return exchange.answer(400, "Call-ID Too Long");
+  if (!isStorableText(message.callid.p, message.callid.l))
+    return exchange.answer(400, "Bad Call-ID");
   uint32_t headerExpires = 0;
   bool const hasExpires = pl_isset(&message.expires);
   if (hasExpires && !ContactHeader::parseSeconds(message.expires, headerExpires))
@@ -160,7 +163,8 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
       return true;
     }
     ContactRequest request;
-    if (requests.size() == kMaximumContacts || !ContactHeader::parse(value, request.header)) {
+    if (requests.size() == kMaximumContacts || !isStorableText(value.p, value.l) ||
+        !ContactHeader::parse(value, request.header)) {
       malformed = true;
       return false;
     }

@@ -114,6 +114,7 @@ class Registrar {
   // Borrowed; null for none. Set before the first request; the registrar
   // reports nothing to it once it is being destroyed.
   void setStore(BindingStore* store) { m_store = store; }
+  BindingStore* store() const { return m_store; }
   // Makes the identity's bindings exactly these (on the loop's clock),
   // without reporting to the store; dynamic: the identity was created for
   // them. False when the identity has no registration face to hold them.

@@ -38,7 +38,7 @@ class PostgresBackend : public StoreBackend {
   bool connect(std::string& error) override;
   bool read(IdentityName const* identity, std::vector<StoredBinding>& bindings, std::string& error) override;
   bool deleteExpired(std::string& error) override;
-  bool write(std::vector<StoreChange> const& changes, std::string& error) override;
+  Written write(std::vector<StoreChange> const& changes, std::string& error) override;
   int notificationSocket() const override;
   bool takeNotifications(std::vector<IdentityName>& changed, std::string& error) override;
 
@@ -62,4 +62,6 @@ class PostgresBackend : public StoreBackend {
   std::string m_name;
   std::string m_origin;  // the prefix of this process's notifications
   pg_conn* m_connection = nullptr;
+  // The SQLSTATE of the first statement of the last write that failed.
+  std::string m_failedState;
 };

@@ -31,7 +31,7 @@ class SqliteBackend : public StoreBackend {
   bool connect(std::string& error) override;
   bool read(IdentityName const* identity, std::vector<StoredBinding>& bindings, std::string& error) override;
   bool deleteExpired(std::string& error) override;
-  bool write(std::vector<StoreChange> const& changes, std::string& error) override;
+  Written write(std::vector<StoreChange> const& changes, std::string& error) override;
 
  private:
   // Whether the open file is ours, intact and readable by this version;
