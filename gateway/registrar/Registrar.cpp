@@ -218,6 +218,14 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
 }
 
 void Registrar::dropRemoved(std::vector<LS_IIdentity const*> const& removed, bool checkAll) {
+  // On a store others share, another gateway may still have the identity:
+  // its bindings go from memory only, and their rows run out in the store.
+  struct Restore {
+    bool& flag;
+    bool const saved;
+    ~Restore() { flag = saved; }
+  } const restore{m_replacing, m_replacing};
+  m_replacing = m_replacing || (m_store && m_store->shared());
   for (LS_IIdentity const* identity : removed) {
     auto const found = m_bindings.find(const_cast<LS_IIdentity*>(identity));
     if (found != m_bindings.end())
@@ -529,8 +537,7 @@ Registrar::Bindings& Registrar::entryOf(RefPtr<LS_IIdentity> const& identity) {
 
 void Registrar::record(StoreChange::Kind kind, Binding const& binding) {
   bool const kept = kind == StoreChange::Kind::ADDED || kind == StoreChange::Kind::REFRESHED;
-  bool const flowBound = !binding.regId.empty() && binding.transport != SIP_TRANSP_UDP;
-  if (!m_store || m_replacing || (flowBound && kept))
+  if (!m_store || m_replacing || (boundToFlow(binding) && kept))
     return;
   Bindings const& bindings = *binding.owner;
   StoredBinding stored;
@@ -569,7 +576,9 @@ bool Registrar::replace(RefPtr<LS_IIdentity> const& identity,
   m_replacing = true;
   for (size_t i = bindings.all.size(); i-- > 0;) {
     Binding& binding = *bindings.all[i];
-    bool const wanted = std::any_of(stored.begin(), stored.end(),
+    // The store never has a binding bound to its flow: it lives here only.
+    bool const wanted = boundToFlow(binding) ||
+                        std::any_of(stored.begin(), stored.end(),
                                     [&](StoredBinding const& each) { return each.uri == binding.uri; });
     if (!wanted)
       remove(binding);

@@ -61,10 +61,14 @@
 // - Every binding added, refreshed or removed (by a REGISTER, by running
 //   out, or by losing its way in) is reported to the binding store when
 //   there is one, except one bound to its connection (an outbound flow over
-//   TCP or TLS, with a reg-id), which dies with the process. What the store
-//   hands back (at start, or another gateway's changes) comes in through
-//   replace(), which reports nothing back; a binding restored so resumes NAT
-//   pings and connection watches only when its phone next registers.
+//   TCP, TLS or WebSocket, with a reg-id), which dies with the process and
+//   which replace() therefore leaves in place. What the store hands back
+//   (at start, or another gateway's changes) comes in through replace(),
+//   which reports nothing back; a binding restored so resumes NAT pings and
+//   connection watches only when its phone next registers. A Call-ID or
+//   Contact the store could not hold (StorableText) gets 400. Identities a
+//   change removed are let go of in memory only when others share the
+//   store, whose configuration may still have them.
 //
 // Owns the bindings' timers: destroying the registrar removes every binding
 // from its face first, so that the global count of registered contacts
@@ -243,6 +247,9 @@ class Registrar {
   // Files a stored binding on the face as add() files a REGISTER's.
   void restore(Bindings& bindings, StoredBinding const& stored, uint64_t now);
   void record(StoreChange::Kind kind, Binding const& binding);
+  static bool boundToFlow(Binding const& binding) {
+    return !binding.regId.empty() && binding.transport != SIP_TRANSP_UDP;
+  }
   // Drops the binding from the table only, when its face no longer has it.
   void forget(Binding& binding);
   // Leaves telling the identity to the caller.
