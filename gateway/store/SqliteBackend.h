@@ -4,6 +4,16 @@
 // committed before it, and a batch costs one append to the log, not a sync
 // of the database.
 //
+// What that costs on a power cut (or a crash of the system): the log is
+// synced only when SQLite checkpoints it into the file, once it has grown
+// past wal_autocheckpoint's 1,000 pages, and when the last connection
+// closes at a clean exit. Every batch committed since the last checkpoint
+// may be lost, during a storm seconds of changes, on a quiet gateway hours
+// of them; the file comes back intact and consistent, as of that
+// checkpoint. synchronous=FULL would sync every batch; the README says
+// what a power cut may lose instead, since its cost to a storm of
+// REGISTERs was not measured.
+//
 // A file that exists is only read until it has shown itself to be a store
 // of ours, intact (quick_check) and not newer: a file of another kind, a
 // truncated store or a newer one is refused with a message naming it, and
