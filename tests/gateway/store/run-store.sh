@@ -13,13 +13,15 @@
 #          itself: registered at A, redirected at B; unregistered at B,
 #          unavailable at A; registered at A while the server is stopped,
 #          redirected at B once the server is back. B started again without
-#          alice leaves her binding at A. A binding bound to its TCP flow
+#          alice, or told to remove her over its control socket, leaves her
+#          binding at A. A binding bound to its TCP flow
 #          (not stored) survives B's change to its identity. A Call-ID that
 #          is not UTF-8 is refused, and a row the database refuses is
 #          dropped while the rows after it are written.
 #
 # The gateway runs through EMULATOR when one is given; SIPp and PostgreSQL
-# always run natively. Every process is bounded in time and stopped by its
+# always run natively. The console (LOCATION_CONSOLE, by default the one
+# built beside the gateway) operates a gateway over its control socket. Every process is bounded in time and stopped by its
 # PID; what a failing run printed stays in WORK-DIR.
 set -u
 
@@ -30,6 +32,7 @@ sipp=$3
 work=$4
 shift 4
 emulator=("$@")
+console=${LOCATION_CONSOLE:-$(dirname "$gateway")/../tools/console/location-console}
 subscribers=$here/../registrar/subscribers.script
 wait_limit=30
 
@@ -168,6 +171,13 @@ case $scenario in
     ! grep -q "no longer configured deleted" b.err || fail "B deleted bindings of identities it lacks"
     sleep 1
     moved a alice sip:alice@127.0.0.1:$((base + 1)) || fail "A lost alice when B started without her"
+    stop_gateway b TERM
+    start_gateway b "$postgres_uri" --control "$PWD/b.sock"
+    await_line b.err "control socket" || fail "B did not open its control socket"
+    timeout "$wait_limit" "${emulator[@]}" "$console" --connect "$PWD/b.sock" - <<<"identity example.com alice remove" \
+      >remove.out 2>remove.err || fail "B could not remove alice: $(cat remove.err)"
+    sleep 1
+    moved a alice sip:alice@127.0.0.1:$((base + 1)) || fail "A lost alice when B's configuration dropped her"
 
     # carol's TCP flow lives at A only; B's change to carol leaves it there.
     flow="<sip:carol@127.0.0.1:PORT;transport=tcp>;+sip.instance=\"<urn:uuid:00000000-0000-0000-0000-0000000000c0>\";reg-id=1"
