@@ -17,6 +17,11 @@
 // - A batch is sent in pipeline mode, its answers read every 256
 //   statements: a round trip per 256 rows rather than per row, which is
 //   what a storm of REGISTERs needs from a server across a network.
+// - A failed batch is the rows' fault (REFUSED) only when the server is
+//   still there to roll it back and the SQLSTATE's class is a data
+//   exception, an integrity constraint or a program limit; any other class
+//   (a deadlock with another gateway's batch, a full disk, a shutdown) is
+//   worth retrying whole, and so AWAY.
 #pragma once
 
 #include <string>

@@ -19,6 +19,9 @@
 // truncated store or a newer one is refused with a message naming it, and
 // is left as it was. A missing or empty file becomes a new store.
 //
+// A failed batch is the rows' fault (REFUSED) for a constraint, a value too
+// large or of the wrong type; a full disk, I/O, a lock or damage is AWAY.
+//
 // Not shared: only this process writes the file, so it has no
 // notifications. Single-threaded use, see StoreBackend.
 #pragma once
