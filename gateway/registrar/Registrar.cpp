@@ -14,6 +14,7 @@
 #include "sip/Exchange.h"
 #include "sip/HeaderValues.h"
 #include "sip/MonotonicClock.h"
+#include "store/StorableText.h"
 
 namespace {
 
@@ -149,6 +150,8 @@ void Registrar::update(Exchange& exchange,
 
   if (message.callid.l > kMaximumCallId)
     return exchange.answer(400, "Call-ID Too Long");
+  if (!isStorableText(message.callid.p, message.callid.l))
+    return exchange.answer(400, "Bad Call-ID");
   uint32_t headerExpires = 0;
   bool const hasExpires = pl_isset(&message.expires);
   if (hasExpires && !ContactHeader::parseSeconds(message.expires, headerExpires))
@@ -164,7 +167,7 @@ void Registrar::update(Exchange& exchange,
       return true;
     }
     ContactRequest request;
-    if (requests.size() == kMaximumContacts || value.l > kMaximumContactText ||
+    if (requests.size() == kMaximumContacts || value.l > kMaximumContactText || !isStorableText(value.p, value.l) ||
         !ContactHeader::parse(value, request.header)) {
       malformed = true;
       return false;
@@ -227,6 +230,14 @@ void Registrar::update(Exchange& exchange,
 }
 
 void Registrar::dropRemoved(std::vector<LS_IIdentity const*> const& removed, bool checkAll) {
+  // On a store others share, another gateway may still have the identity:
+  // its bindings go from memory only, and their rows run out in the store.
+  struct Restore {
+    bool& flag;
+    bool const saved;
+    ~Restore() { flag = saved; }
+  } const restore{m_replacing, m_replacing};
+  m_replacing = m_replacing || (m_store && m_store->shared());
   for (LS_IIdentity const* identity : removed) {
     auto const found = m_bindings.find(const_cast<LS_IIdentity*>(identity));
     if (found != m_bindings.end())
@@ -541,8 +552,7 @@ Registrar::Bindings& Registrar::entryOf(RefPtr<LS_IIdentity> const& identity) {
 
 void Registrar::record(StoreChange::Kind kind, Binding const& binding) {
   bool const kept = kind == StoreChange::Kind::ADDED || kind == StoreChange::Kind::REFRESHED;
-  bool const flowBound = !binding.regId.empty() && binding.transport != SIP_TRANSP_UDP;
-  if (!m_store || m_replacing || (flowBound && kept))
+  if (!m_store || m_replacing || (boundToFlow(binding) && kept))
     return;
   Bindings const& bindings = *binding.owner;
   StoredBinding stored;
@@ -581,7 +591,9 @@ bool Registrar::replace(RefPtr<LS_IIdentity> const& identity,
   m_replacing = true;
   for (size_t i = bindings.all.size(); i-- > 0;) {
     Binding& binding = *bindings.all[i];
-    bool const wanted = std::any_of(stored.begin(), stored.end(),
+    // The store never has a binding bound to its flow: it lives here only.
+    bool const wanted = boundToFlow(binding) ||
+                        std::any_of(stored.begin(), stored.end(),
                                     [&](StoredBinding const& each) { return each.uri == binding.uri; });
     if (!wanted)
       remove(binding);

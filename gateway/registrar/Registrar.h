@@ -70,10 +70,14 @@
 // - Every binding added, refreshed or removed (by a REGISTER, by running
 //   out, or by losing its way in) is reported to the binding store when
 //   there is one, except one bound to its connection (an outbound flow over
-//   TCP or TLS, with a reg-id), which dies with the process. What the store
-//   hands back (at start, or another gateway's changes) comes in through
-//   replace(), which reports nothing back; a binding restored so resumes NAT
-//   pings and connection watches only when its phone next registers.
+//   TCP, TLS or WebSocket, with a reg-id), which dies with the process and
+//   which replace() therefore leaves in place. What the store hands back
+//   (at start, or another gateway's changes) comes in through replace(),
+//   which reports nothing back; a binding restored so resumes NAT pings and
+//   connection watches only when its phone next registers. A Call-ID or
+//   Contact the store could not hold (StorableText) gets 400. Identities a
+//   change removed are let go of in memory only when others share the
+//   store, whose configuration may still have them.
 //
 // Owns the bindings' timers: destroying the registrar removes every binding
 // from its face first, so that the global count of registered contacts
@@ -127,6 +131,7 @@ class Registrar {
   // Borrowed; null for none. Set before the first request; the registrar
   // reports nothing to it once it is being destroyed.
   void setStore(BindingStore* store) { m_store = store; }
+  BindingStore* store() const { return m_store; }
   // Makes the identity's bindings exactly these (on MonotonicClock),
   // without reporting to the store; dynamic: the identity was created for
   // them. False when the identity has no registration face to hold them.
@@ -259,6 +264,9 @@ class Registrar {
   // Files a stored binding on the face as add() files a REGISTER's.
   void restore(Bindings& bindings, StoredBinding const& stored, uint64_t now);
   void record(StoreChange::Kind kind, Binding const& binding);
+  static bool boundToFlow(Binding const& binding) {
+    return !binding.regId.empty() && binding.transport != SIP_TRANSP_UDP;
+  }
   // Drops the binding from the table only, when its face no longer has it.
   void forget(Binding& binding);
   // Leaves telling the identity to the caller.
