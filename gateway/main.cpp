@@ -66,7 +66,15 @@ char const kUsage[] =
     "  --statistics  at exit, the requests answered and the CPU time spent\n"
     "                in the library's calls\n"
     "  --digest LIST the algorithms each challenge offers, in order\n"
-    "                (default SHA-256,MD5; both are always accepted)\n"
+    "                (default SHA-256,MD5; both are always accepted); phones\n"
+    "                that read only the first challenge and know only MD5\n"
+    "                (PJSIP before 2.12, Asterisk 18 and FreeSWITCH 1.10\n"
+    "                registering, SIPp) need MD5,SHA-256\n"
+    "  --nonce-key-file PATH  the key that signs the nonces, shared by the\n"
+    "                gateways of a cluster so that a nonce of one gets a\n"
+    "                fresh challenge with stale=true at another, and after\n"
+    "                a restart; made (mode 0600) when missing; default a\n"
+    "                key of the process's own\n"
     "  --redirect-from CIDR  answer INVITE and the other redirected requests\n"
     "                only from this network (repeatable; default any source)\n"
     "  --source-rate N  refuse a source address sending more than N requests\n"
@@ -85,9 +93,9 @@ char const kUsage[] =
     "                   into FILE as save writes it (at most once a second)\n"
     "  --metrics ADDR:PORT  GET /metrics over HTTP, in Prometheus text format\n"
     "\n"
-    "Exit status: 0 after a signal, 1 when a script line fails, a listener\n"
-    "or the store cannot be opened, 2 for a usage error or an unreadable\n"
-    "script.\n";
+    "Exit status: 0 after a signal, 1 when a script line fails, a listener,\n"
+    "the store or the nonce key file cannot be opened, 2 for a usage error\n"
+    "or an unreadable script.\n";
 
 // A number of seconds, all digits, at least 1.
 bool seconds(char const* text, uint32_t& value) {
@@ -110,6 +118,7 @@ struct Options {
   bool debug = false;
   bool statistics = false;
   std::vector<DigestAlgorithm> digest{DigestAlgorithm::SHA256, DigestAlgorithm::MD5};
+  std::string nonceKeyFile;
   std::vector<std::string> redirectFrom;
   unsigned long sourceRate = 0;
   SecureTransportOptions secure;
@@ -151,6 +160,8 @@ bool parse(int argc, char** argv, Options& options) {
       options.statistics = true;
     else if (argument == "--digest" && i + 1 < argc && parseDigestAlgorithms(argv[i + 1], options.digest))
       ++i;
+    else if (argument == "--nonce-key-file" && i + 1 < argc)
+      options.nonceKeyFile = argv[++i];
     else if (argument == "--tls" && i + 1 < argc)
       options.secure.tls = argv[++i];
     else if (argument == "--ws" && i + 1 < argc)
@@ -261,6 +272,14 @@ int serve(ScriptSession& session, Options const& options) {
   }
   SipFrontEnd frontEnd(session, clock);
   frontEnd.registrar().authenticator().offerAlgorithms(options.digest);
+  if (!options.nonceKeyFile.empty()) {
+    std::vector<uint8_t> key;
+    if (!NonceGenerator::loadKeyFile(options.nonceKeyFile, key, error)) {
+      std::cerr << "location-gateway: " << error << "\n";
+      return 1;
+    }
+    frontEnd.registrar().authenticator().useNonceKey(key);
+  }
   frontEnd.trustForTrunks(options.caFile);
   for (std::string const& network : options.redirectFrom)
     frontEnd.redirector().sources().allow(network);

@@ -10,6 +10,7 @@
 #include <stdexcept>
 
 #include "ModelSaver.h"
+#include "sip/MonotonicClock.h"
 
 namespace {
 
@@ -58,7 +59,7 @@ void Autosave::changed() {
   m_pending = true;
   if (tmr_isrunning(&m_timer))
     return;
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = MonotonicClock::nowMs();
   uint64_t const due = m_lastWriteMs == 0 ? now : m_lastWriteMs + kIntervalMs;
   tmr_start(&m_timer, due > now ? due - now : 0, onTimer, this);
 }
@@ -69,7 +70,7 @@ void Autosave::onTimer(void* autosave) {
 
 void Autosave::write() {
   m_pending = false;
-  m_lastWriteMs = tmr_jiffies();
+  m_lastWriteMs = MonotonicClock::nowMs();
   std::string script;
   try {
     script = ModelSaver(m_session).script();

@@ -14,6 +14,8 @@ std::string GatewayStatistics::text() const {
   text += "failed authentications: " + std::to_string(failedAuthentications) + "\n";
   text += "bindings: " + std::to_string(bindings) +
           ", dropped with their identity: " + std::to_string(bindingsDropped) + "\n";
+  text += "store: rows refused " + std::to_string(storeRowsRefused) + ", changes dropped from a full queue " +
+          std::to_string(storeChangesDropped) + "\n";
   text += "registered contacts (library): " + std::to_string(registeredContacts) + "\n";
   size_t registered = 0;
   for (Trunk const& trunk : trunks)

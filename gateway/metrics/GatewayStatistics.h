@@ -24,6 +24,10 @@ struct GatewayStatistics {
   uint64_t bindings = 0;
   // Bindings let go because a change removed their identity.
   uint64_t bindingsDropped = 0;
+  // Changes the binding store's database refused (each dropped), and
+  // changes dropped from its full queue while it was away.
+  uint64_t storeRowsRefused = 0;
+  uint64_t storeChangesDropped = 0;
   // The library's process-wide count of registered contacts.
   int64_t registeredContacts = 0;
   std::vector<Trunk> trunks;

@@ -49,6 +49,12 @@ std::string render(GatewayStatistics const& statistics) {
   family(out, "bindings_dropped_total", "counter",
          "Bindings dropped because a change removed their identity.");
   sample(out, "bindings_dropped_total", "", static_cast<double>(statistics.bindingsDropped));
+  family(out, "store_rows_refused_total", "counter",
+         "Changes the binding store's database refused, each dropped and logged.");
+  sample(out, "store_rows_refused_total", "", static_cast<double>(statistics.storeRowsRefused));
+  family(out, "store_changes_dropped_total", "counter",
+         "Changes dropped from the binding store's full queue while it was away.");
+  sample(out, "store_changes_dropped_total", "", static_cast<double>(statistics.storeChangesDropped));
   family(out, "registered_contacts", "gauge",
          "The location library's process-wide count of registered contacts.");
   sample(out, "registered_contacts", "", static_cast<double>(statistics.registeredContacts));

@@ -1,6 +1,7 @@
 #include "registrar/Authenticator.h"
 
 #include <algorithm>
+#include <chrono>
 #include <iostream>
 
 #include "LS_CredentialLookup.h"
@@ -9,6 +10,7 @@
 #include "LS_IdentityResolution.h"
 #include "LS_ServiceResolution.h"
 #include "sip/Exchange.h"
+#include "sip/MonotonicClock.h"
 
 namespace {
 
@@ -26,8 +28,9 @@ void forEachHeader(sip_msg const& message, sip_hdrid id, Visit visit) {
   }
 }
 
-// What a REGISTER would change, digested: a retransmission has the same, a
-// replay with another Contact, CSeq, To or Expires does not.
+// What a REGISTER would change and where it came from, digested: a
+// retransmission has the same, a replay with another Contact, CSeq, To or
+// Expires, or from another address, port or transport, does not.
 uint64_t fingerprintOf(sip_msg const& message) {
   uint64_t hash = 14695981039346656037ull;
   auto mix = [&](char const* bytes, size_t length) {
@@ -46,6 +49,9 @@ uint64_t fingerprintOf(sip_msg const& message) {
     mix(header.val.p, header.val.l);
     return true;
   });
+  char source[80];
+  int const length = re_snprintf(source, sizeof source, "%s %J", sip_transp_name(message.tp), &message.src);
+  mix(source, length > 0 ? static_cast<size_t>(length) : 0);
   return hash;
 }
 
@@ -60,6 +66,53 @@ std::string printable(pl const& text) {
   return result;
 }
 
+// What a nonce is bound to: the address over UDP, where a spoofed source
+// costs nothing and a NAT may move the port; the connection (transport,
+// address and port) over the others, which cannot be spoofed.
+std::string nonceSourceOf(sip_msg const& message) {
+  char text[80];
+  if (message.tp == SIP_TRANSP_UDP)
+    re_snprintf(text, sizeof text, "udp %j", &message.src);
+  else
+    re_snprintf(text, sizeof text, "%s %J", sip_transp_name(message.tp), &message.src);
+  return text;
+}
+
+// The nonces' clock: the wall clock's milliseconds, which mean the same on
+// every gateway sharing the key and across a restart.
+uint64_t wallClockMs() {
+  return static_cast<uint64_t>(std::chrono::duration_cast<std::chrono::milliseconds>(
+                                   std::chrono::system_clock::now().time_since_epoch())
+                                   .count());
+}
+
+// A registration as UnansweredChallenges knows it: its Call-ID and where
+// it comes from, port included (phones behind one NAT share the address).
+uint64_t registrationOf(sip_msg const& message) {
+  char source[80];
+  int const length = re_snprintf(source, sizeof source, "%s %J", sip_transp_name(message.tp), &message.src);
+  uint64_t hash = 14695981039346656037ull;
+  auto mix = [&](char const* bytes, size_t count) {
+    for (size_t i = 0; i < count; ++i) {
+      hash ^= static_cast<unsigned char>(bytes[i]);
+      hash *= 1099511628211ull;
+    }
+  };
+  mix(message.callid.p, message.callid.l);
+  mix("\n", 1);
+  mix(source, length > 0 ? static_cast<size_t>(length) : 0);
+  return hash;
+}
+
+bool hasCredentials(sip_msg const& message) {
+  bool found = false;
+  forEachHeader(message, SIP_HDR_AUTHORIZATION, [&](sip_hdr const&) {
+    found = true;
+    return false;
+  });
+  return found;
+}
+
 std::string addressOf(sa const& source) {
   char text[64];
   re_snprintf(text, sizeof text, "%j port %u", &source, static_cast<unsigned int>(sa_port(&source)));
@@ -71,13 +124,16 @@ std::string addressOf(sa const& source) {
 Authenticator::Authenticator(LibraryClock& clock) : m_clock(clock) {}
 
 bool Authenticator::refuseHeldSource(Exchange& exchange) {
-  if (!m_failingSources.held(exchange.request().src, tmr_jiffies()))
+  if (!m_failingSources.held(exchange.request().src, MonotonicClock::nowMs()))
     return false;
   exchange.answer(403, "Forbidden");
   return true;
 }
 
-bool Authenticator::admit(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to) {
+Authenticator::Admission Authenticator::admit(Exchange& exchange,
+                                              LS_IIdentity* identity,
+                                              CNameAddr const& to) {
+  followChallenges(exchange);
   String error;
   Outcome const quick = evaluate(exchange.request(), nullptr, [&](String const& realm, String const& user) {
     Vector<String> passwords;
@@ -88,16 +144,16 @@ bool Authenticator::admit(Exchange& exchange, LS_IIdentity* identity, CNameAddr 
     return passwords;
   });
   if (quick.accepted)
-    return true;
+    return quick.repeated ? Admission::REPEATED : Admission::ACCEPTED;
   Vector<LS_ProtocolRealm> realms;
   m_clock.measure([&] { LS_getInboundAuthenticationChallenge(error, realms, identity, nullptr); });
   if (realms.isEmpty()) {
     RefPtr<LS_IRegistrationInbound> face;
     m_clock.measure([&] { LS_getFaceIf(identity, LS_IdentityFace::REGISTRATION_INBOUND, face); });
     if (face)
-      return true;
+      return Admission::ACCEPTED;
     exchange.answer(403, "Forbidden");
-    return false;
+    return Admission::REFUSED;
   }
   std::vector<std::string> names;
   for (LS_ProtocolRealm const& realm : realms)
@@ -151,7 +207,9 @@ void Authenticator::refuseUnknown(Exchange& exchange, CNameAddr const& to) {
 Authenticator::Outcome Authenticator::evaluate(sip_msg const& message,
                                                std::vector<std::string> const* realms,
                                                Passwords const& passwordsOf) {
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = MonotonicClock::nowMs();
+  uint64_t const wallNow = wallClockMs();
+  std::string const source = nonceSourceOf(message);
   unsigned int looked = 0;
   Outcome outcome;
   forEachHeader(message, SIP_HDR_AUTHORIZATION, [&](sip_hdr const& header) {
@@ -165,10 +223,11 @@ Authenticator::Outcome Authenticator::evaluate(sip_msg const& message,
           return pl_strcmp(&fields.realm, candidate.c_str()) == 0;
         }))
       return true;
-    switch (m_nonces.check(fields.nonce, fields.realm, message.callid, now)) {
+    switch (m_nonces.check(fields.nonce, fields.realm, message.callid, source, wallNow)) {
       case NonceGenerator::Check::UNKNOWN:
         return true;
       case NonceGenerator::Check::STALE:
+      case NonceGenerator::Check::FOREIGN:
         outcome.stale = true;
         return true;
       case NonceGenerator::Check::VALID:
@@ -193,13 +252,17 @@ Authenticator::Outcome Authenticator::evaluate(sip_msg const& message,
       outcome.failure = "no nonce-count";
       return false;
     }
-    switch (m_used.use(fields.nonce, NonceGenerator::madeAt(fields.nonce), count, fingerprintOf(message))) {
+    switch (
+        m_used.use(fields.nonce, NonceGenerator::madeAt(fields.nonce), count, fingerprintOf(message), now)) {
       case NonceTable::Use::FORGOTTEN:
       case NonceTable::Use::REPLAYED:
         outcome.stale = true;
         return true;
-      case NonceTable::Use::FIRST_OR_NEWER:
       case NonceTable::Use::REPEATED:
+        outcome.repeated = true;
+        outcome.accepted = true;
+        return false;
+      case NonceTable::Use::FIRST_OR_NEWER:
         outcome.accepted = true;
         return false;
     }
@@ -208,30 +271,54 @@ Authenticator::Outcome Authenticator::evaluate(sip_msg const& message,
   return outcome;
 }
 
-bool Authenticator::check(Exchange& exchange,
-                          std::vector<std::string> const& realms,
-                          Passwords const& passwordsOf) {
+Authenticator::Admission Authenticator::check(Exchange& exchange,
+                                              std::vector<std::string> const& realms,
+                                              Passwords const& passwordsOf) {
   Outcome const outcome = evaluate(exchange.request(), &realms, passwordsOf);
   if (outcome.accepted)
-    return true;
+    return outcome.repeated ? Admission::REPEATED : Admission::ACCEPTED;
   if (outcome.failure) {
     fail(exchange, outcome.user, outcome.failure);
-    return false;
+    return Admission::REFUSED;
   }
   challenge(exchange, realms, outcome.stale);
-  return false;
+  return Admission::REFUSED;
+}
+
+void Authenticator::followChallenges(Exchange& exchange) {
+  sip_msg const& message = exchange.request();
+  uint64_t const registration = registrationOf(message);
+  if (hasCredentials(message))
+    return m_unanswered.answered(registration);
+  if (!m_unanswered.gaveUp(registration, message.cseq.num))
+    return;
+  uint64_t const now = MonotonicClock::nowMs();
+  if (m_algorithmWarned && now - m_algorithmWarnedMs < kAlgorithmWarningMs)
+    return;
+  m_algorithmWarned = true;
+  m_algorithmWarnedMs = now;
+  exchange.session().flushDebugLines();
+  std::cerr << "location-gateway: \"" << printable(message.to.uri.user) << "\" from "
+            << addressOf(message.src)
+            << " registers again without answering a challenge that offered SHA-256 first: it seems to read"
+               " only the first challenge and to know only MD5, as PJSIP before 2.12, Asterisk 18 and"
+               " FreeSWITCH 1.10 registering, and SIPp do; such phones need --digest MD5,SHA-256"
+            << std::endl;
 }
 
 void Authenticator::challenge(Exchange& exchange, std::vector<std::string> const& realms, bool stale) {
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = wallClockMs();
+  std::string const source = nonceSourceOf(exchange.request());
   std::string challenges;
   for (std::string const& realm : realms) {
     pl name;
     pl_set_str(&name, realm.c_str());
-    std::string const nonce = m_nonces.make(name, exchange.request().callid, now);
+    std::string const nonce = m_nonces.make(name, exchange.request().callid, source, now);
     for (DigestAlgorithm algorithm : m_offered)
       challenges += "WWW-Authenticate: " + digestChallenge(name, nonce, algorithm, stale) + "\r\n";
   }
+  if (m_offered.front() == DigestAlgorithm::SHA256)
+    m_unanswered.challenged(registrationOf(exchange.request()), exchange.request().cseq.num);
   exchange.answer(401, "Unauthorized", challenges);
 }
 
@@ -240,7 +327,7 @@ void Authenticator::fail(Exchange& exchange, pl const& user, char const* reason)
   sa const& source = exchange.request().src;
   std::cerr << "location-gateway: authentication failed for \"" << printable(user) << "\" from "
             << addressOf(source) << ": " << reason << std::endl;
-  if (m_failingSources.count(source, tmr_jiffies()) == SourceThrottle::Verdict::HELD_NOW)
+  if (m_failingSources.count(source, MonotonicClock::nowMs()) == SourceThrottle::Verdict::HELD_NOW)
     std::cerr << "location-gateway: " << addressOf(source) << " refused for " << kFailureHoldMs / 1000
               << " s after " << kFailureLimit << " failed authentications" << std::endl;
   exchange.answer(403, "Forbidden");

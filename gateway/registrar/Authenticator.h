@@ -24,24 +24,48 @@
 //   location service still gets 404: that says nothing about users.
 // - Each challenge offers SHA-256 first and MD5 second for every realm, one
 //   nonce per realm shared by both (RFC 8760): a phone takes the first it
-//   implements. Some phones take the first challenge whatever it is, and
-//   fail on SHA-256 (SIPp 3.6 among them): offerAlgorithms() changes what
-//   is offered, never what is accepted.
+//   implements. Some clients read only the first challenge and fail on
+//   SHA-256 (PJSIP before 2.12, Asterisk 18 and FreeSWITCH 1.10 as
+//   registering clients, SIPp 3.6): --digest MD5,SHA-256 serves them, and
+//   offerAlgorithms() changes what is offered, never what is accepted.
 // - The digest uri must be the Request-URI, byte for byte (RFC 3261 section
 //   22.4, RFC 7616 section 3.4.6): a response computed for another URI is a
 //   failed authentication.
-// - A nonce is bound to the realm and the Call-ID (NonceGenerator) and used
-//   at most once per nonce-count (NonceTable). A nonce used again, or one
-//   the table no longer remembers, gets 401 with stale=true, like an expired
-//   one, as Kamailio answers a nonce-count that did not increase: a replay
+// - A nonce is bound to the realm, the Call-ID and the source
+//   (NonceGenerator) and used at most once per nonce-count (NonceTable):
+//   an authenticated request is applied at most once. The same request
+//   again, from the same source within a client transaction's lifetime, is
+//   admitted as REPEATED and changes nothing; from anywhere else or later it
+//   is a replay. The binding holding the request's Call-ID and CSeq cannot
+//   tell a repeat alone: once that binding is gone, a replay would be
+//   applied as new, and a query (no Contact) could be sent again from
+//   forged sources to have the bindings listed to them. A nonce used again,
+//   or one the table no longer remembers, gets 401 with stale=true, like an
+//   expired one, as Kamailio answers a nonce-count that did not increase: a replay
 //   gains nothing from it, and a phone that reuses its nonce carelessly
 //   gets a fresh one instead of a refusal its user would have to clear.
 //   Such a request is not a failed authentication: the password was right.
+//   The same goes for a nonce made under the shared key by another gateway
+//   of the cluster or by this one before a restart (NonceGenerator says why
+//   it is never accepted), so that a phone failing over retries at once.
+// - A registration challenged with SHA-256 first that answers nothing and
+//   starts over without credentials (UnansweredChallenges) gets one line on
+//   standard error naming the clients that need --digest MD5,SHA-256, at
+//   most once per kAlgorithmWarningMs: such phones take the first challenge
+//   whatever it is and give up on SHA-256, and nothing else shows why they
+//   never register.
+// - Two clocks: the nonces' stamps are the wall clock's (they must mean the
+//   same on every gateway), passed to NonceGenerator explicitly; the used
+//   nonces' retransmission window and the failure counts are the stack's.
 // - A failed authentication (wrong password or user, a digest over another
 //   URI) gets 403 and one line on standard error naming the user and the
 //   source address, for an operator's fail2ban; a source with kFailureLimit
 //   of them within kFailureWindowMs is then refused with 403 for
 //   kFailureHoldMs without any lookup (one more line when that starts).
+//   Only an answer to a nonce issued to that source can fail: the nonce
+//   is bound to it, so a forged UDP source with a nonce obtained elsewhere
+//   gets a challenge, and cannot set off the hold of the address it forges
+//   (a site's NAT address, and with it every phone behind).
 //
 // Owned by the Registrar; everything runs on libre's thread.
 #pragma once
@@ -59,6 +83,7 @@
 #include "registrar/DigestAuthentication.h"
 #include "registrar/NonceGenerator.h"
 #include "registrar/NonceTable.h"
+#include "registrar/UnansweredChallenges.h"
 #include "sip/Libre.h"
 #include "sip/SourceThrottle.h"
 
@@ -66,16 +91,20 @@ class Exchange;
 
 class Authenticator {
  public:
-  // 16 K nonces of 32 bytes: half a megabyte, a few seconds of a storm of
-  // new registrations before a phone's own nonce could be pushed out.
+  // 16 K nonces of 40 bytes: 640 KiB, a few seconds of a storm of new
+  // registrations before a phone's own nonce could be pushed out.
   static constexpr size_t kNonceCapacity = 16 * 1024;
   static constexpr uint32_t kFailureLimit = 10;
   static constexpr uint64_t kFailureWindowMs = 60 * 1000;
   static constexpr uint64_t kFailureHoldMs = 60 * 1000;
   static constexpr size_t kFailureSources = 1024;
+  static constexpr uint64_t kAlgorithmWarningMs = 60 * 1000;
 
   explicit Authenticator(LibraryClock& clock);
 
+  // The nonces' key, shared by the gateways of a cluster (--nonce-key-file);
+  // before the first request. Without it each process draws its own.
+  void useNonceKey(std::vector<uint8_t> const& key) { m_nonces.useKey(key); }
   // What each challenge offers per realm, in this order; not empty.
   void offerAlgorithms(std::vector<DigestAlgorithm> const& algorithms) { m_offered = algorithms; }
 
@@ -84,8 +113,13 @@ class Authenticator {
 
   // True, after answering 403, when the request's source is held.
   bool refuseHeldSource(Exchange& exchange);
-  // Whether identity, which to denotes, may register with this request.
-  bool admit(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to);
+  // What admit() makes of a request. REPEATED: credentials already used by
+  // this very request, from the same source, moments ago; the registrar
+  // answers it as the retransmission it is and applies nothing.
+  enum class Admission { REFUSED, ACCEPTED, REPEATED };
+  // Whether identity, which to denotes, may register with this request;
+  // REFUSED after answering it.
+  Admission admit(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to);
   // Answers a REGISTER whose To (to, parsed) denotes no identity.
   void refuseUnknown(Exchange& exchange, CNameAddr const& to);
 
@@ -95,6 +129,7 @@ class Authenticator {
   // What the request's Authorization headers come to.
   struct Outcome {
     bool accepted = false;
+    bool repeated = false;          // accepted as a retransmission
     bool stale = false;             // a nonce expired, used or forgotten
     char const* failure = nullptr;  // why a failed authentication failed
     pl user{};                      // whose it was
@@ -108,8 +143,11 @@ class Authenticator {
                    std::vector<std::string> const* realms,
                    Passwords const& passwordsOf);
   // The evaluation against realms, answering 401 or 403 when it does not pass.
-  bool check(Exchange& exchange, std::vector<std::string> const& realms, Passwords const& passwords);
+  Admission check(Exchange& exchange, std::vector<std::string> const& realms, Passwords const& passwords);
   void challenge(Exchange& exchange, std::vector<std::string> const& realms, bool stale);
+  // Notes whether the request answers its registration's last challenge,
+  // and warns when it starts over instead.
+  void followChallenges(Exchange& exchange);
   void fail(Exchange& exchange, pl const& user, char const* reason);
 
   LibraryClock& m_clock;
@@ -118,6 +156,9 @@ class Authenticator {
   NonceGenerator m_nonces;
   NonceTable m_used{kNonceCapacity};
   DigestAuthentication m_digest;
+  UnansweredChallenges m_unanswered{UnansweredChallenges::kCapacity};
+  uint64_t m_algorithmWarnedMs = 0;
+  bool m_algorithmWarned = false;
   // The throttle passes its limit and holds at the next one.
   SourceThrottle m_failingSources{kFailureLimit - 1, kFailureWindowMs, kFailureHoldMs, kFailureSources};
   // The realms the first challenged identity of each location service was

@@ -11,11 +11,21 @@
 //   answered. A transaction would retransmit for 32 s and cost a timer
 //   each, for thousands of bindings, where the next ping serves as the
 //   retransmission.
+// - An answer counts only when it comes from the address and port its ping
+//   went to, and names its binding by an id drawn at random when the
+//   binding is watched (64 bits from the stack's generator, which OpenSSL
+//   feeds): otherwise anyone could keep a dead binding, and the calls
+//   redirected to it, alive by answering for it. An answer that names no
+//   watched binding, or comes from elsewhere, is taken and ignored.
 // - Any answer counts, an error included: it proves the mapping is open.
 //   A ping still unanswered when the next is due counts as missed; after
 //   kMisses missed in a row the binding is lost.
 // - All watched bindings are pinged on one timer tick; a binding watched
-//   anew (its registration refreshed) starts again with no misses.
+//   anew (its registration refreshed) starts again with no misses. The tick
+//   is a MonotonicTimer: on the stack's timers a step of the system clock
+//   forward would tick at once and count misses no phone could have
+//   avoided, and a step back would hold the pings, and the NAT mappings
+//   with them, for as long as the step.
 //
 // Owned by the registrar, which watches and forgets its bindings by an
 // opaque key; the stack outlives it. lost may forget or drop the binding.
@@ -27,6 +37,7 @@
 #include <string>
 
 #include "sip/Libre.h"
+#include "sip/MonotonicTimer.h"
 
 class NatPinger {
  public:
@@ -50,7 +61,7 @@ class NatPinger {
     std::string target;
     sa address;
     void* socket;
-    uint64_t id;  // in the Call-ID of its pings, for matching answers
+    uint64_t id;  // random, in the Call-ID of its pings, for matching answers
     unsigned int misses;
     bool outstanding;
   };
@@ -63,9 +74,8 @@ class NatPinger {
   uint64_t m_intervalMs;
   Lost m_lost;
   void* m_argument;
-  tmr m_timer;
+  MonotonicTimer m_timer;
   sip_lsnr* m_listener = nullptr;
   std::map<void const*, Entry> m_entries;
   std::map<uint64_t, void const*> m_byId;
-  uint64_t m_nextId = 1;
 };

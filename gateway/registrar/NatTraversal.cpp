@@ -22,13 +22,17 @@ bool NatTraversal::isUnreachable(sa const& address) {
   return sa_is_linklocal(&address) || sa_is_loopback(&address);
 }
 
-bool NatTraversal::natedTarget(pl const& contactUri, sa const& source, std::string& target) {
+bool NatTraversal::natedTarget(pl const& contactUri,
+                               sa const& source,
+                               sip_transp transport,
+                               std::string& target) {
   uri contact;
   sa host;
   if (uri_decode(&contact, &contactUri) != 0 ||
       sa_set(&host, &contact.host, contact.port ? contact.port : 5060) != 0)
     return false;
-  if (!isUnreachable(host) || sa_cmp(&host, &source, SA_ALL))
+  bool const connection = transport != SIP_TRANSP_UDP;
+  if (!isUnreachable(host) || sa_cmp(&host, &source, connection ? SA_ADDR : SA_ALL))
     return false;
   char address[64];
   if (sa_ntop(&source, address, sizeof address) != 0)

@@ -9,10 +9,12 @@
 //   the ranges no NAT forwards to from outside: private (RFC 1918),
 //   shared (RFC 6598, carrier-grade NAT), link-local or loopback, and the
 //   REGISTER came from another address or port (5060 when the Contact
-//   names none). A name is never NATed: resolving it here would cost a
-//   DNS lookup per registration, and a phone that has a name is reachable
-//   by it. IPv6 unique local addresses (fc00::/7) are left alone: IPv6
-//   needs no NAT, and such an address is routable within its site.
+//   names none). Over a connection (TCP, TLS, WebSocket) only the address
+//   counts: the connection's source port is one the phone's system drew
+//   for it, never the port the phone listens on, so a phone on the LAN
+//   would otherwise be sent to a port nobody listens on. A name is never NATed: resolving it here would cost
+//   a DNS lookup per registration, and a phone that has a name is reachable by it. IPv6 unique local
+//   addresses (fc00::/7) are left alone: IPv6 needs no NAT, and such an address is routable within its site.
 // - The target is the Contact with its host and port replaced by the
 //   source's; user, parameters and headers stay, so that the phone still
 //   recognises the request as its own.
@@ -31,8 +33,8 @@ namespace NatTraversal {
 bool isUnreachable(sa const& address);
 
 // The contact URI calls must go to when its registration came from
-// source: true with the rewritten URI in target when the contact is NATed,
+// source over transport: true with the rewritten URI in target when the contact is NATed,
 // false (target untouched) when it is to be used as it is.
-bool natedTarget(pl const& contactUri, sa const& source, std::string& target);
+bool natedTarget(pl const& contactUri, sa const& source, sip_transp transport, std::string& target);
 
 }  // namespace NatTraversal

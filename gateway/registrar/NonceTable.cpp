@@ -20,34 +20,41 @@ NonceTable::NonceTable(size_t capacity) : m_buckets(capacity / kWays + (capacity
     m_buckets.resize(1);
 }
 
-NonceTable::Use NonceTable::use(pl const& nonce, uint64_t madeMs, uint32_t count, uint64_t fingerprint) {
+NonceTable::Use NonceTable::use(pl const& nonce,
+                                uint64_t made,
+                                uint32_t count,
+                                uint64_t fingerprint,
+                                uint64_t nowMs) {
   uint64_t const key = keyOf(nonce);
   Bucket& bucket = m_buckets[static_cast<size_t>(key % m_buckets.size())];
   // A free entry, else the one made earliest.
   Entry* victim = &bucket.entries[0];
   for (Entry& entry : bucket.entries) {
     if (entry.occupied && entry.key == key) {
-      if (count == entry.count && fingerprint == entry.fingerprint)
+      if (count == entry.count && fingerprint == entry.fingerprint &&
+          nowMs - entry.usedMs <= kRetransmissionMs)
         return Use::REPEATED;
       if (count <= entry.count)
         return Use::REPLAYED;
       entry.count = count;
       entry.fingerprint = fingerprint;
+      entry.usedMs = nowMs;
       return Use::FIRST_OR_NEWER;
     }
-    if (victim->occupied && (!entry.occupied || entry.madeMs < victim->madeMs))
+    if (victim->occupied && (!entry.occupied || entry.made < victim->made))
       victim = &entry;
   }
-  if (bucket.evicted && madeMs <= bucket.floorMs)
+  if (bucket.evicted && made <= bucket.floor)
     return Use::FORGOTTEN;
   if (victim->occupied) {
-    bucket.floorMs = bucket.evicted && bucket.floorMs > victim->madeMs ? bucket.floorMs : victim->madeMs;
+    bucket.floor = bucket.evicted && bucket.floor > victim->made ? bucket.floor : victim->made;
     bucket.evicted = true;
   }
   victim->key = key;
-  victim->madeMs = madeMs;
+  victim->made = made;
   victim->count = count;
   victim->fingerprint = fingerprint;
+  victim->usedMs = nowMs;
   victim->occupied = true;
   return Use::FIRST_OR_NEWER;
 }

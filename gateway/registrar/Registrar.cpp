@@ -13,6 +13,8 @@
 #include "sip/Capabilities.h"
 #include "sip/Exchange.h"
 #include "sip/HeaderValues.h"
+#include "sip/MonotonicClock.h"
+#include "store/StorableText.h"
 
 namespace {
 
@@ -53,7 +55,6 @@ Registrar::~Registrar() {
     removeAll(entry.second);
     reportTransition(entry.second, before);
   }
-  tmr_cancel(&m_sweep);
 }
 
 void Registrar::start(sip& stack, ExpiryRange const& expiry, uint32_t natPingSeconds) {
@@ -73,13 +74,14 @@ void Registrar::handle(Exchange& exchange) {
       m_authenticator.refuseUnknown(exchange, to);
     return;
   }
-  if (!m_authenticator.admit(exchange, resolved.get(), to))
+  Authenticator::Admission const admission = m_authenticator.admit(exchange, resolved.get(), to);
+  if (admission == Authenticator::Admission::REFUSED)
     return;
   bool created = false;
   RefPtr<LS_IIdentity> const identity = registering(resolved.get(), to, created);
   if (!identity)
     return exchange.answer(403, "Forbidden");
-  update(exchange, identity, created);
+  update(exchange, identity, created, admission == Authenticator::Admission::REPEATED);
   forgetIfUnbound(identity.get(), created);
 }
 
@@ -127,7 +129,10 @@ void Registrar::forgetIfUnbound(LS_IIdentity* identity, bool created) {
   });
 }
 
-void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity, bool created) {
+void Registrar::update(Exchange& exchange,
+                       RefPtr<LS_IIdentity> const& identity,
+                       bool created,
+                       bool repeated) {
   sip_msg const& message = exchange.request();
   RefPtr<LS_IRegistrationInbound> face;
   m_clock.measure([&] {
@@ -145,6 +150,8 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
 
   if (message.callid.l > kMaximumCallId)
     return exchange.answer(400, "Call-ID Too Long");
+  if (!isStorableText(message.callid.p, message.callid.l))
+    return exchange.answer(400, "Bad Call-ID");
   uint32_t headerExpires = 0;
   bool const hasExpires = pl_isset(&message.expires);
   if (hasExpires && !ContactHeader::parseSeconds(message.expires, headerExpires))
@@ -160,7 +167,8 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
       return true;
     }
     ContactRequest request;
-    if (requests.size() == kMaximumContacts || !ContactHeader::parse(value, request.header)) {
+    if (requests.size() == kMaximumContacts || value.l > kMaximumContactText || !isStorableText(value.p, value.l) ||
+        !ContactHeader::parse(value, request.header)) {
       malformed = true;
       return false;
     }
@@ -187,6 +195,9 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
     case Order::RETRANSMITTED:
       return exchange.answer(200, "OK", bindingHeaders(bindings));
     case Order::NEW:
+      // Already applied once, whatever became of its bindings since.
+      if (repeated)
+        return exchange.answer(200, "OK", bindingHeaders(bindings));
       break;
   }
   size_t const before = bindings.all.size();
@@ -198,7 +209,12 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
       remove(*binding);
   }
   CHostPort const received = sourceOf(message);
+  // Named before any newcomer is filed, so that a refresh listed after a
+  // new contact never gives way to it.
   std::vector<Binding*> kept;
+  for (ContactRequest const& request : requests)
+    if (Binding* const binding = request.expires != 0 ? find(bindings, request.header) : nullptr)
+      kept.push_back(binding);
   for (ContactRequest const& request : requests) {
     if (request.expires == 0)
       continue;
@@ -214,6 +230,14 @@ void Registrar::update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity,
 }
 
 void Registrar::dropRemoved(std::vector<LS_IIdentity const*> const& removed, bool checkAll) {
+  // On a store others share, another gateway may still have the identity:
+  // its bindings go from memory only, and their rows run out in the store.
+  struct Restore {
+    bool& flag;
+    bool const saved;
+    ~Restore() { flag = saved; }
+  } const restore{m_replacing, m_replacing};
+  m_replacing = m_replacing || (m_store && m_store->shared());
   for (LS_IIdentity const* identity : removed) {
     auto const found = m_bindings.find(const_cast<LS_IIdentity*>(identity));
     if (found != m_bindings.end())
@@ -239,7 +263,7 @@ void Registrar::dropRemoved(std::vector<LS_IIdentity const*> const& removed, boo
 }
 
 std::vector<Registrar::BindingView> Registrar::bindings(LS_IIdentity const* identity) const {
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = MonotonicClock::nowMs();
   std::vector<BindingView> views;
   for (auto const& entry : m_bindings) {
     if (identity && entry.first != identity)
@@ -312,11 +336,14 @@ Registrar::Binding* Registrar::find(Bindings& bindings, ContactHeader const& con
   return nullptr;
 }
 
-CNameAddr Registrar::targetOf(ContactHeader const& header, sa const& source, std::string& natedTarget) {
+CNameAddr Registrar::targetOf(ContactHeader const& header,
+                              sa const& source,
+                              sip_transp transport,
+                              std::string& natedTarget) {
   pl uri;
   pl_set_str(&uri, header.uri.c_str());
   CNameAddr target = header.contact;
-  if (NatTraversal::natedTarget(uri, source, natedTarget) &&
+  if (NatTraversal::natedTarget(uri, source, transport, natedTarget) &&
       !target.Parse(natedTarget.data(), natedTarget.size()))
     target = header.contact;
   return target;
@@ -366,7 +393,7 @@ Registrar::Binding* Registrar::add(Bindings& bindings,
                                    CHostPort const& received,
                                    Binding* binding) {
   std::string natedTarget;
-  CNameAddr const target = targetOf(request.header, message.src, natedTarget);
+  CNameAddr const target = targetOf(request.header, message.src, message.tp, natedTarget);
   bool const nated = !natedTarget.empty();
   bool const fresh = !binding;
   binding = file(bindings, binding, request.header, target, text(message.callid), message.src, received,
@@ -375,7 +402,7 @@ Registrar::Binding* Registrar::add(Bindings& bindings,
     return nullptr;
   binding->cseq = message.cseq.num;
   binding->transport = message.tp;
-  binding->expiresAtMs = tmr_jiffies() + uint64_t{request.expires} * 1000;
+  binding->expiresAtMs = MonotonicClock::nowMs() + uint64_t{request.expires} * 1000;
   schedule(*binding);
   record(fresh ? StoreChange::Kind::ADDED : StoreChange::Kind::REFRESHED, *binding);
   binding->connection = static_cast<sip_keepalive*>(mem_deref(binding->connection));
@@ -447,7 +474,7 @@ void Registrar::reportTransition(Bindings& bindings, size_t before) {
 }
 
 std::string Registrar::bindingHeaders(Bindings const& bindings) {
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = MonotonicClock::nowMs();
   std::string headers;
   for (auto const& binding : bindings.all) {
     uint64_t const remainingMs = binding->expiresAtMs > now ? binding->expiresAtMs - now : 0;
@@ -465,7 +492,7 @@ void Registrar::schedule(Binding& binding) {
     rearm();
 }
 
-// The stack timer stays set for an earlier binding that went: the sweep it
+// The timer stays set for an earlier binding that went: the sweep it
 // then makes finds nothing due and sets it again.
 void Registrar::unschedule(Binding& binding) {
   m_expiries.erase(binding.expiry);
@@ -473,15 +500,15 @@ void Registrar::unschedule(Binding& binding) {
 
 void Registrar::rearm() {
   if (m_expiries.empty())
-    return tmr_cancel(&m_sweep);
-  uint64_t const now = tmr_jiffies();
+    return m_sweep.cancel();
+  uint64_t const now = MonotonicClock::nowMs();
   uint64_t const first = m_expiries.begin()->first;
-  tmr_start(&m_sweep, first > now ? first - now : 0, onSweep, this);
+  m_sweep.start(first > now ? first - now : 0, onSweep, this);
 }
 
 void Registrar::onSweep(void* argument) {
   Registrar& registrar = *static_cast<Registrar*>(argument);
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = MonotonicClock::nowMs();
   while (!registrar.m_expiries.empty() && registrar.m_expiries.begin()->first <= now)
     registrar.lose(*registrar.m_expiries.begin()->second, nullptr);
   registrar.rearm();
@@ -525,8 +552,7 @@ Registrar::Bindings& Registrar::entryOf(RefPtr<LS_IIdentity> const& identity) {
 
 void Registrar::record(StoreChange::Kind kind, Binding const& binding) {
   bool const kept = kind == StoreChange::Kind::ADDED || kind == StoreChange::Kind::REFRESHED;
-  bool const flowBound = !binding.regId.empty() && binding.transport != SIP_TRANSP_UDP;
-  if (!m_store || m_replacing || (flowBound && kept))
+  if (!m_store || m_replacing || (boundToFlow(binding) && kept))
     return;
   Bindings const& bindings = *binding.owner;
   StoredBinding stored;
@@ -565,12 +591,14 @@ bool Registrar::replace(RefPtr<LS_IIdentity> const& identity,
   m_replacing = true;
   for (size_t i = bindings.all.size(); i-- > 0;) {
     Binding& binding = *bindings.all[i];
-    bool const wanted = std::any_of(stored.begin(), stored.end(),
+    // The store never has a binding bound to its flow: it lives here only.
+    bool const wanted = boundToFlow(binding) ||
+                        std::any_of(stored.begin(), stored.end(),
                                     [&](StoredBinding const& each) { return each.uri == binding.uri; });
     if (!wanted)
       remove(binding);
   }
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = MonotonicClock::nowMs();
   for (StoredBinding const& each : stored)
     restore(bindings, each, now);
   m_replacing = false;
@@ -590,8 +618,12 @@ void Registrar::restore(Bindings& bindings, StoredBinding const& stored, uint64_
   header.uri = stored.uri;
   uint32_t const expires =
       static_cast<uint32_t>(std::min<uint64_t>((stored.expiresAtMs - now + 999) / 1000, UINT32_MAX));
+  sip_transp transport = SIP_TRANSP_UDP;
+  for (sip_transp each : {SIP_TRANSP_TCP, SIP_TRANSP_TLS})
+    if (stored.transport == transportName(each))
+      transport = each;
   std::string natedTarget;
-  CNameAddr const target = targetOf(header, source, natedTarget);
+  CNameAddr const target = targetOf(header, source, transport, natedTarget);
   CHostPort received;
   received.Parse(stored.source.data(), stored.source.size());
   Binding* const binding =
@@ -599,10 +631,7 @@ void Registrar::restore(Bindings& bindings, StoredBinding const& stored, uint64_
   if (!binding)
     return;
   binding->cseq = stored.cseq;
-  binding->transport = SIP_TRANSP_UDP;
-  for (sip_transp transport : {SIP_TRANSP_TCP, SIP_TRANSP_TLS})
-    if (stored.transport == transportName(transport))
-      binding->transport = transport;
+  binding->transport = transport;
   binding->expiresAtMs = stored.expiresAtMs;
   schedule(*binding);
 }

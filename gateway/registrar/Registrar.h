@@ -57,14 +57,27 @@
 //   answered again with the bindings in effect and changing nothing; a lower
 //   one fails the whole request with 400 (the section says only that it
 //   fails; 400 is what peers answer). Another Call-ID replaces the binding.
+//   That alone cannot tell a retransmission once its binding is gone: a
+//   request the Authenticator admits as REPEATED (its credentials used by
+//   the same request from the same source moments ago) is answered as a
+//   retransmission whatever the bindings say, and never applied again.
+// - A Contact value longer than kMaximumContactText is refused (400): each
+//   200 lists every binding with its parameters, and an answer a query can
+//   make many kilobytes long is an amplifier. 1 KiB leaves room for the
+//   push-notification parameters (pn-prid, pn-param, pn-provider) that
+//   mobile phones put in their Contact, several hundred bytes of them.
 //
 // - Every binding added, refreshed or removed (by a REGISTER, by running
 //   out, or by losing its way in) is reported to the binding store when
 //   there is one, except one bound to its connection (an outbound flow over
-//   TCP or TLS, with a reg-id), which dies with the process. What the store
-//   hands back (at start, or another gateway's changes) comes in through
-//   replace(), which reports nothing back; a binding restored so resumes NAT
-//   pings and connection watches only when its phone next registers.
+//   TCP, TLS or WebSocket, with a reg-id), which dies with the process and
+//   which replace() therefore leaves in place. What the store hands back
+//   (at start, or another gateway's changes) comes in through replace(),
+//   which reports nothing back; a binding restored so resumes NAT pings and
+//   connection watches only when its phone next registers. A Call-ID or
+//   Contact the store could not hold (StorableText) gets 400. Identities a
+//   change removed are let go of in memory only when others share the
+//   store, whose configuration may still have them.
 //
 // Owns the bindings' timers: destroying the registrar removes every binding
 // from its face first, so that the global count of registered contacts
@@ -86,6 +99,7 @@
 #include "registrar/ExpiryRange.h"
 #include "registrar/NatPinger.h"
 #include "sip/Libre.h"
+#include "sip/MonotonicTimer.h"
 #include "store/BindingStore.h"
 
 class Exchange;
@@ -94,10 +108,13 @@ class Registrar {
  public:
   static constexpr size_t kMaximumBindings = 32;
   static constexpr size_t kMaximumContacts = 16;
+  // The longest Contact value kept (URI and parameters): with
+  // kMaximumBindings, what one 200 can list stays within 16 KiB.
+  static constexpr size_t kMaximumContactText = 1024;
 
   static constexpr uint32_t kConnectionWatchSeconds = 4000000;
 
-  explicit Registrar(LibraryClock& clock) : m_clock(clock), m_authenticator(clock) { tmr_init(&m_sweep); }
+  explicit Registrar(LibraryClock& clock) : m_clock(clock), m_authenticator(clock) {}
   ~Registrar();
   Registrar(Registrar const&) = delete;
   Registrar& operator=(Registrar const&) = delete;
@@ -114,7 +131,8 @@ class Registrar {
   // Borrowed; null for none. Set before the first request; the registrar
   // reports nothing to it once it is being destroyed.
   void setStore(BindingStore* store) { m_store = store; }
-  // Makes the identity's bindings exactly these (on the loop's clock),
+  BindingStore* store() const { return m_store; }
+  // Makes the identity's bindings exactly these (on MonotonicClock),
   // without reporting to the store; dynamic: the identity was created for
   // them. False when the identity has no registration face to hold them.
   bool replace(RefPtr<LS_IIdentity> const& identity,
@@ -144,11 +162,11 @@ class Registrar {
  private:
   struct Bindings;
   struct Binding;
-  // Every binding by the time it runs out, earliest first. One stack timer
-  // serves them all, set for the earliest: the stack keeps its timers on
-  // one sorted list that each new timer walks, so a timer per binding would
-  // make every transaction's own timers cost as many steps as there are
-  // bindings.
+  // Every binding by the time it runs out, earliest first. One timer
+  // serves them all, set for the earliest: a timer per binding would cost a
+  // descriptor each, or on the stack's timers, which it keeps on one sorted
+  // list that each new timer walks, make every transaction's own timers
+  // cost as many steps as there are bindings.
   using Expiries = std::multimap<uint64_t, Binding*>;
   // What a binding holds: what the registration said and where it came from.
   struct Binding {
@@ -166,7 +184,7 @@ class Registrar {
     std::string regId;
     std::string callId;
     uint32_t cseq;
-    uint64_t expiresAtMs;       // on the stack's clock, tmr_jiffies()
+    uint64_t expiresAtMs;       // on MonotonicClock
     sa source;                  // where the REGISTER came from
     sip_transp transport;       // and over what
     Expiries::iterator expiry;  // its entry in m_expiries
@@ -193,8 +211,9 @@ class Registrar {
   // user the group answers, a dynamic identity of the user's name (created
   // set then). Null when there is none.
   RefPtr<LS_IIdentity> registering(LS_IIdentity* resolved, CNameAddr const& to, bool& created);
-  // The contacts of one accepted REGISTER applied and answered.
-  void update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity, bool created);
+  // The contacts of one accepted REGISTER applied and answered; repeated:
+  // the Authenticator found it applied already, and it is only answered.
+  void update(Exchange& exchange, RefPtr<LS_IIdentity> const& identity, bool created, bool repeated);
   // Drops the identity's table entry when it holds no binding, and a
   // dynamic identity made for it with it.
   void forgetIfUnbound(LS_IIdentity* identity, bool created);
@@ -223,10 +242,13 @@ class Registrar {
                ContactRequest const& newcomer);
   // The table entry for identity, its names read when it is new.
   Bindings& entryOf(RefPtr<LS_IIdentity> const& identity);
-  // Where calls to a contact registered from source go: the contact, or
-  // for a NATed one the source, whose URI natedTarget then receives (it
-  // stays empty otherwise).
-  static CNameAddr targetOf(ContactHeader const& header, sa const& source, std::string& natedTarget);
+  // Where calls to a contact registered from source over transport go:
+  // the contact, or for a NATed one the source, whose URI natedTarget then
+  // receives (it stays empty otherwise).
+  static CNameAddr targetOf(ContactHeader const& header,
+                            sa const& source,
+                            sip_transp transport,
+                            std::string& natedTarget);
   // What add() and restore() share: files header on the face under target
   // as binding (null for a new one) and records what it says and where it
   // came from. Null when the face refused it. The caller sets the rest
@@ -242,6 +264,9 @@ class Registrar {
   // Files a stored binding on the face as add() files a REGISTER's.
   void restore(Bindings& bindings, StoredBinding const& stored, uint64_t now);
   void record(StoreChange::Kind kind, Binding const& binding);
+  static bool boundToFlow(Binding const& binding) {
+    return !binding.regId.empty() && binding.transport != SIP_TRANSP_UDP;
+  }
   // Drops the binding from the table only, when its face no longer has it.
   void forget(Binding& binding);
   // Leaves telling the identity to the caller.
@@ -253,11 +278,11 @@ class Registrar {
   void reportTransition(Bindings& bindings, size_t before);
   // The 200's own header lines: the bindings, the date, what is supported.
   static std::string bindingHeaders(Bindings const& bindings);
-  // (Re)files the binding under its time; sets the stack timer when it is
-  // now the earliest.
+  // (Re)files the binding under its time; sets the timer when it is now
+  // the earliest.
   void schedule(Binding& binding);
   void unschedule(Binding& binding);
-  // Sets the stack timer for the earliest expiry, or stops it.
+  // Sets the timer for the earliest expiry, or stops it.
   void rearm();
   // Drops every binding of the table entry's identity, and the entry.
   void drop(std::map<LS_IIdentity*, Bindings>::iterator entry);
@@ -279,6 +304,6 @@ class Registrar {
   Authenticator m_authenticator;
   std::map<LS_IIdentity*, Bindings> m_bindings;
   Expiries m_expiries;
-  tmr m_sweep;
+  MonotonicTimer m_sweep;
   uint64_t m_bindingsDropped = 0;
 };

@@ -63,8 +63,9 @@ bool Admission::toGateway(Exchange& exchange) const {
   if (!own && namesListener(message.uri)) {
     CNameAddr target;
     String error;
-    own = target.Parse(message.ruri.p, message.ruri.l) &&
-          !exchange.clock().measure([&] { return exchange.session().resolve(error, target); });
+    own = !m_redirectSources.admits(message.src) ||
+          (target.Parse(message.ruri.p, message.ruri.l) &&
+           !exchange.clock().measure([&] { return exchange.session().resolve(error, target); }));
   }
   if (!own)
     return false;

@@ -95,6 +95,10 @@ GatewayStatistics SipFrontEnd::statistics() const {
   statistics.failedAuthentications = m_registrar.failedAuthentications();
   statistics.bindings = m_registrar.bindingCount();
   statistics.bindingsDropped = m_registrar.bindingsDropped();
+  if (BindingStore const* const store = m_registrar.store()) {
+    statistics.storeRowsRefused = store->rowsRefused();
+    statistics.storeChangesDropped = store->changesDropped();
+  }
   statistics.registeredContacts = s_sipStatistics.getInboundRegistrations();
   m_trunks->forEach([&](std::string const& path, bool registered) {
     statistics.trunks.push_back(GatewayStatistics::Trunk{path, registered});

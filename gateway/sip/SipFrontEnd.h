@@ -35,7 +35,10 @@
 class SipFrontEnd {
  public:
   SipFrontEnd(ScriptSession& session, LibraryClock& clock)
-      : m_session(session), m_clock(clock), m_registrar(clock), m_admission(m_listeners) {}
+      : m_session(session),
+        m_clock(clock),
+        m_registrar(clock),
+        m_admission(m_listeners, m_redirector.sources()) {}
   ~SipFrontEnd();
   SipFrontEnd(SipFrontEnd const&) = delete;
   SipFrontEnd& operator=(SipFrontEnd const&) = delete;

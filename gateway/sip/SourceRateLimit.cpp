@@ -2,8 +2,10 @@
 
 #include <iostream>
 
+#include "sip/MonotonicClock.h"
+
 bool SourceRateLimit::admit(sip& stack, sip_msg const& request) {
-  switch (m_throttle.count(request.src, tmr_jiffies())) {
+  switch (m_throttle.count(request.src, MonotonicClock::nowMs())) {
     case SourceThrottle::Verdict::PASSED:
       return true;
     case SourceThrottle::Verdict::HELD:

@@ -14,13 +14,16 @@ bool BindingReplay::restore(BindingStore& store, std::string& error) {
   if (!store.load(loaded, error))
     return false;
   size_t restored = 0;
-  size_t deleted = 0;
+  size_t unknown = 0;
+  bool const shared = store.shared();
   for (auto const& entry : grouped(loaded)) {
     if (replace(entry.first, entry.second)) {
       restored += entry.second.size();
       continue;
     }
-    deleted += entry.second.size();
+    unknown += entry.second.size();
+    if (shared)
+      continue;
     for (StoredBinding const& binding : entry.second)
       store.record(StoreChange::Kind::REMOVED, binding);
   }
@@ -28,9 +31,14 @@ bool BindingReplay::restore(BindingStore& store, std::string& error) {
   std::cerr << "location-gateway: " << restored << (restored == 1 ? " binding" : " bindings")
             << " restored from the store in " << std::fixed << std::setprecision(2) << took.count() << " s"
             << std::endl;
-  if (deleted)
-    std::cerr << "location-gateway: " << deleted << (deleted == 1 ? " stored binding" : " stored bindings")
+  if (unknown && !shared)
+    std::cerr << "location-gateway: " << unknown << (unknown == 1 ? " stored binding" : " stored bindings")
               << " of identities no longer configured deleted" << std::endl;
+  if (unknown && shared)
+    std::cerr << "location-gateway: " << unknown << (unknown == 1 ? " stored binding" : " stored bindings")
+              << " of identities not configured here ignored; the store is shared, so they stay for the "
+                 "gateways that have them"
+              << std::endl;
   m_registrar.setStore(&store);
   store.start([this](BindingStore::Update const& update) { apply(update); });
   return true;

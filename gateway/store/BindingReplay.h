@@ -8,10 +8,13 @@
 //   that only the "DEFAULT" group answers is marked dynamic and its
 //   identity is created again. A binding whose identity the configuration
 //   no longer has (or whose service is gone, or that is now a group) is
-//   deleted from the store at start and counted in one log line: nothing
-//   could ever answer with it. Another gateway's binding for an identity
-//   this one lacks is only ignored, since that gateway's configuration may
-//   have it.
+//   counted in one log line at start, and deleted from the store only when
+//   the store is this gateway's alone: only then did this configuration own
+//   it, and nothing could ever answer with it. On a store others share the
+//   difference may be theirs or this gateway's, and this one cannot tell
+//   which: the row is ignored, and runs out at its expiry unless a gateway
+//   that has the identity refreshes it. Another gateway's binding for an
+//   identity this one lacks is ignored likewise.
 // - Restoring happens before the front-end listens, so the first request
 //   already sees every binding.
 //

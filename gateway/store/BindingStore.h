@@ -58,6 +58,14 @@ class BindingStore {
   // Writes everything queued and stops; waits for it. Later records are
   // dropped.
   virtual void close() = 0;
+  // Whether other gateways write the store too. Then what this one's
+  // configuration lacks says nothing about theirs: it deletes no binding
+  // for an identity it does not have (see BindingReplay).
+  virtual bool shared() const { return false; }
+  // Changes the database refused, and changes dropped from a full queue,
+  // since the start; any thread.
+  virtual uint64_t rowsRefused() const { return 0; }
+  virtual uint64_t changesDropped() const { return 0; }
 
   // WHERE: a file path (SQLite), a postgresql:// or postgres:// URI, or
   // "none" (then store is null). False with a text naming WHERE when it

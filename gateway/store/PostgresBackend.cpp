@@ -5,6 +5,7 @@
 #include <set>
 
 #include "sip/Libre.h"
+#include "sip/MonotonicClock.h"
 #include "store/StoreSchema.h"
 
 namespace {
@@ -25,6 +26,17 @@ constexpr char kDeleteIfExpiredName[] = "delete_if_expired";
 constexpr char kSeparator = '\t';
 // Statements sent before their answers are read, in one write.
 constexpr size_t kPipelineDepth = 256;
+
+// Whether a statement failed for what its row holds, the server being fine:
+// a data exception (a byte sequence the database's encoding refuses, a value
+// out of range), an integrity constraint, or a program limit (an index row
+// or a notification too large). Connection, resource, operator and
+// transaction-rollback classes (a deadlock between two gateways' batches)
+// are the store's, and the batch is tried again as a whole.
+bool refusedForTheRow(std::string const& state) {
+  std::string const kind = state.substr(0, 2);
+  return kind == "22" || kind == "23" || kind == "54";
+}
 
 }  // namespace
 
@@ -165,7 +177,7 @@ bool PostgresBackend::read(IdentityName const* identity,
   PGresult* result = nullptr;
   if (!run(sql, parameters, error, &result))
     return false;
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = MonotonicClock::nowMs();
   int const rows = PQntuples(result);
   for (int row = 0; row < rows; ++row) {
     char const* columns[10];
@@ -183,14 +195,15 @@ bool PostgresBackend::deleteExpired(std::string& error) {
   return run(StoreSchema::withClock(StoreSchema::kDeleteExpired, kNow), {}, error);
 }
 
-bool PostgresBackend::write(std::vector<StoreChange> const& changes, std::string& error) {
+StoreBackend::Written PostgresBackend::write(std::vector<StoreChange> const& changes, std::string& error) {
   if (!m_connection)
-    return false;
+    return Written::AWAY;
   if (!PQenterPipelineMode(m_connection)) {
     error = failure("cannot be written");
-    return false;
+    return Written::AWAY;
   }
-  uint64_t const now = tmr_jiffies();
+  m_failedState.clear();
+  uint64_t const now = MonotonicClock::nowMs();
   std::set<IdentityName> touched;
   size_t pending = 0;
   // Sends one statement; every kPipelineDepth, waits for the answers so
@@ -223,11 +236,12 @@ bool PostgresBackend::write(std::vector<StoreChange> const& changes, std::string
         send(nullptr, kNotify, {m_origin + kSeparator + identity->first + kSeparator + identity->second});
   written = written && send(nullptr, "COMMIT", {}) && answered(pending, error);
   PQexitPipelineMode(m_connection);
-  if (!written) {
-    std::string ignored;
-    run("ROLLBACK", {}, ignored);
-  }
-  return written;
+  if (written)
+    return Written::ALL;
+  // Refused only when the server is still there to roll back.
+  std::string ignored;
+  bool const rolledBack = run("ROLLBACK", {}, ignored);
+  return rolledBack && refusedForTheRow(m_failedState) ? Written::REFUSED : Written::AWAY;
 }
 
 bool PostgresBackend::answered(size_t& pending, std::string& error) {
@@ -245,6 +259,8 @@ bool PostgresBackend::answered(size_t& pending, std::string& error) {
       ExecStatusType const status = PQresultStatus(result);
       if (status != PGRES_COMMAND_OK && status != PGRES_TUPLES_OK && succeeded) {
         error = failure("cannot be written");
+        char const* const state = PQresultErrorField(result, PG_DIAG_SQLSTATE);
+        m_failedState = state ? state : "";
         succeeded = false;
       }
       PQclear(result);

@@ -17,6 +17,11 @@
 // - A batch is sent in pipeline mode, its answers read every 256
 //   statements: a round trip per 256 rows rather than per row, which is
 //   what a storm of REGISTERs needs from a server across a network.
+// - A failed batch is the rows' fault (REFUSED) only when the server is
+//   still there to roll it back and the SQLSTATE's class is a data
+//   exception, an integrity constraint or a program limit; any other class
+//   (a deadlock with another gateway's batch, a full disk, a shutdown) is
+//   worth retrying whole, and so AWAY.
 #pragma once
 
 #include <string>
@@ -38,7 +43,7 @@ class PostgresBackend : public StoreBackend {
   bool connect(std::string& error) override;
   bool read(IdentityName const* identity, std::vector<StoredBinding>& bindings, std::string& error) override;
   bool deleteExpired(std::string& error) override;
-  bool write(std::vector<StoreChange> const& changes, std::string& error) override;
+  Written write(std::vector<StoreChange> const& changes, std::string& error) override;
   int notificationSocket() const override;
   bool takeNotifications(std::vector<IdentityName>& changed, std::string& error) override;
 
@@ -62,4 +67,6 @@ class PostgresBackend : public StoreBackend {
   std::string m_name;
   std::string m_origin;  // the prefix of this process's notifications
   pg_conn* m_connection = nullptr;
+  // The SQLSTATE of the first statement of the last write that failed.
+  std::string m_failedState;
 };

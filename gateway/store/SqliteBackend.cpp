@@ -4,6 +4,7 @@
 #include <sys/stat.h>
 
 #include "sip/Libre.h"
+#include "sip/MonotonicClock.h"
 #include "store/StoreSchema.h"
 
 namespace {
@@ -18,6 +19,21 @@ bool bindAll(sqlite3_stmt* statement, std::vector<std::string> const& parameters
                           static_cast<int>(parameters[i].size()), SQLITE_TRANSIENT) != SQLITE_OK)
       return false;
   return true;
+}
+
+// Whether a statement failed for what its row holds, the file being fine:
+// a constraint or trigger, a value too large or of the wrong kind. A full
+// disk, I/O, a lock or damage is the store's, not the row's.
+bool refusedForTheRow(int code) {
+  switch (code & 0xff) {
+    case SQLITE_CONSTRAINT:
+    case SQLITE_TOOBIG:
+    case SQLITE_MISMATCH:
+    case SQLITE_RANGE:
+      return true;
+    default:
+      return false;
+  }
 }
 
 }  // namespace
@@ -181,7 +197,7 @@ bool SqliteBackend::read(IdentityName const* identity,
     return false;
   if (identity)
     bindAll(select, {identity->first, identity->second});
-  uint64_t const now = tmr_jiffies();
+  uint64_t const now = MonotonicClock::nowMs();
   int step;
   while ((step = sqlite3_step(select)) == SQLITE_ROW) {
     char const* columns[10];
@@ -202,10 +218,10 @@ bool SqliteBackend::deleteExpired(std::string& error) {
   return execute(StoreSchema::withClock(StoreSchema::kDeleteExpired, kNow), error);
 }
 
-bool SqliteBackend::write(std::vector<StoreChange> const& changes, std::string& error) {
+StoreBackend::Written SqliteBackend::write(std::vector<StoreChange> const& changes, std::string& error) {
   if (!execute("BEGIN", error))
-    return false;
-  uint64_t const now = tmr_jiffies();
+    return Written::AWAY;
+  uint64_t const now = MonotonicClock::nowMs();
   for (StoreChange const& change : changes) {
     StoredBinding const& binding = change.binding;
     bool const removal = change.removal();
@@ -216,14 +232,18 @@ bool SqliteBackend::write(std::vector<StoreChange> const& changes, std::string& 
                                : bindAll(statement, StoreSchema::upsertParameters(binding, now));
     if (!bound || sqlite3_step(statement) != SQLITE_DONE) {
       error = failure("cannot be written");
+      // A failed step's code comes back from the reset; a failed bind's
+      // stays on the connection.
+      int const code = bound ? sqlite3_reset(statement) : sqlite3_errcode(m_database);
       sqlite3_reset(statement);
+      bool const refused = refusedForTheRow(code);
       std::string ignored;
       execute("ROLLBACK", ignored);
-      return false;
+      return refused ? Written::REFUSED : Written::AWAY;
     }
   }
   sqlite3_reset(m_upsert);
   sqlite3_reset(m_delete);
   sqlite3_reset(m_deleteIfExpired);
-  return execute("COMMIT", error);
+  return execute("COMMIT", error) ? Written::ALL : Written::AWAY;
 }

@@ -4,10 +4,23 @@
 // committed before it, and a batch costs one append to the log, not a sync
 // of the database.
 //
+// What that costs on a power cut (or a crash of the system): the log is
+// synced only when SQLite checkpoints it into the file, once it has grown
+// past wal_autocheckpoint's 1,000 pages, and when the last connection
+// closes at a clean exit. Every batch committed since the last checkpoint
+// may be lost, during a storm seconds of changes, on a quiet gateway hours
+// of them; the file comes back intact and consistent, as of that
+// checkpoint. synchronous=FULL would sync every batch; the README says
+// what a power cut may lose instead, since its cost to a storm of
+// REGISTERs was not measured.
+//
 // A file that exists is only read until it has shown itself to be a store
 // of ours, intact (quick_check) and not newer: a file of another kind, a
 // truncated store or a newer one is refused with a message naming it, and
 // is left as it was. A missing or empty file becomes a new store.
+//
+// A failed batch is the rows' fault (REFUSED) for a constraint, a value too
+// large or of the wrong type; a full disk, I/O, a lock or damage is AWAY.
 //
 // Not shared: only this process writes the file, so it has no
 // notifications. Single-threaded use, see StoreBackend.
@@ -31,7 +44,7 @@ class SqliteBackend : public StoreBackend {
   bool connect(std::string& error) override;
   bool read(IdentityName const* identity, std::vector<StoredBinding>& bindings, std::string& error) override;
   bool deleteExpired(std::string& error) override;
-  bool write(std::vector<StoreChange> const& changes, std::string& error) override;
+  Written write(std::vector<StoreChange> const& changes, std::string& error) override;
 
  private:
   // Whether the open file is ours, intact and readable by this version;

@@ -4,7 +4,8 @@
 // knows nothing of queues, batches or the library.
 //
 // Every call blocks until the database has answered; a failure leaves a
-// text in error, and the caller connects again before the next call.
+// text in error, and the caller connects again before the next call, except
+// after a write the database refused while it stayed reachable.
 #pragma once
 
 #include <string>
@@ -29,8 +30,14 @@ class StoreBackend {
                     std::vector<StoredBinding>& bindings,
                     std::string& error) = 0;
   virtual bool deleteExpired(std::string& error) = 0;
-  // The changes in one transaction; on failure none is written.
-  virtual bool write(std::vector<StoreChange> const& changes, std::string& error) = 0;
+  // What a write came to. REFUSED: the database is there and refused what
+  // the rows hold (a byte it cannot store, a constraint, a size), so that
+  // the same rows would be refused again however long the caller waits;
+  // the connection stays usable. AWAY: anything else, the database or the
+  // way to it gone, its disk full or locked: worth trying again later.
+  enum class Written { ALL, REFUSED, AWAY };
+  // The changes in one transaction; unless ALL, none is written.
+  virtual Written write(std::vector<StoreChange> const& changes, std::string& error) = 0;
 
   // For a store others share: the descriptor that becomes readable when
   // they wrote, -1 otherwise.

@@ -64,7 +64,7 @@ constexpr char kSelectIdentity[] =
 // text with every {now} replaced by the backend's clock expression.
 std::string withClock(char const* text, char const* now);
 
-// kUpsert's parameters for binding at nowMs on the loop's clock; a binding
+// kUpsert's parameters for binding at nowMs on MonotonicClock; a binding
 // already expired is written expired (zero remaining).
 std::vector<std::string> upsertParameters(StoredBinding const& binding, uint64_t nowMs);
 // A row of kSelectLive or kSelectIdentity, columns as text; false when a

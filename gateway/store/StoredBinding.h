@@ -4,10 +4,9 @@
 // objects, which belong to the event loop.
 //
 // The key of a binding is (service, identity, uri). The expiry is on the
-// event loop's clock (libre's tmr_jiffies(), monotonic milliseconds): the
-// store converts it to and from its own absolute clock at its boundary, so
-// the registrar never sees wall-clock time and a gateway whose clock jumps
-// keeps its bindings' lifetimes.
+// gateway's MonotonicClock: the store converts it to and from its own
+// absolute clock at its boundary, so the registrar never sees wall-clock
+// time and a gateway whose clock jumps keeps its bindings' lifetimes.
 #pragma once
 
 #include <cstdint>

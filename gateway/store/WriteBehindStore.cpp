@@ -7,6 +7,8 @@
 #include <algorithm>
 #include <cstdio>
 
+#include "sip/MonotonicClock.h"
+
 namespace {
 
 void say(std::string const& line) {
@@ -18,8 +20,8 @@ void say(std::string const& line) {
 
 }  // namespace
 
-WriteBehindStore::WriteBehindStore(std::unique_ptr<StoreBackend> backend, std::string name)
-    : m_backend(std::move(backend)), m_name(std::move(name)) {
+WriteBehindStore::WriteBehindStore(std::unique_ptr<StoreBackend> backend, std::string name, size_t queueLimit)
+    : m_backend(std::move(backend)), m_name(std::move(name)), m_queueLimit(queueLimit) {
   int ends[2];
   if (pipe2(ends, O_CLOEXEC | O_NONBLOCK) == 0) {
     m_wakeRead = ends[0];
@@ -67,8 +69,11 @@ void WriteBehindStore::record(StoreChange::Kind kind, StoredBinding const& bindi
   {
     std::lock_guard<std::mutex> lock(m_mutex);
     first = m_queue.empty();
-    if (m_queue.size() >= kQueueLimit && m_queue.refreshes.empty() && kind == StoreChange::Kind::REFRESHED) {
+    // A refresh is worth less than any other change: in a queue full of
+    // those, the newcomer goes.
+    if (m_queue.size() >= m_queueLimit && m_queue.refreshes.empty() && kind == StoreChange::Kind::REFRESHED) {
       ++m_dropped;
+      ++m_changesDropped;
       return;
     }
     bound(1);
@@ -109,8 +114,8 @@ void WriteBehindStore::run() {
       if (!reconnect()) {
         bool notified = false;
         // Woken early by changes too: those only wait for the next try.
-        uint64_t const until = tmr_jiffies() + backoff;
-        for (uint64_t now = tmr_jiffies(); now < until; now = tmr_jiffies()) {
+        uint64_t const until = MonotonicClock::nowMs() + backoff;
+        for (uint64_t now = MonotonicClock::nowMs(); now < until; now = MonotonicClock::nowMs()) {
           wait(static_cast<int>(until - now), notified);
           std::lock_guard<std::mutex> lock(m_mutex);
           if (m_closing)
@@ -120,9 +125,9 @@ void WriteBehindStore::run() {
         std::lock_guard<std::mutex> lock(m_mutex);
         if (!m_closing)
           continue;
-        if (!m_queue.empty() || m_dropped)
-          say("the store " + m_name + " is away: " + std::to_string(m_queue.size() + m_dropped) +
-              " changes not written at exit");
+        if (!m_queue.empty() || m_dropped || m_droppedOthers)
+          say("the store " + m_name + " is away: " +
+              std::to_string(m_queue.size() + m_dropped + m_droppedOthers) + " changes not written at exit");
         return;
       }
       backoff = kFirstBackoffMs;
@@ -135,6 +140,8 @@ void WriteBehindStore::run() {
         continue;
       catchUp = false;
     }
+    if (!readAgain())
+      continue;
     {
       // Changes recorded after flush() took the queue and before close()
       // said so are written before the thread ends.
@@ -171,15 +178,21 @@ bool WriteBehindStore::reconnect() {
     return false;
   m_up = true;
   size_t dropped = 0;
+  size_t droppedOthers = 0;
   size_t queued = 0;
   {
     std::lock_guard<std::mutex> lock(m_mutex);
     dropped = m_dropped;
+    droppedOthers = m_droppedOthers;
     queued = m_queue.size();
     m_dropped = 0;
+    m_droppedOthers = 0;
   }
   say("the store " + m_name + " is back; writing " + std::to_string(queued) + " queued changes" +
-      (dropped ? "; " + std::to_string(dropped) + " refreshes were dropped while it was away" : ""));
+      (dropped ? "; " + std::to_string(dropped) + " refreshes were dropped while it was away" : "") +
+      (droppedOthers ? "; " + std::to_string(droppedOthers) +
+                           " additions and removals were dropped while it was away, the queue being full"
+                     : ""));
   return true;
 }
 
@@ -190,9 +203,15 @@ void WriteBehindStore::lost(std::string const& error) {
 }
 
 void WriteBehindStore::bound(size_t room) {
-  while (m_queue.size() + room > kQueueLimit && !m_queue.refreshes.empty()) {
-    m_queue.refreshes.pop_front();
-    ++m_dropped;
+  while (m_queue.size() + room > m_queueLimit && !m_queue.empty()) {
+    if (!m_queue.refreshes.empty()) {
+      m_queue.refreshes.pop_front();
+      ++m_dropped;
+    } else {
+      m_queue.others.pop_front();
+      ++m_droppedOthers;
+    }
+    ++m_changesDropped;
   }
 }
 
@@ -204,37 +223,96 @@ bool WriteBehindStore::flush() {
   }
   if (taken.empty())
     return true;
-  std::vector<StoreChange> batch;
-  batch.reserve(taken.size());
+  std::vector<Queued> merged;
+  merged.reserve(taken.size());
   auto refresh = taken.refreshes.begin();
   auto other = taken.others.begin();
-  uint64_t last = 0;
   while (refresh != taken.refreshes.end() || other != taken.others.end()) {
     bool const refreshFirst = other == taken.others.end() ||
                               (refresh != taken.refreshes.end() && refresh->sequence < other->sequence);
-    Queued const& next = refreshFirst ? *refresh++ : *other++;
-    batch.push_back(next.change);
-    last = std::max(last, next.sequence);
+    merged.push_back(std::move(refreshFirst ? *refresh++ : *other++));
   }
+  taken = Queue();
+  std::vector<StoreChange> batch;
+  batch.reserve(merged.size());
+  for (Queued const& queued : merged)
+    batch.push_back(queued.change);
   std::string error;
-  bool const written = m_backend->write(batch, error);
-  {
-    std::lock_guard<std::mutex> lock(m_mutex);
-    if (written) {
-      m_written = last;
+  switch (m_backend->write(batch, error)) {
+    case StoreBackend::Written::ALL: {
+      std::lock_guard<std::mutex> lock(m_mutex);
+      m_written = merged.back().sequence;
       return true;
     }
-    // What came meanwhile goes behind what was taken: only that much is
-    // moved under the mutex.
-    for (Queued& queued : m_queue.refreshes)
-      taken.refreshes.push_back(std::move(queued));
-    for (Queued& queued : m_queue.others)
-      taken.others.push_back(std::move(queued));
-    std::swap(taken, m_queue);
-    bound(0);
+    case StoreBackend::Written::REFUSED:
+      batch.clear();
+      return writeOneByOne(merged);
+    case StoreBackend::Written::AWAY:
+      break;
   }
+  putBack(merged, 0);
   lost(error);
   return false;
+}
+
+bool WriteBehindStore::writeOneByOne(std::vector<Queued>& taken) {
+  std::vector<StoreChange> one(1);
+  for (size_t i = 0; i < taken.size(); ++i) {
+    StoreChange const& change = taken[i].change;
+    one[0] = change;
+    std::string error;
+    StoreBackend::Written const written = m_backend->write(one, error);
+    if (written == StoreBackend::Written::AWAY) {
+      putBack(taken, i);
+      lost(error);
+      return false;
+    }
+    if (written == StoreBackend::Written::REFUSED) {
+      ++m_rowsRefused;
+      say(error + "; the change to " + change.binding.service + "/" + change.binding.identity + " <" +
+          change.binding.uri + "> is dropped");
+    }
+    std::lock_guard<std::mutex> lock(m_mutex);
+    m_written = taken[i].sequence;
+  }
+  return true;
+}
+
+void WriteBehindStore::putBack(std::vector<Queued>& taken, size_t from) {
+  Queue back;
+  for (size_t i = from; i < taken.size(); ++i) {
+    auto& list = taken[i].change.kind == StoreChange::Kind::REFRESHED ? back.refreshes : back.others;
+    list.push_back(std::move(taken[i]));
+  }
+  std::lock_guard<std::mutex> lock(m_mutex);
+  // What came meanwhile goes behind what was taken: only that much is
+  // moved under the mutex.
+  for (Queued& queued : m_queue.refreshes)
+    back.refreshes.push_back(std::move(queued));
+  for (Queued& queued : m_queue.others)
+    back.others.push_back(std::move(queued));
+  std::swap(back, m_queue);
+  bound(0);
+}
+
+bool WriteBehindStore::readAgain() {
+  std::set<IdentityName> names;
+  {
+    std::lock_guard<std::mutex> lock(m_mutex);
+    names.swap(m_readAgain);
+  }
+  // After the store was away, every identity changed meanwhile may be
+  // here: one read of the whole table then, not a query each.
+  if (names.size() > kReadAgainOneByOne)
+    return learn(nullptr);
+  for (auto name = names.begin(); name != names.end(); ++name) {
+    if (learn(&*name))
+      continue;
+    std::lock_guard<std::mutex> lock(m_mutex);
+    m_readAgain.insert(name, names.end());
+    return false;
+  }
+  return true;
 }
 
 bool WriteBehindStore::learn(IdentityName const* identity) {
@@ -282,21 +360,34 @@ void WriteBehindStore::onLearnt(int, void*, void* argument) {
     std::lock_guard<std::mutex> lock(store.m_mutex);
     learnt.swap(store.m_learnt);
   }
+  // Identities whose read was older than this gateway's state: read again
+  // once that is written.
+  std::set<IdentityName> again;
   for (Learnt& entry : learnt) {
     Update& update = entry.update;
-    // Identities changed here after the read hold a newer state than it.
     for (auto last = store.m_lastChange.begin(); last != store.m_lastChange.end();) {
       if (last->second <= entry.writtenBefore) {
         last = store.m_lastChange.erase(last);
         continue;
       }
-      if (update.everything)
+      if (update.everything) {
         update.untouched.insert(last->first);
+        again.insert(last->first);
+      }
       ++last;
     }
-    if (!update.everything && store.m_lastChange.count(update.identity))
+    if (!update.everything && store.m_lastChange.count(update.identity)) {
+      again.insert(update.identity);
       continue;
+    }
     if (store.m_handler)
       store.m_handler(update);
   }
+  if (again.empty())
+    return;
+  {
+    std::lock_guard<std::mutex> lock(store.m_mutex);
+    store.m_readAgain.insert(again.begin(), again.end());
+  }
+  store.wake();
 }

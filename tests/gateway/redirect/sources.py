@@ -1,6 +1,6 @@
 #!/usr/bin/python3
 """End to end: with --redirect-from, only the given networks learn where a
-subscriber is registered.
+subscriber is registered, or whether one exists.
 
     sources.py GATEWAY WORK-DIR [EMULATOR...]
 """
@@ -12,6 +12,8 @@ sys.path.insert(0, os.path.join(os.path.dirname(os.path.abspath(__file__)), ".."
 from sipphone import Gateway, Phone, check, run  # noqa: E402
 
 SCRIPT = os.path.join(os.path.dirname(os.path.abspath(__file__)), "..", "registrar", "subscribers.script")
+# Without a "DEFAULT" group: a user it does not know is nobody.
+PROTOCOL_SCRIPT = os.path.join(os.path.dirname(os.path.abspath(__file__)), "..", "sip", "protocol.script")
 
 
 def redirect_answered_to_the_given_networks_only(program, work, emulator):
@@ -29,8 +31,30 @@ def redirect_answered_to_the_given_networks_only(program, work, emulator):
         gateway.kill()
 
 
+def options_at_the_gateway_address_tell_strangers_nobody_exists(program, work, emulator):
+    gateway = Gateway(program, emulator, work, "options", [PROTOCOL_SCRIPT], ["--redirect-from", "127.0.0.2/32"])
+    try:
+        for address in ("127.0.0.1", "127.0.0.2"):
+            phone = Phone(gateway.port, address)
+            answers = {}
+            for user in ("alice", "nobody"):
+                uri = "sip:%s@127.0.0.1:%d" % (user, gateway.port)
+                answers[user] = phone.send(phone.build("OPTIONS", uri, uri, phone.new_call_id(), 1)).status
+            phone.close()
+            if address == "127.0.0.1":
+                check(answers["alice"] == answers["nobody"], "a stranger told who exists: %s" % answers)
+            else:
+                # alice has no binding: the redirect server's answer.
+                check(answers == {"alice": 480, "nobody": 200}, "a trusted source answered %s" % answers)
+        gateway.stop()
+    finally:
+        gateway.kill()
+
+
 if __name__ == "__main__":
     if len(sys.argv) < 3:
         sys.exit("usage: sources.py GATEWAY WORK-DIR [EMULATOR...]")
-    sys.exit(run([("redirect_answered_to_the_given_networks_only", redirect_answered_to_the_given_networks_only)],
+    sys.exit(run([("redirect_answered_to_the_given_networks_only", redirect_answered_to_the_given_networks_only),
+                  ("options_at_the_gateway_address_tell_strangers_nobody_exists",
+                   options_at_the_gateway_address_tell_strangers_nobody_exists)],
                  sys.argv[1], sys.argv[2], sys.argv[3:]))

@@ -111,29 +111,69 @@ TEST(DigestAuthentication, ChallengeListsParsed) {
   EXPECT_FALSE(parseDigestAlgorithms("SHA-1", algorithms));
 }
 
-TEST(NonceGenerator, HoldsForItsRealmCallIdAndLifetimeOnly) {
-  NonceGenerator nonces({1, 2, 3});
+TEST(NonceGenerator, HoldsForItsRealmCallIdSourceAndLifetimeOnly) {
+  NonceGenerator nonces({1, 2, 3}, 1);
   pl const realm = text("example.com");
   pl const callId = text("a@b");
-  std::string const made = nonces.make(realm, callId, 1000);
+  std::string const source = "udp 192.0.2.1";
+  std::string const made = nonces.make(realm, callId, source, 1000);
   pl const nonce = text(made.c_str());
-  EXPECT_EQ(1000u, NonceGenerator::madeAt(nonce));
-  // Two challenges of one registration within a millisecond differ.
-  EXPECT_NE(made, nonces.make(realm, callId, 1000));
+  // Two challenges of one registration within a millisecond differ, and
+  // the table orders the later one after.
+  std::string const next = nonces.make(realm, callId, source, 1000);
+  EXPECT_NE(made, next);
+  EXPECT_LT(NonceGenerator::madeAt(nonce), NonceGenerator::madeAt(text(next.c_str())));
   EXPECT_EQ(NonceGenerator::Check::VALID,
-            nonces.check(nonce, realm, callId, 1000 + NonceGenerator::kLifetimeMs));
+            nonces.check(nonce, realm, callId, source, 1000 + NonceGenerator::kLifetimeMs));
   EXPECT_EQ(NonceGenerator::Check::STALE,
-            nonces.check(nonce, realm, callId, 1001 + NonceGenerator::kLifetimeMs));
-  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(nonce, text("example.org"), callId, 1000));
-  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(nonce, realm, text("a@c"), 1000));
-  // The realm's end cannot move into the Call-ID.
-  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(nonce, text("example.coma"), text("@b"), 1000));
-  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, NonceGenerator({4}).check(nonce, realm, callId, 1000));
-  // Another time under the same signature, or a nonce from the future.
-  std::string forged = made;
-  forged[15] = forged[15] == '0' ? '1' : '0';
-  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(text(forged.c_str()), realm, callId, 1000));
-  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(nonce, realm, callId, 999));
+            nonces.check(nonce, realm, callId, source, 1001 + NonceGenerator::kLifetimeMs));
+  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(nonce, text("example.org"), callId, source, 1000));
+  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(nonce, realm, text("a@c"), source, 1000));
+  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(nonce, realm, callId, "udp 192.0.2.2", 1000));
+  // The realm's end cannot move into the Call-ID, nor the Call-ID's into
+  // the source.
+  EXPECT_EQ(NonceGenerator::Check::UNKNOWN,
+            nonces.check(nonce, text("example.coma"), text("@b"), source, 1000));
+  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(nonce, realm, text("a@bu"), "dp 192.0.2.1", 1000));
+  EXPECT_EQ(NonceGenerator::Check::UNKNOWN, NonceGenerator({4}, 1).check(nonce, realm, callId, source, 1000));
+  // Another time or issuer under the same signature.
+  for (size_t digit : {15, 31}) {
+    std::string forged = made;
+    forged[digit] = forged[digit] == '0' ? '1' : '0';
+    EXPECT_EQ(NonceGenerator::Check::UNKNOWN, nonces.check(text(forged.c_str()), realm, callId, source, 1000))
+        << digit;
+  }
+}
+
+// The wall clock may step back a little between challenge and answer; a
+// nonce from further ahead is authentic, so it is stale, never unknown.
+TEST(NonceGenerator, ToleratesSmallClockStepsBack) {
+  NonceGenerator nonces({1, 2, 3}, 1);
+  uint64_t const madeMs = 1700000000000;
+  std::string const made = nonces.make(text("r"), text("c"), "udp 192.0.2.1", madeMs);
+  pl const nonce = text(made.c_str());
+  EXPECT_EQ(NonceGenerator::Check::VALID,
+            nonces.check(nonce, text("r"), text("c"), "udp 192.0.2.1", madeMs - NonceGenerator::kSkewMs));
+  EXPECT_EQ(NonceGenerator::Check::STALE,
+            nonces.check(nonce, text("r"), text("c"), "udp 192.0.2.1", madeMs - NonceGenerator::kSkewMs - 1));
+}
+
+// Another gateway holding the same key (or this one before a restart)
+// made it: authentic, but not this process's to vouch for.
+TEST(NonceGenerator, SameKeyAnotherIssuerIsForeign) {
+  NonceGenerator here({1, 2, 3}, 1);
+  NonceGenerator there({1, 2, 3}, 2);
+  std::string const made = there.make(text("r"), text("c"), "udp 192.0.2.1", 1000);
+  EXPECT_EQ(NonceGenerator::Check::FOREIGN,
+            here.check(text(made.c_str()), text("r"), text("c"), "udp 192.0.2.1", 1000));
+  EXPECT_EQ(NonceGenerator::Check::UNKNOWN,
+            here.check(text(made.c_str()), text("r"), text("c"), "udp 192.0.2.2", 1000));
+  // A shared key installed later makes the nonces that follow checkable.
+  NonceGenerator restarted({9}, 3);
+  restarted.useKey({1, 2, 3});
+  std::string const after = restarted.make(text("r"), text("c"), "udp 192.0.2.1", 1000);
+  EXPECT_EQ(NonceGenerator::Check::FOREIGN,
+            here.check(text(after.c_str()), text("r"), text("c"), "udp 192.0.2.1", 1000));
 }
 
 }  // namespace

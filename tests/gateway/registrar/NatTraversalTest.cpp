@@ -7,7 +7,8 @@ namespace {
 struct Case {
   char const* contact;
   char const* source;
-  char const* target;  // null when the contact stands as it is
+  char const* target;                     // null when the contact stands as it is
+  sip_transp transport = SIP_TRANSP_UDP;  // what the REGISTER came over
 };
 
 class NatTraversalTest : public testing::TestWithParam<Case> {};
@@ -19,7 +20,7 @@ TEST_P(NatTraversalTest, RedirectsUnreachableContactsToTheirSource) {
   sa source;
   ASSERT_EQ(sa_decode(&source, c.source, std::char_traits<char>::length(c.source)), 0);
   std::string target = "untouched";
-  bool const nated = NatTraversal::natedTarget(contact, source, target);
+  bool const nated = NatTraversal::natedTarget(contact, source, c.transport, target);
   if (c.target) {
     EXPECT_TRUE(nated) << c.contact;
     EXPECT_EQ(target, c.target);
@@ -47,6 +48,13 @@ INSTANTIATE_TEST_SUITE_P(
                     Case{"sip:alice@phone.example.com", "203.0.113.5:40312", nullptr},
                     Case{"sip:alice@192.168.1.10:5062", "192.168.1.10:5062", nullptr},
                     Case{"sip:alice@192.168.1.10", "192.168.1.10:5060", nullptr},
-                    Case{"sip:alice@[fd00::2]:5062", "[2001:db8::5]:5062", nullptr}));
+                    Case{"sip:alice@[fd00::2]:5062", "[2001:db8::5]:5062", nullptr},
+                    // Over a connection the source port is the connection's
+                    // own, never the port the phone listens on: only the
+                    // address tells whether a NAT stands between.
+                    Case{"sip:u2@127.0.0.1:5070;transport=tcp", "127.0.0.1:46038", nullptr, SIP_TRANSP_TCP},
+                    Case{"sip:u2@[fe80::1]:5061;transport=tls", "[fe80::1]:51000", nullptr, SIP_TRANSP_TLS},
+                    Case{"sip:u2@192.168.1.10:5070;transport=tcp", "203.0.113.5:46038",
+                         "sip:u2@203.0.113.5:46038;transport=tcp", SIP_TRANSP_TCP}));
 
 }  // namespace

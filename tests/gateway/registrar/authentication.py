@@ -12,7 +12,7 @@ import re
 import sys
 
 sys.path.insert(0, os.path.join(os.path.dirname(os.path.abspath(__file__)), ".."))
-from sipphone import Failure, Gateway, Phone, authorization, check, run  # noqa: E402
+from sipphone import Failure, Gateway, Phone, StreamPhone, authorization, check, run  # noqa: E402
 
 HERE = os.path.dirname(os.path.abspath(__file__))
 SCRIPTS = [os.path.join(HERE, "subscribers.script"), os.path.join(HERE, "security.script")]
@@ -21,10 +21,10 @@ PASSWORDS = ["secret", "welcome", "erin-password", "topsecret"]
 FAIL2BAN = re.compile(r'^location-gateway: authentication failed for ".*" from (?P<host>\S+) port \d+', re.M)
 
 
-def register(phone, to, call_id, cseq, contact=None, auth=None, uri="sip:example.com"):
+def register(phone, to, call_id, cseq, contact=None, auth=None, uri="sip:example.com", expires=300):
     headers = []
     if contact:
-        headers += ["Contact: <%s>" % contact, "Expires: 300"]
+        headers += ["Contact: <%s>" % contact, "Expires: %d" % expires]
     if auth:
         headers.append(auth)
     return phone.build("REGISTER", uri, to, call_id, cseq, headers)
@@ -155,6 +155,189 @@ def repeated_failures_hold_the_source(program, work, emulator):
         gateway.kill()
 
 
+def contacts_of(phone, to):
+    """The Contact URIs of the 302 for to (none when there is no 302)."""
+    where = phone.send(phone.build("MESSAGE", to, to, phone.new_call_id(), 1))
+    return [c.split(">")[0].lstrip("<") for c in where.all("Contact")] if where.status == 302 else []
+
+
+def authenticated(phone, to, call_id, cseq, contact, password, expires=300):
+    """A REGISTER answering the challenge of the one before it (CSeq - 1)."""
+    first = phone.send(register(phone, to, call_id, cseq - 1, contact, expires=expires))
+    check(first.status == 401, "no challenge but %d" % first.status)
+    auth = authorization(first.challenges()[0], "REGISTER", "sip:example.com", to[4:].split("@")[0], password)
+    return register(phone, to, call_id, cseq, contact, auth, expires=expires)
+
+
+def resent(text, sender):
+    """A captured request as sender sends it again: only its Via, which no
+    digest covers, names sender, so that the answer comes back to it."""
+    return re.sub(r"(Via: SIP/2\.0/UDP )[^;]+", r"\g<1>%s:%d" % (sender.address, sender.port), text, count=1)
+
+
+def a_registration_is_applied_once(program, work, emulator):
+    gateway = Gateway(program, emulator, work, "once", SCRIPTS)
+    try:
+        phone = Phone(gateway.port)
+        alice = "sip:alice@example.com"
+        contact = "sip:alice@127.0.0.1:40001"
+        call_id = phone.new_call_id()
+        first = authenticated(phone, alice, call_id, 2, contact, "secret")
+        check(phone.send(first).status == 200, "registration refused")
+        check(phone.send(authenticated(phone, alice, call_id, 4, contact, "secret", 0)).status == 200,
+              "unregistration refused")
+        # The first request again, byte for byte, from another port and then
+        # from the phone's own: neither brings the binding back.
+        attacker = Phone(gateway.port)
+        replay = attacker.send(resent(first, attacker))
+        check(replay.status != 200, "a replay from another port answered 200")
+        found = contacts_of(phone, alice)
+        check(not any(str(attacker.port) in c for c in found), "the replay bound alice to the attacker: %r" % found)
+        again = phone.send(first)
+        check(again.status in (200, 401) and not again.all("Contact"),
+              "a late retransmission answered %d %r" % (again.status, again.all("Contact")))
+        check(not any(str(phone.port) in c for c in contacts_of(phone, alice)),
+              "a late retransmission brought the binding back")
+        attacker.close()
+        phone.close()
+        gateway.stop()
+    finally:
+        gateway.kill()
+
+
+def a_query_is_not_reflected(program, work, emulator):
+    gateway = Gateway(program, emulator, work, "reflect", SCRIPTS)
+    try:
+        phone = Phone(gateway.port)
+        alice = "sip:alice@example.com"
+        call_id = phone.new_call_id()
+        check(phone.send(authenticated(phone, alice, call_id, 2, "sip:alice@192.0.2.1", "secret")).status == 200,
+              "registration refused")
+        query = authenticated(phone, alice, call_id, 4, None, "secret")
+        check(phone.send(query).all("Contact"), "the query listed no binding")
+        for address in ("127.0.0.2", "127.0.0.3"):
+            victim = Phone(gateway.port, address)
+            copy = victim.send(resent(query, victim))
+            check(copy.status != 200 and not copy.all("Contact"),
+                  "a copy from %s answered %d %r" % (address, copy.status, copy.all("Contact")))
+            victim.close()
+        # A contact whose parameters would make every 200 large is refused.
+        long = "Contact: <sip:alice@192.0.2.9>;x=" + "a" * 1100
+        challenge = phone.send(register(phone, alice, call_id, 5)).challenges()[0]
+        auth = authorization(challenge, "REGISTER", "sip:example.com", "alice", "secret")
+        answer = phone.send(phone.build("REGISTER", "sip:example.com", alice, call_id, 6, [long, auth]))
+        check(answer.status == 400, "a contact of 1100 bytes answered %d" % answer.status)
+        phone.close()
+        gateway.stop()
+    finally:
+        gateway.kill()
+
+
+def spoofed_failures_do_not_hold_a_source(program, work, emulator):
+    gateway = Gateway(program, emulator, work, "spoofed", SCRIPTS)
+    try:
+        alice = "sip:alice@example.com"
+        # The attacker's own nonce, sent with wrong passwords "from" the
+        # site's address (a socket bound there stands for the forged source).
+        attacker = Phone(gateway.port, "127.0.0.2")
+        call_id = attacker.new_call_id()
+        challenge = attacker.send(register(attacker, alice, call_id, 1)).challenges()[0]
+        site = Phone(gateway.port)
+        for attempt in range(12):
+            auth = authorization(challenge, "REGISTER", "sip:example.com", "alice", "guess%d" % attempt)
+            check(site.send(register(site, alice, call_id, 2 + attempt, None, auth)).status != 200, "guess accepted")
+        phone = Phone(gateway.port)
+        answer = phone.send(authenticated(phone, alice, phone.new_call_id(), 2, "sip:alice@192.0.2.1", "secret"))
+        check(answer.status == 200, "a phone behind the spoofed address answered %d" % answer.status)
+        check("authentication failed" not in gateway.errors(), "a spoofed failure was counted")
+        # Over TCP a nonce is its connection's, even from the same address.
+        first, second = StreamPhone(gateway.port, "tcp"), StreamPhone(gateway.port, "tcp")
+        call_id = first.new_call_id()
+        challenge = first.send(register(first, alice, call_id, 1, "sip:alice@192.0.2.1")).challenges()[0]
+        auth = authorization(challenge, "REGISTER", "sip:example.com", "alice", "secret")
+        answer = second.send(register(second, alice, call_id, 2, "sip:alice@192.0.2.1", auth))
+        check(answer.status == 401, "a nonce answered over another connection: %d" % answer.status)
+        check(first.send(register(first, alice, call_id, 3, "sip:alice@192.0.2.1", auth)).status == 200,
+              "the nonce refused over its own connection")
+        for each in (attacker, site, phone, first, second):
+            each.close()
+        gateway.stop()
+    finally:
+        gateway.kill()
+
+
+def a_nonce_of_another_gateway_is_stale(program, work, emulator):
+    key = os.path.join(work, "nonce.key")
+    if os.path.exists(key):
+        os.remove(key)
+    first = Gateway(program, emulator, work, "cluster-a", SCRIPTS, ["--nonce-key-file", key])
+    second = None
+    try:
+        check(os.stat(key).st_mode & 0o777 == 0o600, "the key file is not the owner's only")
+        second = Gateway(program, emulator, work, "cluster-b", SCRIPTS, ["--nonce-key-file", key])
+        alice = "sip:alice@example.com"
+        contact = "sip:alice@192.0.2.1"
+        # The phone fails over from the first gateway to the second.
+        phone = Phone(first.port)
+        call_id = phone.new_call_id()
+        challenge = phone.send(register(phone, alice, call_id, 1, contact)).challenges()[0]
+        auth = authorization(challenge, "REGISTER", "sip:example.com", "alice", "secret")
+        phone.target = ("127.0.0.1", second.port)
+        answer = phone.send(register(phone, alice, call_id, 2, contact, auth))
+        check(answer.status == 401 and answer.challenges() and all(c[3] for c in answer.challenges()),
+              "a nonce of the other gateway answered %d %r" % (answer.status, answer.challenges()))
+        auth = authorization(answer.challenges()[0], "REGISTER", "sip:example.com", "alice", "secret")
+        check(phone.send(register(phone, alice, call_id, 3, contact, auth)).status == 200,
+              "the fresh nonce refused")
+        # A key that is no key stops the start.
+        short = os.path.join(work, "short.key")
+        with open(short, "w") as out:
+            out.write("0123")
+        try:
+            Gateway(program, emulator, work, "short", SCRIPTS, ["--nonce-key-file", short]).kill()
+            raise Failure("a gateway started with a 4-byte key")
+        except Failure as failure:
+            check("nonce key file" in str(failure), "the start failed otherwise: %s" % failure)
+        phone.close()
+        second.stop()
+        first.stop()
+    finally:
+        first.kill()
+        if second:
+            second.kill()
+
+
+SHA256_WARNING = re.compile(r'^location-gateway: "(\w+)" from .* registers again without answering a challenge '
+                            r'that offered SHA-256 first.*PJSIP before 2\.12.*--digest MD5,SHA-256$', re.M)
+
+
+def a_phone_giving_up_on_sha256_is_named(program, work, emulator):
+    gateway = Gateway(program, emulator, work, "giving-up", SCRIPTS)
+    try:
+        phone = Phone(gateway.port)
+        # A phone that reads both challenges: its refresh starts without
+        # credentials, and its first challenge came again (a lost 401).
+        alice = "sip:alice@example.com"
+        call_id = phone.new_call_id()
+        phone.send(register(phone, alice, call_id, 1, "sip:alice@192.0.2.1"))
+        check(phone.send(authenticated(phone, alice, call_id, 2, "sip:alice@192.0.2.1", "secret")).status == 200,
+              "registration refused")
+        check(phone.send(authenticated(phone, alice, call_id, 4, "sip:alice@192.0.2.1", "secret")).status == 200,
+              "refresh refused")
+        # One that gives up on SHA-256 and starts over later.
+        carol = "sip:carol@example.com"
+        call_id = phone.new_call_id()
+        for cseq in (1, 2):
+            check(phone.send(register(phone, carol, call_id, cseq, "sip:carol@192.0.2.3")).status == 401,
+                  "no challenge")
+        phone.close()
+        gateway.stop()
+        check(SHA256_WARNING.findall(gateway.errors()) == ["carol"],
+              "warnings: %r in %r" % (SHA256_WARNING.findall(gateway.errors()), gateway.errors()))
+    finally:
+        gateway.kill()
+
+
 if __name__ == "__main__":
     if len(sys.argv) < 3:
         sys.exit("usage: authentication.py GATEWAY WORK-DIR [EMULATOR...]")
@@ -162,5 +345,10 @@ if __name__ == "__main__":
                   ("digest_over_another_uri_refused_and_logged", digest_over_another_uri_refused_and_logged),
                   ("only_challenged_or_registering_identities_register",
                    only_challenged_or_registering_identities_register),
-                  ("repeated_failures_hold_the_source", repeated_failures_hold_the_source)],
+                  ("repeated_failures_hold_the_source", repeated_failures_hold_the_source),
+                  ("a_registration_is_applied_once", a_registration_is_applied_once),
+                  ("a_query_is_not_reflected", a_query_is_not_reflected),
+                  ("spoofed_failures_do_not_hold_a_source", spoofed_failures_do_not_hold_a_source),
+                  ("a_nonce_of_another_gateway_is_stale", a_nonce_of_another_gateway_is_stale),
+                  ("a_phone_giving_up_on_sha256_is_named", a_phone_giving_up_on_sha256_is_named)],
                  sys.argv[1], sys.argv[2], sys.argv[3:]))

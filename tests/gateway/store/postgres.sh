@@ -6,6 +6,7 @@
 #                        cannot, its logs then in postgres_dir.
 #   postgres_stop        stops it (fast shutdown, bounded), waits for it,
 #                        and removes the directory.
+#   postgres_sql SQL     runs SQL in the database the gateways use.
 #   postgres_pause / postgres_resume
 #                        stop and start the same cluster on the same port.
 #
@@ -45,6 +46,11 @@ postgres_resume() {
   postgres_as timeout 60 "$postgres_bin/pg_ctl" -D "$postgres_dir/data" -l "$postgres_dir/server.log" -w -t 30 \
     -o "-c listen_addresses=127.0.0.1 -p $postgres_port -c unix_socket_directories=$postgres_dir -c fsync=off" \
     start >/dev/null 2>&1
+}
+
+postgres_sql() {
+  postgres_as timeout 30 "$postgres_bin/psql" -X -q -v ON_ERROR_STOP=1 -h 127.0.0.1 -p "$postgres_port" \
+    -U gateway -d postgres -c "$1" >/dev/null
 }
 
 postgres_pause() {

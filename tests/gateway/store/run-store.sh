@@ -12,10 +12,16 @@
 # shared:  two gateways on one PostgreSQL server that the test starts
 #          itself: registered at A, redirected at B; unregistered at B,
 #          unavailable at A; registered at A while the server is stopped,
-#          redirected at B once the server is back.
+#          redirected at B once the server is back. B started again without
+#          alice, or told to remove her over its control socket, leaves her
+#          binding at A. A binding bound to its TCP flow
+#          (not stored) survives B's change to its identity. A Call-ID that
+#          is not UTF-8 is refused, and a row the database refuses is
+#          dropped while the rows after it are written.
 #
 # The gateway runs through EMULATOR when one is given; SIPp and PostgreSQL
-# always run natively. Every process is bounded in time and stopped by its
+# always run natively. The console (LOCATION_CONSOLE, by default the one
+# built beside the gateway) operates a gateway over its control socket. Every process is bounded in time and stopped by its
 # PID; what a failing run printed stays in WORK-DIR.
 set -u
 
@@ -26,6 +32,7 @@ sipp=$3
 work=$4
 shift 4
 emulator=("$@")
+console=${LOCATION_CONSOLE:-$(dirname "$gateway")/../tools/console/location-console}
 subscribers=$here/../registrar/subscribers.script
 wait_limit=30
 
@@ -34,7 +41,7 @@ cd "$work" || exit 1
 rm -rf "$scenario" && mkdir "$scenario" && cd "$scenario" || exit 1
 source "$here/postgres.sh"
 
-declare -A pids ports
+declare -A pids ports tcp_ports
 fail() {
   echo "FAIL ($scenario): $*" >&2
   for file in *.err sipp.log; do
@@ -63,6 +70,7 @@ start_gateway() {
   pids[$name]=$!
   await_line "$name.err" "listening on udp:" || fail "gateway $name did not start"
   ports[$name]=$(sed -n 's/.* udp:127\.0\.0\.1:\([0-9]*\).*/\1/p' "$name.err" | tail -n 1)
+  tcp_ports[$name]=$(sed -n 's/.* tcp:127\.0\.0\.1:\([0-9]*\).*/\1/p' "$name.err" | tail -n 1)
 }
 
 # stop_gateway NAME SIGNAL: with TERM it must exit 0.
@@ -98,6 +106,17 @@ moved() {
     [[ $(grep -c "redirected to" moved.log) == 1 ]] && grep -qx "redirected to $3" moved.log
 }
 unavailable() { sipp_run unavailable "$1" "$2" || fail "a call to $2 at $1 was not answered 480"; }
+# phone PORT TRANSPORT USER PASSWORD [EXPIRES CONTACT [CALL-ID]]: see phone.py.
+phone() { timeout 25 /usr/bin/python3 "$here/phone.py" "$@" 2>>phone.err; }
+# eventually_moved GATEWAY-NAME USER CONTACT: within 10 s.
+eventually_moved() {
+  local attempt
+  for attempt in $(seq 10); do
+    moved "$@" && return 0
+    sleep 1
+  done
+  return 1
+}
 
 case $scenario in
   restart)
@@ -144,6 +163,43 @@ case $scenario in
     done
     $learnt || fail "B did not learn the registration made at A while the server was away"
     grep -q "is back; writing 1 queued changes" a.err || fail "A did not write its queued change"
+
+    # A configuration that differs between gateways deletes nothing.
+    stop_gateway b TERM
+    echo "identity example.com alice remove" >without-alice.script
+    start_gateway b "$postgres_uri" without-alice.script
+    ! grep -q "no longer configured deleted" b.err || fail "B deleted bindings of identities it lacks"
+    sleep 1
+    moved a alice sip:alice@127.0.0.1:$((base + 1)) || fail "A lost alice when B started without her"
+    stop_gateway b TERM
+    start_gateway b "$postgres_uri" --control "$PWD/b.sock"
+    await_line b.err "control socket" || fail "B did not open its control socket"
+    timeout "$wait_limit" "${emulator[@]}" "$console" --connect "$PWD/b.sock" - <<<"identity example.com alice remove" \
+      >remove.out 2>remove.err || fail "B could not remove alice: $(cat remove.err)"
+    sleep 1
+    moved a alice sip:alice@127.0.0.1:$((base + 1)) || fail "A lost alice when B's configuration dropped her"
+
+    # carol's TCP flow lives at A only; B's change to carol leaves it there.
+    flow="<sip:carol@127.0.0.1:PORT;transport=tcp>;+sip.instance=\"<urn:uuid:00000000-0000-0000-0000-0000000000c0>\";reg-id=1"
+    [[ $(phone "${tcp_ports[a]}" tcp carol welcome 600 "$flow" | head -n 1) == 200 ]] ||
+      fail "carol could not register over TCP at A"
+    register b carol welcome 600 $((base + 5))
+    sleep 1
+    phone "${ports[a]}" udp carol welcome >carol-at-a.out || fail "A did not answer carol's query"
+    grep -q ":$((base + 5))>" carol-at-a.out || fail "A did not learn carol's binding at B"
+    grep -q "transport=tcp" carol-at-a.out || fail "A dropped carol's TCP flow on B's change"
+
+    # Bytes the database cannot hold are refused at the SIP side; a row it
+    # refuses all the same is dropped, and the store goes on writing.
+    [[ $(phone "${ports[a]}" udp dave welcome 600 "<sip:dave@127.0.0.1:$((base + 6))>" 'bad-\xff-call' |
+      head -n 1) == 400 ]] || fail "a Call-ID that is not UTF-8 was not refused"
+    postgres_sql "ALTER TABLE bindings ADD CONSTRAINT no_bob CHECK (identity <> 'bob')" ||
+      fail "the constraint could not be added"
+    register a bob welcome 600 $((base + 7))
+    register a dave welcome 600 $((base + 6))
+    eventually_moved b dave sip:dave@127.0.0.1:$((base + 6)) || fail "A stopped writing after a refused row"
+    grep -q "the change to example.com/bob <.*> is dropped" a.err || fail "A did not log the row it dropped"
+    (($(grep -c "is back;" a.err) == 1)) || fail "A took a refused row for the store going away"
     stop_gateway a TERM
     stop_gateway b TERM
     ;;
