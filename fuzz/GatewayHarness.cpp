@@ -14,6 +14,8 @@
 #include "ScriptLanguage.h"
 #include "ScriptRunner.h"
 #include "sip/Libre.h"
+#include "sip/MonotonicClock.h"
+#include "sip/WallClock.h"
 
 // re_dbg.h wants a module name and level of its includer.
 #define DEBUG_MODULE "fuzz"
@@ -28,6 +30,7 @@ namespace {
 
 std::atomic<uint64_t> g_nowMs{GatewayHarness::kStartMs};
 std::vector<std::string> g_sent;
+uint64_t g_drawn = 0;
 
 std::string readScript(char const* name) {
   std::string const path = std::string(LS_GATEWAY_TEST_SCRIPTS) + "/" + name;
@@ -45,16 +48,31 @@ extern "C" __attribute__((visibility("default"))) uint64_t tmr_jiffies(void) {
   return g_nowMs.load(std::memory_order_relaxed);
 }
 
+// The gateway's own clocks: the same time as the stack's.
+uint64_t MonotonicClock::nowMs() {
+  return tmr_jiffies();
+}
+
+uint64_t WallClock::nowMs() {
+  return tmr_jiffies();
+}
+
+// No descriptor is ever watched: the gateway's MonotonicTimer then runs on
+// the stack's timers, which run on the clock above.
+extern "C" __attribute__((visibility("default"))) int fd_listen(int, int, fd_h*, void*) {
+  return ENOSYS;
+}
+
 extern "C" __attribute__((visibility("default"))) void rand_bytes(uint8_t* p, size_t size) {
   std::memset(p, 0, size);
 }
 
 extern "C" __attribute__((visibility("default"))) uint32_t rand_u32(void) {
-  return 0;
+  return static_cast<uint32_t>(++g_drawn);
 }
 
 extern "C" __attribute__((visibility("default"))) uint64_t rand_u64(void) {
-  return 0;
+  return ++g_drawn;
 }
 
 extern "C" __attribute__((visibility("default"))) int sip_send(struct sip*,
@@ -68,7 +86,7 @@ extern "C" __attribute__((visibility("default"))) int sip_send(struct sip*,
   return 0;
 }
 
-void GatewayHarness::setUp() {
+void GatewayHarness::startInput() {
   static bool const done = [] {
     if (libre_init() != 0)
       std::abort();
@@ -80,6 +98,9 @@ void GatewayHarness::setUp() {
     return true;
   }();
   (void)done;
+  setNow(kStartMs);
+  g_drawn = 0;
+  takeSent();
 }
 
 void GatewayHarness::setNow(uint64_t nowMs) {

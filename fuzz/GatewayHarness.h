@@ -2,7 +2,7 @@
 // without a network, a wall clock or chance, so that every input is
 // answered the same way each time it is replayed.
 //
-// The harness takes the place of four of libre's functions, as the gateway
+// The harness takes the place of five of libre's functions, as the gateway
 // itself takes the place of its random functions (sip/StackRandom.cpp):
 // libre calls them through its procedure linkage table, so the fuzz
 // target's own definitions, exported from the executable, are the ones
@@ -10,12 +10,19 @@
 // - tmr_jiffies() reads a clock the harness sets: a nonce made at
 //   kStartMs stays valid for every input, and time passes only when a
 //   target advances it (the timers due then run in runTimers()).
-// - rand_bytes(), rand_u32() and rand_u64() give zeros: the nonce key is
-//   twenty zero bytes, so that seeded Authorization headers can carry
-//   nonces the registrar accepts (fuzz/sip_message_seeds.py makes them),
-//   and the tags of the answers repeat.
+// - rand_bytes() gives zeros: the nonce key is twenty zero bytes and the
+//   nonces' issuer zero, so that seeded Authorization headers can carry
+//   nonces the registrar accepts (fuzz/sip_message_seeds.py makes them).
+//   rand_u32() and rand_u64() count from one, anew for each input: the
+//   tags of the answers repeat, and callers that draw until they get a
+//   number they have not used yet (the NAT pinger's ids) get one.
 // - sip_send() keeps what it is given instead of sending it (takeSent()):
 //   the stack has no transports, and the answers are checked instead.
+// - fd_listen() refuses every descriptor: the gateway's MonotonicTimer
+//   falls back to the stack's timers, and so runs on the clock above.
+// The gateway's own clocks (MonotonicClock, WallClock) are defined here
+// too, as that same clock: each is alone in its file of the gateway_clock
+// archive, which the linker then leaves out.
 //
 // The gateway's log lines (standard output, and std::cerr) and libre's
 // warnings are dropped: fuzzing writes thousands a second. Sanitizer reports and libFuzzer's own
@@ -36,8 +43,10 @@ namespace GatewayHarness {
 // Milliseconds on the stack's clock when each input starts.
 constexpr uint64_t kStartMs = 1764000000000ull;
 
-// libre started and the outputs dropped; idempotent.
-void setUp();
+// Before each input: libre started and the outputs dropped (once), the
+// clock at kStartMs, the random numbers counting from their start, and
+// nothing sent.
+void startInput();
 
 // Sets the stack's clock and runs the timers due by then.
 void setNow(uint64_t nowMs);

@@ -81,7 +81,7 @@ sip& stack() {
 
 // The seeds' Authorization headers carry nonces that fuzz/sip_message_seeds.py
 // computed as the gateway makes them under the harness's key and clock;
-// this one is the script's for the realm and Call-ID below. A gateway that
+// this one is the script's for the realm, Call-ID and source below. A gateway that
 // makes them otherwise would refuse every seeded digest, and the fuzzing
 // would never reach an authenticated REGISTER: the script must be run
 // again.
@@ -91,8 +91,8 @@ void checkSeededNonces() {
     pl callId;
     pl_set_str(&realm, "example.com");
     pl_set_str(&callId, "fuzz-self-check");
-    check(NonceGenerator().make(realm, callId, GatewayHarness::kStartMs) ==
-              "019ab697e80000013f048b1cfe0e7731e0bc7fd15d12236b0f0ba9e3",
+    check(NonceGenerator().make(realm, callId, "udp 127.0.0.1", GatewayHarness::kStartMs) ==
+              "0000019ab697e8000000000000000000000000000000000110197af2495b4b89eb1adca6d9b1ae401fee3c72",
           "the gateway makes other nonces than the seeds carry: run fuzz/sip_message_seeds.py");
     return true;
   }();
@@ -155,17 +155,15 @@ void route(sip_msg& message,
 }  // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(uint8_t const* data, size_t size) {
-  GatewayHarness::setUp();
+  GatewayHarness::startInput();
   checkSeededNonces();
-  GatewayHarness::setNow(GatewayHarness::kStartMs);
-  GatewayHarness::takeSent();
   ScriptSession session;
   GatewayHarness::loadModel(session);
   LibraryClock clock(false);
   RequestLog log;
   Listeners const listeners;
-  Admission const admission(listeners);
   Redirector redirector;
+  Admission const admission(listeners, redirector.sources());
   int const registeredBefore = s_sipStatistics.getInboundRegistrations();
   {
     Registrar registrar(clock);

@@ -14,6 +14,8 @@ at start (its nonce self-check) and this script is run again:
 
     /usr/bin/python3 fuzz/sip_message_seeds.py
 
+(`--self-check` prints the nonce the fuzzer compares its gateway's with.)
+
 It rewrites the seeds whose names start with "test-" and leaves the others.
 """
 
@@ -27,7 +29,6 @@ HERE = os.path.dirname(os.path.abspath(__file__))
 TESTS = os.path.join(HERE, "..", "tests", "gateway")
 CORPUS = os.path.join(HERE, "corpus", "sip_message")
 START_MS = 1764000000000
-SERIAL_BITS = 16
 NONCE_KEY = bytes(20)
 MAXIMUM_MESSAGES = 8
 SCENARIOS = ["registrar/phone.xml", "registrar/retransmission.xml", "sip/protocol.xml",
@@ -35,10 +36,20 @@ SCENARIOS = ["registrar/phone.xml", "registrar/retransmission.xml", "sip/protoco
 PASSWORDS = {"alice": "secret", "erin": "erin-password"}
 
 
-def nonce(realm, call_id, made_ms=START_MS, serial=1):
-    stamp = "%016x" % ((made_ms << SERIAL_BITS) | serial)
-    data = "%s:%d:%s%s" % (stamp, len(realm.encode()), realm, call_id)
-    return stamp + hmac.new(NONCE_KEY, data.encode(), hashlib.sha1).hexdigest()
+def nonce_source(via):
+    """The source a nonce is bound to, as the fuzzer's request arrives from
+    its Via: the address over UDP, address and port over the others."""
+    transport, address = via.split(" ")
+    if transport.upper() == "UDP":
+        return "udp " + address.rsplit(":", 1)[0]
+    return "%s %s" % (transport.upper(), address)
+
+
+def nonce(realm, call_id, source, made_ms=START_MS, sequence=1):
+    # Time, issuer (zero: the harness's random numbers) and sequence.
+    fields = "%016x%016x%016x" % (made_ms, 0, sequence)
+    data = "%s:%d:%s:%d:%s%s" % (fields, len(realm.encode()), realm, len(call_id.encode()), call_id, source)
+    return fields + hmac.new(NONCE_KEY, data.encode(), hashlib.sha1).hexdigest()
 
 
 def hash_hex(algorithm, text):
@@ -52,8 +63,8 @@ class Nonces:
         self.counts = {}
 
     def authorization(self, method, uri, call_id, user, password, realm, algorithm="MD5",
-                      made_ms=START_MS):
-        value = nonce(realm, call_id, made_ms)
+                      made_ms=START_MS, via="UDP 127.0.0.1:5062"):
+        value = nonce(realm, call_id, nonce_source(via), made_ms)
         self.counts[value] = self.counts.get(value, 0) + 1
         count = "%08x" % self.counts[value]
         cnonce = "0a4f113b"
@@ -130,7 +141,7 @@ def register(nonces, user, password, call_id, cseq, contacts, expires=None, real
     if expires is not None:
         headers.append("Expires: %d" % expires)
     headers.append(nonces.authorization("REGISTER", digest_uri or uri, call_id, user, password, realm,
-                                        algorithm, made_ms))
+                                        algorithm, made_ms, via))
     return request("REGISTER", uri, "sip:%s@%s" % (user, realm), call_id, cseq, headers, via)
 
 
@@ -181,6 +192,10 @@ def phone_seeds():
 
 
 def main():
+    if len(sys.argv) > 1 and sys.argv[1] == "--self-check":
+        # The nonce the fuzzer compares with its gateway's at start.
+        print(nonce("example.com", "fuzz-self-check", "udp 127.0.0.1"))
+        return 0
     os.makedirs(CORPUS, exist_ok=True)
     for name in os.listdir(CORPUS):
         if name.startswith("test-"):

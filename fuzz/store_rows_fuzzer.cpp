@@ -160,8 +160,7 @@ void writeStore(std::string const& input) {
 }  // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(uint8_t const* data, size_t size) {
-  GatewayHarness::setUp();
-  GatewayHarness::setNow(GatewayHarness::kStartMs);
+  GatewayHarness::startInput();
   fixSqliteClock();
   writeStore(std::string(reinterpret_cast<char const*>(data), size));
   ScriptSession session;
