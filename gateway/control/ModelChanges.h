@@ -30,7 +30,7 @@
 #include "LS_IRegistrationOutboundObserver.h"
 #include "RefPtr.h"
 
-class ModelChanges : private LS_IMasterLocationServiceObserver,
+class ModelChanges final : private LS_IMasterLocationServiceObserver,
                      private LS_ILocationServiceObserver,
                      private LS_IRegistrationOutboundObserver {
  public:

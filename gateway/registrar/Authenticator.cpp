@@ -1,7 +1,6 @@
 #include "registrar/Authenticator.h"
 
 #include <algorithm>
-#include <chrono>
 #include <iostream>
 
 #include "LS_CredentialLookup.h"
@@ -11,6 +10,7 @@
 #include "LS_ServiceResolution.h"
 #include "sip/Exchange.h"
 #include "sip/MonotonicClock.h"
+#include "sip/WallClock.h"
 
 namespace {
 
@@ -76,14 +76,6 @@ std::string nonceSourceOf(sip_msg const& message) {
   else
     re_snprintf(text, sizeof text, "%s %J", sip_transp_name(message.tp), &message.src);
   return text;
-}
-
-// The nonces' clock: the wall clock's milliseconds, which mean the same on
-// every gateway sharing the key and across a restart.
-uint64_t wallClockMs() {
-  return static_cast<uint64_t>(std::chrono::duration_cast<std::chrono::milliseconds>(
-                                   std::chrono::system_clock::now().time_since_epoch())
-                                   .count());
 }
 
 // A registration as UnansweredChallenges knows it: its Call-ID and where
@@ -208,7 +200,7 @@ Authenticator::Outcome Authenticator::evaluate(sip_msg const& message,
                                                std::vector<std::string> const* realms,
                                                Passwords const& passwordsOf) {
   uint64_t const now = MonotonicClock::nowMs();
-  uint64_t const wallNow = wallClockMs();
+  uint64_t const wallNow = WallClock::nowMs();
   std::string const source = nonceSourceOf(message);
   unsigned int looked = 0;
   Outcome outcome;
@@ -307,7 +299,7 @@ void Authenticator::followChallenges(Exchange& exchange) {
 }
 
 void Authenticator::challenge(Exchange& exchange, std::vector<std::string> const& realms, bool stale) {
-  uint64_t const now = wallClockMs();
+  uint64_t const now = WallClock::nowMs();
   std::string const source = nonceSourceOf(exchange.request());
   std::string challenges;
   for (std::string const& realm : realms) {

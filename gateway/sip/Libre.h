@@ -6,4 +6,10 @@
 #include <cstddef>
 #include <cstdint>
 
+// Without it, libre's headers define bool, true and false as macros, which
+// in C++ turns true into the int 1 and keeps clang from parsing the
+// standard library headers included after them.
+#ifndef HAVE_STDBOOL_H
+#define HAVE_STDBOOL_H
+#endif
 #include <re.h>

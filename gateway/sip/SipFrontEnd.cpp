@@ -131,27 +131,24 @@ bool SipFrontEnd::onRequest(sip_msg const* request, void* argument) {
   if (frontEnd.m_rateLimit && !frontEnd.m_rateLimit->admit(*frontEnd.m_stack, message))
     return true;
   Exchange exchange(*frontEnd.m_stack, message, frontEnd.m_session, frontEnd.m_log, frontEnd.m_clock);
-  if (SecureTransports::sipsOverPlainTransport(message)) {
-    exchange.answer(416, "Unsupported URI Scheme");
-    return true;
-  }
-  if (frontEnd.m_admission.answered(exchange))
-    return true;
-  if (pl_strcmp(&message.met, "REGISTER") == 0) {
-    frontEnd.m_registrar.handle(exchange);
-    return true;
-  }
-  if (pl_strcmp(&message.met, "CANCEL") == 0) {
-    exchange.answer(481, "Call/Transaction Does Not Exist");
-    return true;
-  }
-  if (pl_strcmp(&message.met, "INVITE") == 0 || pl_strcmp(&message.met, "MESSAGE") == 0 ||
-      pl_strcmp(&message.met, "SUBSCRIBE") == 0 || pl_strcmp(&message.met, "OPTIONS") == 0) {
-    frontEnd.m_redirector.handle(exchange);
-    return true;
-  }
-  exchange.answer(405, "Method Not Allowed", Capabilities::kAllow);
+  route(exchange, frontEnd.m_admission, frontEnd.m_registrar, frontEnd.m_redirector);
   return true;
+}
+
+void SipFrontEnd::route(Exchange& exchange, Admission const& admission, Registrar& registrar, Redirector& redirector) {
+  sip_msg const& message = exchange.request();
+  if (SecureTransports::sipsOverPlainTransport(message))
+    return exchange.answer(416, "Unsupported URI Scheme");
+  if (admission.answered(exchange))
+    return;
+  if (pl_strcmp(&message.met, "REGISTER") == 0)
+    return registrar.handle(exchange);
+  if (pl_strcmp(&message.met, "CANCEL") == 0)
+    return exchange.answer(481, "Call/Transaction Does Not Exist");
+  if (pl_strcmp(&message.met, "INVITE") == 0 || pl_strcmp(&message.met, "MESSAGE") == 0 ||
+      pl_strcmp(&message.met, "SUBSCRIBE") == 0 || pl_strcmp(&message.met, "OPTIONS") == 0)
+    return redirector.handle(exchange);
+  exchange.answer(405, "Method Not Allowed", Capabilities::kAllow);
 }
 
 void SipFrontEnd::enlarge(void* udpSocket) {

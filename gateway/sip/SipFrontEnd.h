@@ -93,6 +93,12 @@ class SipFrontEnd {
 
   static constexpr uint64_t kShutDownMs = 2000;
 
+  // Answers a request by the part it is for (see above), once onRequest has
+  // let it through (not an ACK, within the rate limit). Given the parts
+  // rather than a front-end, so that the request path can be driven
+  // without transports, as the message fuzzer drives it.
+  static void route(Exchange& exchange, Admission const& admission, Registrar& registrar, Redirector& redirector);
+
  private:
   static bool onRequest(sip_msg const* request, void* frontEnd);
   static void onClosed(void* frontEnd);
