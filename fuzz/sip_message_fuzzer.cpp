@@ -55,7 +55,8 @@ constexpr uint32_t kNatPingSeconds = 30;
 // exceeds.
 constexpr uint64_t kTimeStepMs = 800 * 1000;
 constexpr unsigned int kTimeSteps = 5;
-static_assert(kTimeSteps * kTimeStepMs > uint64_t{ExpiryRange::kMaximum} * 1000, "bindings outlive the steps");
+static_assert(kTimeSteps * kTimeStepMs > uint64_t{ExpiryRange::kMaximum} * 1000,
+              "bindings outlive the steps");
 constexpr char kDefaultSource[] = "192.0.2.1";
 constexpr char kGatewayAddress[] = "127.0.0.1";
 constexpr uint16_t kSipPort = 5060;

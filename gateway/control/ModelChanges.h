@@ -31,8 +31,8 @@
 #include "RefPtr.h"
 
 class ModelChanges final : private LS_IMasterLocationServiceObserver,
-                     private LS_ILocationServiceObserver,
-                     private LS_IRegistrationOutboundObserver {
+                           private LS_ILocationServiceObserver,
+                           private LS_IRegistrationOutboundObserver {
  public:
   explicit ModelChanges(LS_IMasterLocationService& master);
   ~ModelChanges();

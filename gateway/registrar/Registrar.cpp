@@ -167,8 +167,8 @@ void Registrar::update(Exchange& exchange,
       return true;
     }
     ContactRequest request;
-    if (requests.size() == kMaximumContacts || value.l > kMaximumContactText || !isStorableText(value.p, value.l) ||
-        !ContactHeader::parse(value, request.header)) {
+    if (requests.size() == kMaximumContacts || value.l > kMaximumContactText ||
+        !isStorableText(value.p, value.l) || !ContactHeader::parse(value, request.header)) {
       malformed = true;
       return false;
     }

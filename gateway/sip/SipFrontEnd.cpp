@@ -135,7 +135,10 @@ bool SipFrontEnd::onRequest(sip_msg const* request, void* argument) {
   return true;
 }
 
-void SipFrontEnd::route(Exchange& exchange, Admission const& admission, Registrar& registrar, Redirector& redirector) {
+void SipFrontEnd::route(Exchange& exchange,
+                        Admission const& admission,
+                        Registrar& registrar,
+                        Redirector& redirector) {
   sip_msg const& message = exchange.request();
   if (SecureTransports::sipsOverPlainTransport(message))
     return exchange.answer(416, "Unsupported URI Scheme");

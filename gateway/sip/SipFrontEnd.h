@@ -97,7 +97,10 @@ class SipFrontEnd {
   // let it through (not an ACK, within the rate limit). Given the parts
   // rather than a front-end, so that the request path can be driven
   // without transports, as the message fuzzer drives it.
-  static void route(Exchange& exchange, Admission const& admission, Registrar& registrar, Redirector& redirector);
+  static void route(Exchange& exchange,
+                    Admission const& admission,
+                    Registrar& registrar,
+                    Redirector& redirector);
 
  private:
   static bool onRequest(sip_msg const* request, void* frontEnd);

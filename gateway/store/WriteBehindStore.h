@@ -142,8 +142,8 @@ class WriteBehindStore : public BindingStore {
   std::mutex m_mutex;  // guards the members up to m_closing
   Queue m_queue;
   std::vector<Learnt> m_learnt;
-  uint64_t m_written = 0;  // the sequence of the last change written or refused
-  size_t m_dropped = 0;    // refreshes dropped since the store went away
+  uint64_t m_written = 0;      // the sequence of the last change written or refused
+  size_t m_dropped = 0;        // refreshes dropped since the store went away
   size_t m_droppedOthers = 0;  // additions and removals dropped so
   std::set<IdentityName> m_readAgain;
   bool m_closing = false;

@@ -1,7 +1,7 @@
 #include "store/SqliteBackend.h"
 
-#include <gtest/gtest.h>
 #include <fcntl.h>
+#include <gtest/gtest.h>
 #include <sqlite3.h>
 #include <unistd.h>
 
@@ -9,8 +9,8 @@
 #include <chrono>
 #include <cstdlib>
 #include <fstream>
-#include <iterator>
 #include <functional>
+#include <iterator>
 #include <memory>
 #include <mutex>
 #include <thread>
@@ -317,10 +317,11 @@ TEST_F(SqliteStoreTest, APeersChangeReadWhileALocalOneWasQueuedIsReadAgain) {
   StoredBinding alice = binding("alice", "sip:alice@192.0.2.1", 600000);
   store.record(StoreChange::Kind::ADDED, alice);
   ASSERT_TRUE(eventually([&] { return rowCount(m_path) == 1; }));
-  runSql(m_path,
-         "INSERT INTO bindings VALUES ('example.com', 'alice', 'sip:alice@192.0.2.8', '<sip:alice@192.0.2.8>', "
-         "'peer', 1, '192.0.2.8:5060', 'udp', CAST((julianday('now') - 2440587.5) * 86400000 AS INTEGER) + "
-         "600000, 0)");
+  runSql(
+      m_path,
+      "INSERT INTO bindings VALUES ('example.com', 'alice', 'sip:alice@192.0.2.8', '<sip:alice@192.0.2.8>', "
+      "'peer', 1, '192.0.2.8:5060', 'udp', CAST((julianday('now') - 2440587.5) * 86400000 AS INTEGER) + "
+      "600000, 0)");
   int const before = file->reads;
   file->notify({"example.com", "alice"});
   ASSERT_TRUE(eventually([&] { return file->reads > before; }));
