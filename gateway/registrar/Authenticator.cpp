@@ -9,6 +9,7 @@
 #include "LS_IdentityResolution.h"
 #include "LS_ServiceResolution.h"
 #include "sip/Exchange.h"
+#include "sip/FieldHash.h"
 #include "sip/MonotonicClock.h"
 #include "sip/WallClock.h"
 
@@ -28,31 +29,28 @@ void forEachHeader(sip_msg const& message, sip_hdrid id, Visit visit) {
   }
 }
 
+// Where a request came from: "TRANSPORT ADDR:PORT", the connection over
+// TCP, TLS and WebSocket; its length.
+constexpr size_t kSourceText = 80;
+size_t connectionOf(sip_msg const& message, char (&text)[kSourceText]) {
+  int const length = re_snprintf(text, sizeof text, "%s %J", sip_transp_name(message.tp), &message.src);
+  return length > 0 ? static_cast<size_t>(length) : 0;
+}
+
 // What a REGISTER would change and where it came from, digested: a
 // retransmission has the same, a replay with another Contact, CSeq, To or
 // Expires, or from another address, port or transport, does not.
 uint64_t fingerprintOf(sip_msg const& message) {
-  uint64_t hash = 14695981039346656037ull;
-  auto mix = [&](char const* bytes, size_t length) {
-    for (size_t i = 0; i < length; ++i) {
-      hash ^= static_cast<unsigned char>(bytes[i]);
-      hash *= 1099511628211ull;
-    }
-    hash ^= 0x100;  // a field's end
-    hash *= 1099511628211ull;
-  };
-  mix(message.to.auri.p, message.to.auri.l);
-  uint32_t const cseq = message.cseq.num;
-  mix(reinterpret_cast<char const*>(&cseq), sizeof cseq);
-  mix(message.expires.p, message.expires.l);
+  FieldHash hash;
+  hash.add(message.to.auri.p, message.to.auri.l)
+      .add(message.cseq.num)
+      .add(message.expires.p, message.expires.l);
   forEachHeader(message, SIP_HDR_CONTACT, [&](sip_hdr const& header) {
-    mix(header.val.p, header.val.l);
+    hash.add(header.val.p, header.val.l);
     return true;
   });
-  char source[80];
-  int const length = re_snprintf(source, sizeof source, "%s %J", sip_transp_name(message.tp), &message.src);
-  mix(source, length > 0 ? static_cast<size_t>(length) : 0);
-  return hash;
+  char source[kSourceText];
+  return hash.add(source, connectionOf(message, source)).value();
 }
 
 // A user name from the network as a log line may show it: no line breaks
@@ -70,30 +68,22 @@ std::string printable(pl const& text) {
 // costs nothing and a NAT may move the port; the connection (transport,
 // address and port) over the others, which cannot be spoofed.
 std::string nonceSourceOf(sip_msg const& message) {
-  char text[80];
+  char text[kSourceText];
   if (message.tp == SIP_TRANSP_UDP)
     re_snprintf(text, sizeof text, "udp %j", &message.src);
   else
-    re_snprintf(text, sizeof text, "%s %J", sip_transp_name(message.tp), &message.src);
+    connectionOf(message, text);
   return text;
 }
 
 // A registration as UnansweredChallenges knows it: its Call-ID and where
 // it comes from, port included (phones behind one NAT share the address).
 uint64_t registrationOf(sip_msg const& message) {
-  char source[80];
-  int const length = re_snprintf(source, sizeof source, "%s %J", sip_transp_name(message.tp), &message.src);
-  uint64_t hash = 14695981039346656037ull;
-  auto mix = [&](char const* bytes, size_t count) {
-    for (size_t i = 0; i < count; ++i) {
-      hash ^= static_cast<unsigned char>(bytes[i]);
-      hash *= 1099511628211ull;
-    }
-  };
-  mix(message.callid.p, message.callid.l);
-  mix("\n", 1);
-  mix(source, length > 0 ? static_cast<size_t>(length) : 0);
-  return hash;
+  char source[kSourceText];
+  return FieldHash()
+      .add(message.callid.p, message.callid.l)
+      .add(source, connectionOf(message, source))
+      .value();
 }
 
 bool hasCredentials(sip_msg const& message) {

@@ -1,5 +1,7 @@
 #include "sip/Exchange.h"
 
+#include "sip/FieldHash.h"
+
 namespace {
 
 // Longer URIs are refused rather than cut: no phone sends one, and a cut
@@ -11,20 +13,10 @@ constexpr size_t kMaximumUriLength = 1024;
 // two requests share one.
 uint64_t toTag(sip_msg const& request) {
   static uint64_t const key = rand_u64();
-  uint64_t hash = 14695981039346656037ull ^ key;
-  auto mix = [&](char const* bytes, size_t length) {
-    for (size_t i = 0; i < length; ++i) {
-      hash ^= static_cast<unsigned char>(bytes[i]);
-      hash *= 1099511628211ull;
-    }
-    hash ^= 0x100;  // a field's end: "ab" then "c" differs from "a" then "bc"
-    hash *= 1099511628211ull;
-  };
+  FieldHash hash(key);
   for (pl const* field : {&request.callid, &request.from.tag, &request.cseq.met, &request.via.branch})
-    mix(field->p, field->l);
-  uint32_t const number = request.cseq.num;
-  mix(reinterpret_cast<char const*>(&number), sizeof number);
-  return hash;
+    hash.add(field->p, field->l);
+  return hash.add(request.cseq.num).value();
 }
 
 }  // namespace
