@@ -57,7 +57,7 @@ def hash_hex(algorithm, text):
 
 
 class Nonces:
-    """The nonce-count of each nonce used so far in one seed."""
+    """The nonce-count of each nonce used so far in one corpus input."""
 
     def __init__(self):
         self.counts = {}
@@ -202,8 +202,8 @@ def main():
             os.remove(os.path.join(CORPUS, name))
     count = 0
     for name, text in list(scenario_seeds()) + list(phone_seeds()):
-        with open(os.path.join(CORPUS, name), "wb") as seed:
-            seed.write(text.encode())
+        with open(os.path.join(CORPUS, name), "wb") as written:
+            written.write(text.encode())
         count += 1
     print("%d seeds written to %s" % (count, CORPUS))
 
