@@ -75,6 +75,12 @@ char const kUsage[] =
     "                fresh challenge with stale=true at another, and after\n"
     "                a restart; made (mode 0600) when missing; default a\n"
     "                key of the process's own\n"
+    "  --calls MODE  relay (the default): the gateway places the calls to its\n"
+    "                subscribers itself and relays the signalling between\n"
+    "                the phones (the media go from phone to phone); redirect:\n"
+    "                302 to where the subscriber is registered\n"
+    "  --max-calls N  at most N calls relayed at once; beyond, 503 with\n"
+    "                Retry-After (default no limit)\n"
     "  --redirect-from CIDR  answer INVITE and the other redirected requests\n"
     "                only from this network (repeatable; default any source)\n"
     "  --source-rate N  refuse a source address sending more than N requests\n"
@@ -121,6 +127,8 @@ struct Options {
   std::string nonceKeyFile;
   std::vector<std::string> redirectFrom;
   unsigned long sourceRate = 0;
+  bool relayCalls = true;
+  uint32_t maxCalls = 0;
   SecureTransportOptions secure;
   std::string caFile;
   std::string control;
@@ -178,6 +186,11 @@ bool parse(int argc, char** argv, Options& options) {
       options.secure.allowVulnerableWebSocket = true;
     else if (argument == "--redirect-from" && i + 1 < argc && SourceFilter().allow(argv[i + 1]))
       options.redirectFrom.push_back(argv[++i]);
+    else if (argument == "--calls" && i + 1 < argc &&
+             (std::strcmp(argv[i + 1], "relay") == 0 || std::strcmp(argv[i + 1], "redirect") == 0))
+      options.relayCalls = std::strcmp(argv[++i], "relay") == 0;
+    else if (argument == "--max-calls" && i + 1 < argc && seconds(argv[++i], options.maxCalls))
+      continue;
     else if (argument == "--source-rate" && i + 1 < argc &&
              (options.sourceRate = std::strtoul(argv[++i], nullptr, 10)) > 0)
       continue;
@@ -283,6 +296,8 @@ int serve(ScriptSession& session, Options const& options) {
   frontEnd.trustForTrunks(options.caFile);
   for (std::string const& network : options.redirectFrom)
     frontEnd.redirector().sources().allow(network);
+  if (options.relayCalls)
+    frontEnd.relayCalls(options.maxCalls);
   if (options.sourceRate > 0)
     frontEnd.limitSourceRate(static_cast<uint32_t>(options.sourceRate));
   BindingReplay replay(session, frontEnd.registrar(), clock);

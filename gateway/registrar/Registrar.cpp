@@ -5,6 +5,7 @@
 #include <iostream>
 #include <vector>
 
+#include "CBlob.h"
 #include "LS_ILocationService.h"
 #include "LS_IdentityResolution.h"
 #include "LS_IdentityType.h"
@@ -654,4 +655,50 @@ void Registrar::onPingsUnanswered(void const* binding, void* argument) {
   Registrar& registrar = *static_cast<Registrar*>(argument);
   std::string const reason = std::to_string(NatPinger::kMisses) + " NAT pings unanswered";
   registrar.lose(*const_cast<Binding*>(static_cast<Binding const*>(binding)), reason.c_str());
+}
+
+std::vector<Registrar::CallTarget> Registrar::callTargets(LS_IIdentity* identity) const {
+  std::vector<CallTarget> targets;
+  auto const held = m_bindings.find(identity);
+  m_clock.measure([&] {
+    RefPtr<LS_IRegistrationInbound> face;
+    LS_getFaceIf(identity, LS_IdentityFace::REGISTRATION_INBOUND, face);
+    unsigned int const count = face ? face->getNumberOfContacts() : 0;
+    for (unsigned int i = 0; i < count && i < kMaximumBindings; ++i) {
+      String callId, context, provider;
+      CNameAddr contact;
+      CHostPort received;
+      unsigned int priority = 0;
+      unsigned int expires = 0;
+      if (face->getContact(i, callId, contact, received, context, provider, priority, expires).isFailure())
+        continue;
+      CBlob text;
+      contact.Serialize(text);
+      // "<uri>" or "display <uri>": the URI holds no angle bracket.
+      std::string uri(reinterpret_cast<char const*>(text.GetData()), text.GetSize());
+      uri = uri.substr(uri.rfind('<') + 1);
+      uri.erase(uri.rfind('>'));
+      CallTarget target{uri, "", callId.isEmpty() ? ContactHeader::kNoQ : priority};
+      if (!callId.isEmpty() && held != m_bindings.end()) {
+        for (auto const& each : held->second.all) {
+          Binding const& binding = *each;
+          if (binding.contact != contact || binding.callId != callId.str())
+            continue;
+          target.uri = binding.uri;
+          pl uri;
+          pl_set_str(&uri, binding.uri.c_str());
+          std::string nated;
+          if (binding.transport != SIP_TRANSP_UDP ||
+              NatTraversal::natedTarget(uri, binding.source, binding.transport, nated)) {
+            char route[96];
+            re_snprintf(route, sizeof route, "sip:%J%s", &binding.source, sip_transp_param(binding.transport));
+            target.route = route;
+          }
+          break;
+        }
+      }
+      targets.push_back(std::move(target));
+    }
+  });
+  return targets;
 }

@@ -32,6 +32,7 @@ void stopLoop(void*) {
 
 SipFrontEnd::~SipFrontEnd() {
   m_changes.reset();
+  m_calls.reset();
   mem_deref(m_listener);
   // Forced: a registrar that never answered the unregistration must not
   // keep a registration alive that points at a trunk about to die.
@@ -57,6 +58,8 @@ bool SipFrontEnd::start(Settings const& settings, std::string& error) {
     error = "the SIP stack cannot take requests";
     return false;
   }
+  if (m_calls && !m_calls->start(*m_stack, error))
+    return false;
   for (Listeners::Listener const& listener : m_listeners.listeners()) {
     if (listener.transport != SIP_TRANSP_UDP)
       continue;
@@ -125,20 +128,23 @@ bool SipFrontEnd::onRequest(sip_msg const* request, void* argument) {
   // An ACK gets no answer, the one for a 302 included (every request is
   // answered without a transaction, see Exchange::answer).
   if (pl_strcmp(&message.met, "ACK") == 0)
-    return true;
+    return !frontEnd.m_calls;
+  if (frontEnd.m_calls && pl_isset(&message.to.tag) && Calls::takesInDialog(message))
+    return false;
   if (message.tp == SIP_TRANSP_UDP)
     frontEnd.enlarge(message.sock);
   if (frontEnd.m_rateLimit && !frontEnd.m_rateLimit->admit(*frontEnd.m_stack, message))
     return true;
   Exchange exchange(*frontEnd.m_stack, message, frontEnd.m_session, frontEnd.m_log, frontEnd.m_clock);
-  route(exchange, frontEnd.m_admission, frontEnd.m_registrar, frontEnd.m_redirector);
+  route(exchange, frontEnd.m_admission, frontEnd.m_registrar, frontEnd.m_redirector, frontEnd.m_calls.get());
   return true;
 }
 
 void SipFrontEnd::route(Exchange& exchange,
                         Admission const& admission,
                         Registrar& registrar,
-                        Redirector& redirector) {
+                        Redirector& redirector,
+                        Calls* calls) {
   sip_msg const& message = exchange.request();
   if (SecureTransports::sipsOverPlainTransport(message))
     return exchange.answer(416, "Unsupported URI Scheme");
@@ -146,8 +152,13 @@ void SipFrontEnd::route(Exchange& exchange,
     return;
   if (pl_strcmp(&message.met, "REGISTER") == 0)
     return registrar.handle(exchange);
-  if (pl_strcmp(&message.met, "CANCEL") == 0)
+  if (pl_strcmp(&message.met, "CANCEL") == 0) {
+    if (calls && calls->cancelled(message))
+      return exchange.handOver();
     return exchange.answer(481, "Call/Transaction Does Not Exist");
+  }
+  if (calls && pl_strcmp(&message.met, "INVITE") == 0)
+    return calls->handle(exchange);
   if (pl_strcmp(&message.met, "INVITE") == 0 || pl_strcmp(&message.met, "MESSAGE") == 0 ||
       pl_strcmp(&message.met, "SUBSCRIBE") == 0 || pl_strcmp(&message.met, "OPTIONS") == 0)
     return redirector.handle(exchange);

@@ -17,6 +17,7 @@
 #include <vector>
 
 #include "ScriptSession.h"
+#include "calls/Calls.h"
 #include "control/ModelChanges.h"
 #include "metrics/GatewayStatistics.h"
 #include "metrics/LibraryClock.h"
@@ -100,7 +101,13 @@ class SipFrontEnd {
   static void route(Exchange& exchange,
                     Admission const& admission,
                     Registrar& registrar,
-                    Redirector& redirector);
+                    Redirector& redirector,
+                    Calls* calls = nullptr);
+  // --calls relay: INVITE goes to Calls instead of the Redirector; before start().
+  void relayCalls(uint32_t maxCalls) {
+    m_calls = std::make_unique<Calls>(m_registrar, m_listeners, m_log);
+    m_calls->limit(maxCalls);
+  }
 
  private:
   static bool onRequest(sip_msg const* request, void* frontEnd);
@@ -126,5 +133,6 @@ class SipFrontEnd {
   std::unique_ptr<ModelChanges> m_changes;
   std::vector<void*> m_enlarged;  // the UDP sockets enlarge() has seen
   std::unique_ptr<SourceRateLimit> m_rateLimit;
+  std::unique_ptr<Calls> m_calls;
   std::string m_caFile;
 };

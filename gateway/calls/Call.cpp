@@ -1,0 +1,345 @@
+#include "calls/Call.h"
+
+#include <algorithm>
+
+#include "calls/Calls.h"
+#include "sip/MonotonicClock.h"
+
+namespace {
+
+std::string textOf(pl const& value) {
+  return std::string(value.p ? value.p : "", value.l);
+}
+
+// The class of a final answer for RFC 3261 section 16.7: a lower class is
+// better, 6xx ends the search.
+unsigned int classOf(uint16_t code) {
+  return code / 100;
+}
+
+// A request that a leg relays to the other, waiting for the other's answer.
+struct PendingInfo {
+  sip* stack;
+  sip_msg const* request;
+};
+
+void destroyPendingInfo(void* data) {
+  mem_deref(const_cast<sip_msg*>(static_cast<PendingInfo*>(data)->request));
+}
+
+}  // namespace
+
+Call::Call(Calls& calls,
+           sip_msg const& invite,
+           std::string result,
+           std::vector<Registrar::CallTarget> targets,
+           uint32_t inviteTimeoutMs)
+    : m_calls(calls),
+      m_invite(static_cast<sip_msg const*>(mem_ref(const_cast<sip_msg*>(&invite)))),
+      m_result(std::move(result)),
+      m_targets(std::move(targets)),
+      m_inviteTimeoutMs(inviteTimeoutMs),
+      m_startedMs(MonotonicClock::nowMs()) {}
+
+Call::~Call() {
+  for (auto& branch : m_branches) {
+    tmr_cancel(&branch->timeout);
+    mem_deref(branch->session);
+  }
+  mem_deref(m_caller);
+  mem_deref(const_cast<sip_msg*>(m_invite));
+}
+
+void Call::start() {
+  sip_reply(&m_calls.stack(), m_invite, 100, "Trying");
+  startGroup();
+}
+
+bool Call::isInvite(sip_msg const& request) const {
+  return pl_cmp(&request.callid, &m_invite->callid) == 0 &&
+         pl_cmp(&request.from.tag, &m_invite->from.tag) == 0 && request.cseq.num == m_invite->cseq.num;
+}
+
+void Call::retransmitted() const {
+  if (m_state == State::TRYING)
+    sip_reply(&m_calls.stack(), m_invite, 100, "Trying");
+}
+
+void Call::cancel(sip_msg const& cancel) {
+  sip_reply(&m_calls.stack(), &cancel, 200, "OK");
+  if (m_state != State::TRYING)
+    return;
+  sip_treply(nullptr, &m_calls.stack(), m_invite, 487, "Request Terminated");
+  m_calls.answered(*this, m_result, 487);
+  end();
+}
+
+void Call::startGroup() {
+  while (m_next < m_targets.size()) {
+    unsigned int const q = m_targets[m_next].q;
+    size_t sent = 0;
+    for (; m_next < m_targets.size() && m_targets[m_next].q == q; ++m_next) {
+      auto branch = std::make_unique<Branch>();
+      branch->call = this;
+      branch->target = m_targets[m_next];
+      tmr_init(&branch->timeout);
+      if (send(*branch)) {
+        tmr_start(&branch->timeout, m_inviteTimeoutMs, onBranchTimeout, branch.get());
+        m_branches.push_back(std::move(branch));
+        ++sent;
+      } else {
+        noteFailure(503, "Service Unavailable");
+      }
+    }
+    if (sent > 0)
+      return;
+  }
+  answerFailure();
+}
+
+void Call::noteFailure(uint16_t code, std::string const& reason) {
+  uint16_t const counted = code == 503 ? 500 : code;
+  if (m_bestCode == 0 || classOf(counted) < classOf(m_bestCode) || classOf(counted) == 6) {
+    if (classOf(m_bestCode) == 6)
+      return;
+    m_bestCode = counted;
+    m_bestReason = code == 503 ? "Server Internal Error" : reason;
+  }
+}
+
+void Call::failed(Branch& branch, uint16_t code, std::string const& reason) {
+  tmr_cancel(&branch.timeout);
+  m_calls.release(branch.session);
+  branch.session = nullptr;
+  noteFailure(code, reason);
+  if (m_state != State::TRYING && m_state != State::EARLY)
+    return;
+  if (classOf(code) == 6)
+    return answerFailure();
+  bool const ringing = std::any_of(m_branches.begin(), m_branches.end(),
+                                   [](std::unique_ptr<Branch> const& each) { return each->session != nullptr; });
+  if (!ringing)
+    startGroup();
+}
+
+void Call::dropBranchesBut(Branch const* keep) {
+  for (auto& branch : m_branches) {
+    if (branch.get() == keep || !branch->session)
+      continue;
+    tmr_cancel(&branch->timeout);
+    // libre cancels a branch still ringing and sends BYE to one that
+    // answered meanwhile.
+    m_calls.release(branch->session);
+    branch->session = nullptr;
+  }
+}
+
+void Call::answerFailure() {
+  dropBranchesBut(nullptr);
+  uint16_t const code = m_bestCode ? m_bestCode : 480;
+  std::string const reason = m_bestCode ? m_bestReason : "Temporarily Unavailable";
+  if (m_caller)
+    sipsess_reject(m_caller, code, reason.c_str(), nullptr);
+  else
+    sip_treply(nullptr, &m_calls.stack(), m_invite, code, reason.c_str());
+  m_calls.answered(*this, m_result, code);
+  end();
+}
+
+void Call::end() {
+  if (m_state == State::ENDED)
+    return;
+  m_state = State::ENDED;
+  dropBranchesBut(nullptr);
+  m_calls.release(m_caller);
+  m_caller = nullptr;
+  m_calls.finish(*this);
+}
+
+mbuf* Call::bodyOf(sip_msg const& message) {
+  size_t const length = mbuf_get_left(message.mb);
+  if (length == 0)
+    return nullptr;
+  mbuf* const body = mbuf_alloc(length);
+  if (!body)
+    return nullptr;
+  mbuf_write_mem(body, mbuf_buf(message.mb), length);
+  body->pos = 0;
+  return body;
+}
+
+// The user part the gateway's Contact shows a leg: the caller sees the
+// user it called, the callee the caller's user.
+std::string Call::contactUser(pl const& user) {
+  std::string text = textOf(user);
+  return text.empty() ? std::string("gateway") : text;
+}
+
+std::string Call::contentType(sip_msg const& message) {
+  sip_hdr const* const type = sip_msg_hdr(&message, SIP_HDR_CONTENT_TYPE);
+  return type ? textOf(type->val) : std::string("application/sdp");
+}
+
+bool Call::send(Branch& branch) {
+  sip_msg const& invite = *m_invite;
+  std::string const fromUri = textOf(invite.from.auri);
+  std::string const fromName = textOf(invite.from.dname);
+  std::string const user = contactUser(invite.from.uri.user);
+  char const* route = branch.target.route.c_str();
+  mbuf* const offer = bodyOf(invite);
+  int const error = sipsess_connect(
+      &branch.session, &m_calls.sessions(), branch.target.uri.c_str(), fromName.empty() ? nullptr : fromName.c_str(),
+      fromUri.c_str(), user.c_str(), branch.target.route.empty() ? nullptr : &route,
+      branch.target.route.empty() ? 0 : 1, contentType(invite).c_str(), offer, nullptr, nullptr, false, nullptr,
+      onBranchAnswer, onBranchProgress, onBranchEstablished, onBranchInfo, nullptr, onBranchClosed, &branch, nullptr);
+  mem_deref(offer);
+  if (error != 0)
+    branch.session = nullptr;
+  return error == 0;
+}
+
+bool Call::acceptCaller(uint16_t code, pl const& reason, mbuf* description) {
+  std::string const text = textOf(reason);
+  std::string const user = contactUser(m_invite->uri.user);
+  return sipsess_accept(&m_caller, &m_calls.sessions(), m_invite, code, text.c_str(), user.c_str(),
+                        contentType(*m_invite).c_str(), description, nullptr, nullptr, false, nullptr, nullptr,
+                        onCallerEstablished, onCallerInfo, nullptr, onCallerClosed, this, nullptr) == 0;
+}
+
+void Call::onBranchProgress(sip_msg const* message, void* argument) {
+  Branch& branch = *static_cast<Branch*>(argument);
+  Call& call = *branch.call;
+  if (message->scode <= 100 || (call.m_state != State::TRYING && call.m_state != State::EARLY))
+    return;
+  mbuf* description = nullptr;
+  if (!call.m_earlyMedia && mbuf_get_left(message->mb) > 0) {
+    description = bodyOf(*message);
+    call.m_earlyMedia = description != nullptr;
+  }
+  if (!call.m_caller) {
+    if (call.acceptCaller(message->scode, message->reason, description))
+      call.m_state = State::EARLY;
+  } else {
+    std::string const reason = textOf(message->reason);
+    sipsess_progress(call.m_caller, message->scode, reason.c_str(), description, nullptr);
+  }
+  mem_deref(description);
+}
+
+int Call::onBranchAnswer(sip_msg const* message, void* argument) {
+  Branch& branch = *static_cast<Branch*>(argument);
+  if (!branch.call->m_winner)
+    branch.call->m_answer.assign(reinterpret_cast<char const*>(mbuf_buf(message->mb)), mbuf_get_left(message->mb));
+  return 0;
+}
+
+void Call::onBranchEstablished(sip_msg const* message, void* argument) {
+  Branch& branch = *static_cast<Branch*>(argument);
+  Call& call = *branch.call;
+  tmr_cancel(&branch.timeout);
+  if (call.m_state != State::TRYING && call.m_state != State::EARLY) {
+    // Another branch won first, or the caller left: libre says BYE.
+    call.m_calls.release(branch.session);
+    branch.session = nullptr;
+    return;
+  }
+  call.m_winner = &branch;
+  call.dropBranchesBut(&branch);
+  mbuf* const description = mbuf_alloc(call.m_answer.size() + 1);
+  mbuf_write_mem(description, reinterpret_cast<uint8_t const*>(call.m_answer.data()), call.m_answer.size());
+  description->pos = 0;
+  bool answered = false;
+  if (call.m_caller) {
+    std::string const reason = textOf(message->reason);
+    answered = sipsess_answer(call.m_caller, message->scode, reason.c_str(), description, nullptr) == 0;
+  } else {
+    answered = call.acceptCaller(message->scode, message->reason, description);
+  }
+  mem_deref(description);
+  call.m_calls.answered(call, call.m_result, message->scode);
+  if (!answered)
+    return call.end();
+  call.m_state = State::ANSWERED;
+  call.m_calls.established(call);
+}
+
+void Call::onBranchClosed(int error, sip_msg const* message, void* argument) {
+  Branch& branch = *static_cast<Branch*>(argument);
+  Call& call = *branch.call;
+  if (&branch == call.m_winner || call.m_state == State::ENDED) {
+    // The callee hung up (or failed) after answering: the caller goes too.
+    call.m_calls.release(branch.session);
+    branch.session = nullptr;
+    return call.end();
+  }
+  if (message && message->scode >= 300)
+    return call.failed(branch, message->scode, textOf(message->reason));
+  call.failed(branch, error == ETIMEDOUT ? 408 : 503, error == ETIMEDOUT ? "Request Timeout" : "Service Unavailable");
+}
+
+void Call::onBranchTimeout(void* argument) {
+  Branch& branch = *static_cast<Branch*>(argument);
+  branch.call->failed(branch, 408, "Request Timeout");
+}
+
+void Call::onCallerEstablished(sip_msg const*, void* argument) {
+  Call& call = *static_cast<Call*>(argument);
+  if (call.m_state == State::ANSWERED)
+    call.m_state = State::ESTABLISHED;
+}
+
+void Call::onCallerClosed(int, sip_msg const*, void* argument) {
+  Call& call = *static_cast<Call*>(argument);
+  // A CANCEL while ringing: libre has answered it and the INVITE (487).
+  if (call.m_state == State::TRYING || call.m_state == State::EARLY)
+    call.m_calls.answered(call, call.m_result, 487);
+  call.end();
+}
+
+void Call::relayInfo(sipsess* to, sip_msg const& message) {
+  PendingInfo* const pending = static_cast<PendingInfo*>(mem_zalloc(sizeof(PendingInfo), destroyPendingInfo));
+  if (!pending)
+    return;
+  pending->stack = &m_calls.stack();
+  pending->request = static_cast<sip_msg const*>(mem_ref(const_cast<sip_msg*>(&message)));
+  sip_hdr const* const type = sip_msg_hdr(&message, SIP_HDR_CONTENT_TYPE);
+  std::string const contentType = type ? textOf(type->val) : std::string("application/octet-stream");
+  mbuf* const body = bodyOf(message);
+  if (!to || sipsess_info(to, contentType.c_str(), body, onInfoAnswered, pending) != 0) {
+    sip_reply(pending->stack, &message, 481, "Call/Transaction Does Not Exist");
+    mem_deref(pending);
+  }
+  mem_deref(body);
+}
+
+void Call::onCallerInfo(sip*, sip_msg const* message, void* argument) {
+  Call& call = *static_cast<Call*>(argument);
+  call.relayInfo(call.m_winner ? call.m_winner->session : nullptr, *message);
+}
+
+void Call::onBranchInfo(sip*, sip_msg const* message, void* argument) {
+  Branch& branch = *static_cast<Branch*>(argument);
+  branch.call->relayInfo(&branch == branch.call->m_winner ? branch.call->m_caller : nullptr, *message);
+}
+
+void Call::onInfoAnswered(int error, sip_msg const* message, void* argument) {
+  PendingInfo* const pending = static_cast<PendingInfo*>(argument);
+  if (message) {
+    std::string const reason = textOf(message->reason);
+    sip_reply(pending->stack, pending->request, message->scode, reason.c_str());
+  } else {
+    sip_reply(pending->stack, pending->request, error == ETIMEDOUT ? 408 : 503,
+              error == ETIMEDOUT ? "Request Timeout" : "Service Unavailable");
+  }
+  // libre calls a request's handler once, with its final answer.
+  mem_deref(pending);
+}
+
+std::string Call::describe() const {
+  static char const* const kStates[] = {"trying", "early", "answered", "established", "ended"};
+  std::string text = textOf(m_invite->from.auri) + " -> " + textOf(m_invite->ruri) + " " +
+                     kStates[static_cast<int>(m_state)];
+  if (m_winner)
+    text += " at " + m_winner->target.uri;
+  return text;
+}

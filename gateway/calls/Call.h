@@ -1,0 +1,128 @@
+// Call: one call the gateway relays, as a back-to-back user agent on libre's
+// session layer: the caller's INVITE ends here (the caller leg, a dialog of
+// the gateway's with the caller), and the gateway places its own INVITE to
+// each target (a branch, a dialog of the gateway's with the callee). libre
+// keeps the transactions, dialogs, retransmissions, ACK and CANCEL of both;
+// this class only carries what one leg says to the other.
+//
+// Decisions, with their reasons:
+// - Forking (RFC 3261 section 16.6): targets of equal q ring together, a
+//   lower q only once every higher one failed. The first 2xx wins and every
+//   other branch is cancelled. Otherwise the best final answer goes back
+//   (section 16.7: a 6xx at once; else the lowest class, 503 becoming 500).
+// - The caller leg is accepted (libre's server transaction made) with the
+//   first provisional answer of a branch, early SDP included, or with the
+//   2xx. Until then the gateway has answered 100 Trying statelessly, and a
+//   retransmitted INVITE or a CANCEL reaches Calls, which finds this call by
+//   its Call-ID, From tag and CSeq: libre's session layer can only accept an
+//   INVITE with an answer above 100, and a 180 sent before any phone rings
+//   would tell the caller a lie.
+// - SDP passes through unchanged: the caller's offer goes to every branch,
+//   the winner's answer back. An INVITE without an offer is refused (488)
+//   before any branch: libre's session layer answers an offer in a 2xx at
+//   once, in the ACK, which a relay cannot (the answer is the caller's).
+// - Early SDP goes back from one branch only, the first that sends it:
+//   a caller can play one early media stream.
+// - A branch that has not answered finally within the INVITE transaction
+//   timeout is cancelled and counts as 408: libre waits for ever once a
+//   phone rings.
+// - Either leg ending (BYE, CANCEL, a transport error, a timeout) ends the
+//   other: libre sends the BYE or the CANCEL.
+//
+// Owned by Calls; it dies only from its own timer (finish()), never inside
+// a libre callback, since libre still touches the session after calling it.
+#pragma once
+
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "registrar/Registrar.h"
+#include "sip/Libre.h"
+
+class Calls;
+
+class Call {
+ public:
+  enum class State { TRYING, EARLY, ANSWERED, ESTABLISHED, ENDED };
+
+  // invite stays referenced while the call needs it. targets: in the order
+  // they ring, highest q first.
+  Call(Calls& calls,
+       sip_msg const& invite,
+       std::string result,
+       std::vector<Registrar::CallTarget> targets,
+       uint32_t inviteTimeoutMs);
+  ~Call();
+  Call(Call const&) = delete;
+  Call& operator=(Call const&) = delete;
+
+  // Sends the first group of branches; false when none could be sent (the
+  // caller is then answered).
+  void start();
+  // Whether request is the caller's INVITE (the same transaction) or a
+  // CANCEL of it.
+  bool isInvite(sip_msg const& request) const;
+  // A CANCEL of the INVITE before the caller leg exists: 487 and the end.
+  void cancel(sip_msg const& cancel);
+  void retransmitted() const;
+
+  State state() const { return m_state; }
+  sip_msg const& invite() const { return *m_invite; }
+  // What the control socket shows of the call.
+  std::string describe() const;
+  uint64_t startedMs() const { return m_startedMs; }
+
+ private:
+  struct Branch {
+    Call* call;
+    sipsess* session = nullptr;
+    Registrar::CallTarget target;
+    tmr timeout;
+  };
+
+  void startGroup();
+  // Keeps the best final answer so far (RFC 3261 section 16.7).
+  void noteFailure(uint16_t code, std::string const& reason);
+  void failed(Branch& branch, uint16_t code, std::string const& reason);
+  void dropBranchesBut(Branch const* keep);
+  // The caller gets the best final answer; the call ends.
+  void answerFailure();
+  void end();
+  // Sends the branch's INVITE; false when libre refused it.
+  bool send(Branch& branch);
+  bool acceptCaller(uint16_t code, pl const& reason, mbuf* description);
+  static std::string contactUser(pl const& user);
+  static std::string contentType(sip_msg const& message);
+  void relayInfo(sipsess* to, sip_msg const& message);
+  static mbuf* bodyOf(sip_msg const& message);
+
+  static void onBranchProgress(sip_msg const* message, void* branch);
+  static int onBranchAnswer(sip_msg const* message, void* branch);
+  static void onBranchEstablished(sip_msg const* message, void* branch);
+  static void onBranchClosed(int error, sip_msg const* message, void* branch);
+  static void onBranchInfo(sip* stack, sip_msg const* message, void* branch);
+  static void onBranchTimeout(void* branch);
+  static void onCallerEstablished(sip_msg const* message, void* call);
+  static void onCallerClosed(int error, sip_msg const* message, void* call);
+  static void onCallerInfo(sip* stack, sip_msg const* message, void* call);
+  static void onInfoAnswered(int error, sip_msg const* message, void* pending);
+
+  Calls& m_calls;
+  sip_msg const* m_invite;
+  std::string m_result;
+  std::vector<Registrar::CallTarget> m_targets;
+  size_t m_next = 0;  // the first target not yet rung
+  uint32_t m_inviteTimeoutMs;
+  State m_state = State::TRYING;
+  sipsess* m_caller = nullptr;
+  // Every branch sent, kept to the end of the call: libre's sessions call
+  // back with their branch.
+  std::vector<std::unique_ptr<Branch>> m_branches;
+  Branch* m_winner = nullptr;  // the branch whose 2xx went to the caller
+  bool m_earlyMedia = false;  // a branch's early SDP went to the caller
+  uint16_t m_bestCode = 0;
+  std::string m_bestReason;
+  std::string m_answer;  // the winning branch's SDP
+  uint64_t m_startedMs;
+};

@@ -1,0 +1,175 @@
+#include "calls/Calls.h"
+
+#include <algorithm>
+
+#include "sip/Exchange.h"
+#include "sip/MonotonicClock.h"
+
+namespace {
+
+// Calls by Call-ID in libre's session layer: its table of sessions.
+constexpr int kSessionBuckets = 1024;
+
+std::string textOf(pl const& value) {
+  return std::string(value.p ? value.p : "", value.l);
+}
+
+}  // namespace
+
+Calls::Calls(Registrar& registrar, Listeners const& listeners, RequestLog& log)
+    : m_registrar(registrar), m_listeners(listeners), m_log(log) {
+  tmr_init(&m_reap);
+  m_statistics.setUpBuckets.assign(setUpBoundsMs().size() + 1, 0);
+}
+
+Calls::~Calls() {
+  tmr_cancel(&m_reap);
+  m_calls.clear();
+  for (sipsess* session : m_released)
+    mem_deref(session);
+  mem_deref(m_sessions);
+}
+
+bool Calls::start(sip& stack, std::string& error) {
+  m_stack = &stack;
+  // No handler of new sessions: the front-end hands every new INVITE to
+  // handle(), before the session layer's listener sees it.
+  if (sipsess_listen(&m_sessions, &stack, kSessionBuckets, nullptr, nullptr) != 0) {
+    error = "the SIP stack cannot take calls";
+    return false;
+  }
+  return true;
+}
+
+bool Calls::takesInDialog(sip_msg const& request) {
+  for (char const* method : {"ACK", "BYE", "INFO", "INVITE", "REFER"})
+    if (pl_strcmp(&request.met, method) == 0)
+      return true;
+  return false;
+}
+
+Call* Calls::find(sip_msg const& request) const {
+  auto const range = m_calls.equal_range(textOf(request.callid));
+  for (auto each = range.first; each != range.second; ++each)
+    if (each->second->isInvite(request))
+      return each->second.get();
+  return nullptr;
+}
+
+bool Calls::cancelled(sip_msg const& cancel) {
+  Call* const call = find(cancel);
+  if (!call || call->state() == Call::State::ENDED)
+    return false;
+  call->cancel(cancel);
+  return true;
+}
+
+void Calls::handle(Exchange& exchange) {
+  sip_msg const& invite = exchange.request();
+  if (Call* const call = find(invite))
+    return call->retransmitted();
+  if (m_maxCalls != 0 && m_statistics.active >= m_maxCalls)
+    return exchange.answer(503, "Service Unavailable",
+                           "Retry-After: " + std::to_string(kRetryAfterSeconds) + "\r\n");
+  CNameAddr target;
+  RefPtr<LS_IIdentity> const identity = exchange.resolveOrAnswer(invite.ruri, target);
+  if (!identity)
+    return;
+  std::vector<Registrar::CallTarget> targets = targetsOf(identity.get());
+  if (targets.empty())
+    return exchange.answer(480, "Temporarily Unavailable");
+  auto const loops = std::remove_if(targets.begin(), targets.end(),
+                                    [this](Registrar::CallTarget const& each) { return isGateway(each); });
+  if (loops == targets.begin())
+    return exchange.answer(482, "Loop Detected");
+  targets.erase(loops, targets.end());
+  if (mbuf_get_left(invite.mb) == 0)
+    return exchange.answer(488, "Not Acceptable Here");
+  auto call = std::make_unique<Call>(*this, invite, exchange.result(), std::move(targets), kDefaultInviteTimeoutMs);
+  Call& started = *call;
+  m_calls.emplace(textOf(invite.callid), std::move(call));
+  ++m_statistics.active;
+  exchange.handOver();
+  started.start();
+}
+
+std::vector<Registrar::CallTarget> Calls::targetsOf(LS_IIdentity* identity) const {
+  std::vector<Registrar::CallTarget> targets = m_registrar.callTargets(identity);
+  // Highest q first; equal q ring together (RFC 3261 section 16.6).
+  std::stable_sort(targets.begin(), targets.end(),
+                   [](Registrar::CallTarget const& a, Registrar::CallTarget const& b) { return a.q > b.q; });
+  return targets;
+}
+
+bool Calls::isGateway(Registrar::CallTarget const& target) const {
+  std::string const& text = target.route.empty() ? target.uri : target.route;
+  pl value;
+  pl_set_str(&value, text.c_str());
+  uri parsed;
+  return uri_decode(&parsed, &value) == 0 && m_listeners.names(parsed);
+}
+
+void Calls::answered(Call& call, std::string const& result, uint16_t code) {
+  m_log.write(call.invite(), result, code);
+  if (code >= 300)
+    ++m_statistics.failed[code];
+}
+
+std::vector<uint64_t> const& Calls::setUpBoundsMs() {
+  static std::vector<uint64_t> const bounds{100, 250, 500, 1000, 2500, 5000, 10000, 30000};
+  return bounds;
+}
+
+void Calls::established(Call& call) {
+  ++m_statistics.setUp;
+  uint64_t const elapsed = MonotonicClock::nowMs() - call.startedMs();
+  std::vector<uint64_t> const& bounds = setUpBoundsMs();
+  size_t const bucket = std::lower_bound(bounds.begin(), bounds.end(), elapsed) - bounds.begin();
+  ++m_statistics.setUpBuckets[bucket];
+  m_statistics.setUpSecondsSum += static_cast<double>(elapsed) / 1000.0;
+}
+
+void Calls::release(sipsess* session) {
+  if (!session)
+    return;
+  m_released.push_back(session);
+  reapSoon();
+}
+
+void Calls::finish(Call& call) {
+  m_finished.push_back(&call);
+  --m_statistics.active;
+  reapSoon();
+}
+
+void Calls::reapSoon() {
+  if (!tmr_isrunning(&m_reap))
+    tmr_start(&m_reap, 0, onReap, this);
+}
+
+void Calls::onReap(void* argument) {
+  Calls& calls = *static_cast<Calls*>(argument);
+  std::vector<sipsess*> released;
+  released.swap(calls.m_released);
+  for (sipsess* session : released)
+    mem_deref(session);
+  std::vector<Call*> finished;
+  finished.swap(calls.m_finished);
+  for (Call* call : finished) {
+    auto const range = calls.m_calls.equal_range(textOf(call->invite().callid));
+    for (auto each = range.first; each != range.second; ++each) {
+      if (each->second.get() == call) {
+        calls.m_calls.erase(each);
+        break;
+      }
+    }
+  }
+}
+
+std::vector<std::string> Calls::describe() const {
+  std::vector<std::string> lines;
+  for (auto const& entry : m_calls)
+    if (entry.second->state() != Call::State::ENDED)
+      lines.push_back(entry.second->describe());
+  return lines;
+}
