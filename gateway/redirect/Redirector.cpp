@@ -5,6 +5,7 @@
 
 #include "CBlob.h"
 #include "LS_IRegistrationInbound.h"
+#include "registrar/InboundFilter.h"
 #include "sip/Exchange.h"
 
 namespace {
@@ -32,6 +33,8 @@ void Redirector::handle(Exchange& exchange) {
   CNameAddr target;
   RefPtr<LS_IIdentity> const identity = exchange.resolveOrAnswer(exchange.request().ruri, target);
   if (!identity)
+    return;
+  if (InboundFilter::refuses(exchange, *identity, LS_IdentityFace::CALL_INBOUND))
     return;
   std::vector<Found> found;
   exchange.clock().measure([&] {

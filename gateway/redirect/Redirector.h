@@ -11,7 +11,9 @@
 // contact registered without one; registrations of equal q keep the face's
 // order, oldest first.
 //
-// A source its SourceFilter does not admit gets 403 before any lookup.
+// A source its SourceFilter does not admit gets 403 before any lookup, and
+// one the called identity's inbound call face denies (InboundFilter) gets
+// 403 before its contacts are read.
 #pragma once
 
 #include "redirect/SourceFilter.h"

@@ -9,6 +9,7 @@
 #include "LS_ILocationService.h"
 #include "LS_IdentityResolution.h"
 #include "LS_IdentityType.h"
+#include "registrar/InboundFilter.h"
 #include "registrar/NatTraversal.h"
 #include "registrar/SipUriComparison.h"
 #include "sip/Capabilities.h"
@@ -75,6 +76,8 @@ void Registrar::handle(Exchange& exchange) {
       m_authenticator.refuseUnknown(exchange, to);
     return;
   }
+  if (InboundFilter::refuses(exchange, *resolved, LS_IdentityFace::REGISTRATION_INBOUND))
+    return;
   Authenticator::Admission const admission = m_authenticator.admit(exchange, resolved.get(), to);
   if (admission == Authenticator::Admission::REFUSED)
     return;

@@ -49,7 +49,10 @@
 //   goes, so that the group answers the user as before. The group's own
 //   name cannot register (403).
 // - Who may register, and with what credentials, is the Authenticator's
-//   to decide; a To that denotes no identity is answered by it too.
+//   to decide; a To that denotes no identity is answered by it too. Before
+//   it, the filter rules of the resolved identity's inbound-registration
+//   face (the group's, for a user only "DEFAULT" answers) may deny the
+//   source (InboundFilter): 403, and no nonce is spent on it.
 // - Stateless, as RFC 3261 section 10.3 lets a registrar be: nothing is kept
 //   for a request until it is authenticated, and its answer leaves without a
 //   server transaction. A contact whose binding has the request's Call-ID

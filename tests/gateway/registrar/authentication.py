@@ -16,6 +16,7 @@ from sipphone import Failure, Gateway, Phone, StreamPhone, authorization, check,
 
 HERE = os.path.dirname(os.path.abspath(__file__))
 SCRIPTS = [os.path.join(HERE, "subscribers.script"), os.path.join(HERE, "security.script")]
+FILTERS = os.path.join(HERE, "filters.script")
 PASSWORDS = ["secret", "welcome", "erin-password", "topsecret"]
 # The README's fail2ban filter.
 FAIL2BAN = re.compile(r'^location-gateway: authentication failed for ".*" from (?P<host>\S+) port \d+', re.M)
@@ -338,6 +339,39 @@ def a_phone_giving_up_on_sha256_is_named(program, work, emulator):
         gateway.kill()
 
 
+def filter_rules_refuse_a_source_before_any_challenge(program, work, emulator):
+    gateway = Gateway(program, emulator, work, "filters", SCRIPTS + [FILTERS])
+    try:
+        phone = Phone(gateway.port)
+        neighbour = Phone(gateway.port, "127.0.0.2")
+        # First REGISTER of each, without credentials: 401 is a challenge.
+        cases = [(phone, "sip:fred@example.com", 403), (phone, "sip:carol@example.com", 401),
+                 (phone, "sip:gina@example.com", 401), (neighbour, "sip:gina@example.com", 403),
+                 (phone, "sip:ivan@lab.example", 403), (neighbour, "sip:ivan@lab.example", 200),
+                 (phone, "sip:zoe@lab.example", 403)]
+        for sender, to, expected in cases:
+            uri = "sip:" + to.split("@")[1]
+            answer = sender.send(register(sender, to, sender.new_call_id(), 1, "sip:x@192.0.2.8", uri=uri))
+            check(answer.status == expected, "%s from %s answered %d" % (to, sender.address, answer.status))
+        for to in ("sip:carol@example.com", "sip:gina@example.com"):
+            check(phone.send(authenticated(phone, to, phone.new_call_id(), 2, "sip:x@192.0.2.8", "welcome")).status
+                  == 200, to + " did not register")
+        neighbour.close()
+        phone.close()
+        gateway.stop()
+        lines = [line for line in gateway.output().splitlines() if line.endswith(" 403")]
+        check(lines == ['REGISTER sip:example.com example.com/fred denied by rule 0 "deny 127.0.0.0 255.0.0.0" 403',
+                        'REGISTER sip:example.com example.com/gina denied by rule 1 "deny any" 403',
+                        'REGISTER sip:lab.example lab.example/ivan denied by rule 0 '
+                        '"deny 127.0.0.1 255.255.255.255" 403',
+                        'REGISTER sip:lab.example lab.example/DEFAULT denied by rule 0 '
+                        '"deny 127.0.0.1 255.255.255.255" 403'],
+              "request lines: %r" % lines)
+        check("authentication failed" not in gateway.errors(), "a denied source was counted as a failure")
+    finally:
+        gateway.kill()
+
+
 if __name__ == "__main__":
     if len(sys.argv) < 3:
         sys.exit("usage: authentication.py GATEWAY WORK-DIR [EMULATOR...]")
@@ -350,5 +384,7 @@ if __name__ == "__main__":
                   ("a_query_is_not_reflected", a_query_is_not_reflected),
                   ("spoofed_failures_do_not_hold_a_source", spoofed_failures_do_not_hold_a_source),
                   ("a_nonce_of_another_gateway_is_stale", a_nonce_of_another_gateway_is_stale),
-                  ("a_phone_giving_up_on_sha256_is_named", a_phone_giving_up_on_sha256_is_named)],
+                  ("a_phone_giving_up_on_sha256_is_named", a_phone_giving_up_on_sha256_is_named),
+                  ("filter_rules_refuse_a_source_before_any_challenge",
+                   filter_rules_refuse_a_source_before_any_challenge)],
                  sys.argv[1], sys.argv[2], sys.argv[3:]))
