@@ -43,6 +43,10 @@ class Gateway:
         # Freed memory goes back at once, so that resident memory shows what
         # the gateway keeps rather than what the sanitizer holds back.
         env["ASAN_OPTIONS"] = "quarantine_size_mb=0:" + env.get("ASAN_OPTIONS", "")
+        # The scenarios here check the gateway as registrar and redirect
+        # server unless they ask for relayed calls.
+        if "--calls" not in options:
+            options = ["--calls", "redirect"] + list(options)
         with open(self.out_path, "wb") as out, open(self.err_path, "wb") as err:
             self.process = subprocess.Popen(
                 list(emulator) + [program, "--listen", "127.0.0.1:0", "--store", "none"] + list(options) + list(scripts),
