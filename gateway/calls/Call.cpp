@@ -3,6 +3,7 @@
 #include <algorithm>
 
 #include "calls/Calls.h"
+#include "registrar/NatTraversal.h"
 #include "sip/MonotonicClock.h"
 
 namespace {
@@ -42,6 +43,12 @@ Call::Call(Calls& calls,
       m_startedMs(MonotonicClock::nowMs()) {}
 
 Call::~Call() {
+  // A relay still waiting: libre forgets its handler, and the phone that
+  // asked learns the dialog is gone.
+  mem_deref(m_relay);
+  if (m_relayedTransaction)
+    sip_treply(&m_relayedTransaction, &m_calls.stack(), m_relayed, 481, "Call/Transaction Does Not Exist");
+  mem_deref(const_cast<sip_msg*>(m_relayed));
   for (auto& branch : m_branches) {
     tmr_cancel(&branch->timeout);
     mem_deref(branch->session);
@@ -193,17 +200,23 @@ bool Call::send(Branch& branch) {
       branch.target.route.empty() ? 0 : 1, contentType(invite).c_str(), offer, nullptr, nullptr, false, nullptr,
       onBranchAnswer, onBranchProgress, onBranchEstablished, onBranchInfo, nullptr, onBranchClosed, &branch, nullptr);
   mem_deref(offer);
-  if (error != 0)
+  if (error != 0) {
     branch.session = nullptr;
-  return error == 0;
+    return false;
+  }
+  m_calls.index(sip_dialog_callid(sipsess_dialog(branch.session)), *this);
+  return true;
 }
 
 bool Call::acceptCaller(uint16_t code, pl const& reason, mbuf* description) {
   std::string const text = textOf(reason);
   std::string const user = contactUser(m_invite->uri.user);
-  return sipsess_accept(&m_caller, &m_calls.sessions(), m_invite, code, text.c_str(), user.c_str(),
+  bool const accepted = sipsess_accept(&m_caller, &m_calls.sessions(), m_invite, code, text.c_str(), user.c_str(),
                         contentType(*m_invite).c_str(), description, nullptr, nullptr, false, nullptr, nullptr,
                         onCallerEstablished, onCallerInfo, nullptr, onCallerClosed, this, nullptr) == 0;
+  if (accepted)
+    followCallerFlow();
+  return accepted;
 }
 
 void Call::onBranchProgress(sip_msg const* message, void* argument) {
@@ -260,6 +273,7 @@ void Call::onBranchEstablished(sip_msg const* message, void* argument) {
   if (!answered)
     return call.end();
   call.m_state = State::ANSWERED;
+  call.followFlow(branch.session, branch.target.flow);
   call.m_calls.established(call);
 }
 
@@ -342,4 +356,122 @@ std::string Call::describe() const {
   if (m_winner)
     text += " at " + m_winner->target.uri;
   return text;
+}
+
+void Call::followFlow(sipsess* session, std::string const& flowUri) {
+  if (!session || flowUri.empty())
+    return;
+  // libre takes a dialog's remote target from a message's Contact only: a
+  // message that says nothing else hands it the flow's.
+  mbuf* const text = mbuf_alloc(flowUri.size() + 64);
+  if (!text)
+    return;
+  mbuf_printf(text, "SIP/2.0 200 OK\r\nContact: <%s>\r\n\r\n", flowUri.c_str());
+  text->pos = 0;
+  sip_msg* message = nullptr;
+  if (sip_msg_decode(&message, text) == 0)
+    sip_dialog_update(sipsess_dialog(session), message);
+  mem_deref(message);
+  mem_deref(text);
+}
+
+void Call::followCallerFlow() {
+  sip_msg const& invite = *m_invite;
+  sip_hdr const* const contact = sip_msg_hdr(&invite, SIP_HDR_CONTACT);
+  sip_addr address;
+  if (!contact || sip_addr_decode(&address, &contact->val) != 0)
+    return;
+  std::string flow;
+  if (invite.tp != SIP_TRANSP_UDP)
+    flow = NatTraversal::flowTarget(address.auri, invite.src, invite.tp);
+  else if (!NatTraversal::natedTarget(address.auri, invite.src, invite.tp, flow))
+    return;
+  followFlow(m_caller, flow);
+}
+
+sipsess* Call::otherLeg(sip_msg const& request) const {
+  if (m_caller && sip_dialog_cmp(sipsess_dialog(m_caller), &request))
+    return m_winner ? m_winner->session : nullptr;
+  if (m_winner && m_winner->session && sip_dialog_cmp(sipsess_dialog(m_winner->session), &request))
+    return m_caller;
+  return nullptr;
+}
+
+bool Call::relayInDialog(sip_msg const& request) {
+  if (m_state != State::ANSWERED && m_state != State::ESTABLISHED)
+    return false;
+  sipsess* const to = otherLeg(request);
+  if (!to)
+    return false;
+  sip* const stack = &m_calls.stack();
+  sipsess* const from = to == m_caller ? m_winner->session : m_caller;
+  if (!sip_dialog_rseq_valid(sipsess_dialog(from), &request)) {
+    sip_reply(stack, &request, 500, "Server Internal Error");
+    return true;
+  }
+  if (m_relayed) {
+    sip_treplyf(nullptr, nullptr, stack, &request, false, 491, "Request Pending",
+                "Retry-After: 1\r\nContent-Length: 0\r\n\r\n");
+    return true;
+  }
+  if (sip_strans_alloc(&m_relayedTransaction, stack, &request, nullptr, nullptr) != 0)
+    return true;
+  std::string const method = textOf(request.met);
+  std::string const type = contentType(request);
+  bool const hasBody = mbuf_get_left(request.mb) > 0;
+  int const error = sip_drequestf(
+      &m_relay, stack, true, method.c_str(), sipsess_dialog(to), 0, nullptr, onRelaySent, onRelayAnswered, this,
+      "%s%s%sContent-Length: %zu\r\n\r\n%b", hasBody ? "Content-Type: " : "", hasBody ? type.c_str() : "",
+      hasBody ? "\r\n" : "", mbuf_get_left(request.mb), mbuf_buf(request.mb), mbuf_get_left(request.mb));
+  if (error != 0) {
+    sip_treply(&m_relayedTransaction, stack, &request, 500, "Server Internal Error");
+    m_relayedTransaction = nullptr;
+    return true;
+  }
+  m_relayed = static_cast<sip_msg const*>(mem_ref(const_cast<sip_msg*>(&request)));
+  m_relayTo = to;
+  return true;
+}
+
+int Call::onRelaySent(sip_transp transport, sa const* source, sa const*, mbuf* message, void* argument) {
+  Call& call = *static_cast<Call*>(argument);
+  // The Contact the other leg knows the gateway by.
+  std::string const user =
+      contactUser(call.m_relayTo == call.m_caller ? call.m_invite->uri.user : call.m_invite->from.uri.user);
+  sip_contact contact;
+  sip_contact_set(&contact, user.c_str(), source, transport);
+  return mbuf_printf(message, "%H", sip_contact_print, &contact);
+}
+
+void Call::onRelayAnswered(int error, sip_msg const* message, void* argument) {
+  Call& call = *static_cast<Call*>(argument);
+  if (message && message->scode < 200)
+    return;
+  sip* const stack = &call.m_calls.stack();
+  sip_msg const* const request = call.m_relayed;
+  call.m_relay = nullptr;
+  call.m_relayed = nullptr;
+  if (!message) {
+    sip_treply(&call.m_relayedTransaction, stack, request, error == ETIMEDOUT ? 408 : 503,
+               error == ETIMEDOUT ? "Request Timeout" : "Service Unavailable");
+  } else {
+    bool const invite = pl_strcmp(&message->cseq.met, "INVITE") == 0;
+    if (invite && message->scode < 300)
+      sip_drequestf(nullptr, stack, false, "ACK", sipsess_dialog(call.m_relayTo), message->cseq.num, nullptr,
+                    nullptr, nullptr, nullptr, "Content-Length: 0\r\n\r\n");
+    std::string const reason = textOf(message->reason);
+    std::string const user =
+        contactUser(call.m_relayTo == call.m_caller ? call.m_invite->from.uri.user : call.m_invite->uri.user);
+    sip_contact contact;
+    sip_contact_set(&contact, user.c_str(), &request->dst, request->tp);
+    std::string const type = contentType(*message);
+    bool const hasBody = mbuf_get_left(message->mb) > 0;
+    sip_treplyf(&call.m_relayedTransaction, nullptr, stack, request, false, message->scode, reason.c_str(),
+                "%H%s%s%sContent-Length: %zu\r\n\r\n%b", sip_contact_print, &contact,
+                hasBody ? "Content-Type: " : "", hasBody ? type.c_str() : "", hasBody ? "\r\n" : "",
+                mbuf_get_left(message->mb), mbuf_buf(message->mb), mbuf_get_left(message->mb));
+  }
+  call.m_relayedTransaction = nullptr;
+  call.m_relayTo = nullptr;
+  mem_deref(const_cast<sip_msg*>(request));
 }

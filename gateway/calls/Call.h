@@ -26,6 +26,17 @@
 // - A branch that has not answered finally within the INVITE transaction
 //   timeout is cancelled and counts as 408: libre waits for ever once a
 //   phone rings.
+// - A re-INVITE or UPDATE (hold, resume, a codec change) goes to the other
+//   leg as the same request with the same body, and the final answer comes
+//   back with its body; a 2xx to a relayed re-INVITE is acknowledged at once
+//   on the leg that gave it. libre's session layer would answer a re-INVITE
+//   itself, at once, which a relay cannot: the answer is the other phone's.
+//   libre's server and client transactions carry them; one at a time per
+//   call (491 to a second, RFC 3261 section 14.2).
+// - A leg reached over a connection (TCP, TLS, WebSocket) or through NAT
+//   keeps being reached that way: the dialog's remote target is its
+//   Contact at the address the flow came from, as Kamailio's
+//   fix_nated_contact makes it, so that a BYE finds the phone.
 // - Either leg ending (BYE, CANCEL, a transport error, a timeout) ends the
 //   other: libre sends the BYE or the CANCEL.
 //
@@ -66,6 +77,10 @@ class Call {
   // A CANCEL of the INVITE before the caller leg exists: 487 and the end.
   void cancel(sip_msg const& cancel);
   void retransmitted() const;
+  // A re-INVITE or UPDATE in one of the call's dialogs, relayed to the
+  // other leg and its answer back (see relay below); false when the
+  // request is not in either dialog.
+  bool relayInDialog(sip_msg const& request);
 
   State state() const { return m_state; }
   sip_msg const& invite() const { return *m_invite; }
@@ -95,6 +110,12 @@ class Call {
   static std::string contactUser(pl const& user);
   static std::string contentType(sip_msg const& message);
   void relayInfo(sipsess* to, sip_msg const& message);
+  // The other leg's session of a request in one of the call's dialogs.
+  sipsess* otherLeg(sip_msg const& request) const;
+  void followFlow(sipsess* session, std::string const& flowUri);
+  void followCallerFlow();
+  static void onRelayAnswered(int error, sip_msg const* message, void* call);
+  static int onRelaySent(sip_transp transport, sa const* source, sa const* destination, mbuf* message, void* call);
   static mbuf* bodyOf(sip_msg const& message);
 
   static void onBranchProgress(sip_msg const* message, void* branch);
@@ -125,4 +146,10 @@ class Call {
   std::string m_bestReason;
   std::string m_answer;  // the winning branch's SDP
   uint64_t m_startedMs;
+  // The re-INVITE or UPDATE being relayed, its server transaction and the
+  // other leg's request.
+  sip_msg const* m_relayed = nullptr;
+  sip_strans* m_relayedTransaction = nullptr;
+  struct sip_request* m_relay = nullptr;
+  sipsess* m_relayTo = nullptr;
 };

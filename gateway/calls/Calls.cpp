@@ -2,6 +2,7 @@
 
 #include <algorithm>
 
+#include "registrar/InboundFilter.h"
 #include "sip/Exchange.h"
 #include "sip/MonotonicClock.h"
 
@@ -56,6 +57,25 @@ Call* Calls::find(sip_msg const& request) const {
   return nullptr;
 }
 
+void Calls::index(char const* callId, Call& call) {
+  if (callId)
+    m_branchCalls[callId] = &call;
+}
+
+bool Calls::relayedInDialog(sip_msg const& request) {
+  if (pl_strcmp(&request.met, "INVITE") != 0 && pl_strcmp(&request.met, "UPDATE") != 0)
+    return false;
+  std::string const callId = textOf(request.callid);
+  auto const branch = m_branchCalls.find(callId);
+  if (branch != m_branchCalls.end())
+    return branch->second->relayInDialog(request);
+  auto const range = m_calls.equal_range(callId);
+  for (auto each = range.first; each != range.second; ++each)
+    if (each->second->relayInDialog(request))
+      return true;
+  return false;
+}
+
 bool Calls::cancelled(sip_msg const& cancel) {
   Call* const call = find(cancel);
   if (!call || call->state() == Call::State::ENDED)
@@ -73,7 +93,7 @@ void Calls::handle(Exchange& exchange) {
                            "Retry-After: " + std::to_string(kRetryAfterSeconds) + "\r\n");
   CNameAddr target;
   RefPtr<LS_IIdentity> const identity = exchange.resolveOrAnswer(invite.ruri, target);
-  if (!identity)
+  if (!identity || InboundFilter::refuses(exchange, *identity, LS_IdentityFace::CALL_INBOUND))
     return;
   std::vector<Registrar::CallTarget> targets = targetsOf(identity.get());
   if (targets.empty())
@@ -156,6 +176,8 @@ void Calls::onReap(void* argument) {
   std::vector<Call*> finished;
   finished.swap(calls.m_finished);
   for (Call* call : finished) {
+    for (auto each = calls.m_branchCalls.begin(); each != calls.m_branchCalls.end();)
+      each = each->second == call ? calls.m_branchCalls.erase(each) : std::next(each);
     auto const range = calls.m_calls.equal_range(textOf(call->invite().callid));
     for (auto each = range.first; each != range.second; ++each) {
       if (each->second.get() == call) {

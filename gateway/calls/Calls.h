@@ -57,6 +57,9 @@ class Calls {
   void handle(Exchange& exchange);
   // A CANCEL: true when it was for a call here, and answered.
   bool cancelled(sip_msg const& cancel);
+  // A request in a dialog: true when it was a re-INVITE or UPDATE of a
+  // call here, and relayed (Call::relayInDialog).
+  bool relayedInDialog(sip_msg const& request);
   // Whether an in-dialog request is the session layer's.
   static bool takesInDialog(sip_msg const& request);
 
@@ -80,6 +83,8 @@ class Calls {
   void answered(Call& call, std::string const& result, uint16_t code);
   // The callee answered and the caller got it.
   void established(Call& call);
+  // A branch's Call-ID, under which its dialog's requests find the call.
+  void index(char const* callId, Call& call);
   // Lets go of a session on the next turn of the loop: libre may still be
   // inside one of its calls.
   void release(sipsess* session);
@@ -101,6 +106,8 @@ class Calls {
   uint32_t m_maxCalls = 0;
   // By Call-ID; a few calls share one at most (a forked caller's).
   std::multimap<std::string, std::unique_ptr<Call>> m_calls;
+  // The Call-IDs of the branches, each a dialog of the gateway's own.
+  std::map<std::string, Call*> m_branchCalls;
   std::vector<Call*> m_finished;
   std::vector<sipsess*> m_released;
   tmr m_reap;

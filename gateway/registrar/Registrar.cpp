@@ -681,7 +681,7 @@ std::vector<Registrar::CallTarget> Registrar::callTargets(LS_IIdentity* identity
       std::string uri(reinterpret_cast<char const*>(text.GetData()), text.GetSize());
       uri = uri.substr(uri.rfind('<') + 1);
       uri.erase(uri.rfind('>'));
-      CallTarget target{uri, "", callId.isEmpty() ? ContactHeader::kNoQ : priority};
+      CallTarget target{uri, "", "", callId.isEmpty() ? ContactHeader::kNoQ : priority};
       if (!callId.isEmpty() && held != m_bindings.end()) {
         for (auto const& each : held->second.all) {
           Binding const& binding = *each;
@@ -696,6 +696,7 @@ std::vector<Registrar::CallTarget> Registrar::callTargets(LS_IIdentity* identity
             char route[96];
             re_snprintf(route, sizeof route, "sip:%J%s", &binding.source, sip_transp_param(binding.transport));
             target.route = route;
+            target.flow = NatTraversal::flowTarget(uri, binding.source, binding.transport);
           }
           break;
         }

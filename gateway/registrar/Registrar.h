@@ -159,6 +159,9 @@ class Registrar {
   struct CallTarget {
     std::string uri;    // the Request-URI: the contact as registered
     std::string route;  // "sip:ADDR:PORT;transport=..." or empty
+    // With a route: the contact URI over the flow, the target of the
+    // dialog's later requests (NatTraversal::flowTarget).
+    std::string flow;
     unsigned int q;     // thousandths
   };
   std::vector<CallTarget> callTargets(LS_IIdentity* identity) const;

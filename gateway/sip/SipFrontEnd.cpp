@@ -129,8 +129,12 @@ bool SipFrontEnd::onRequest(sip_msg const* request, void* argument) {
   // answered without a transaction, see Exchange::answer).
   if (pl_strcmp(&message.met, "ACK") == 0)
     return !frontEnd.m_calls;
-  if (frontEnd.m_calls && pl_isset(&message.to.tag) && Calls::takesInDialog(message))
-    return false;
+  if (frontEnd.m_calls && pl_isset(&message.to.tag)) {
+    if (frontEnd.m_calls->relayedInDialog(message))
+      return true;
+    if (Calls::takesInDialog(message))
+      return false;
+  }
   if (message.tp == SIP_TRANSP_UDP)
     frontEnd.enlarge(message.sock);
   if (frontEnd.m_rateLimit && !frontEnd.m_rateLimit->admit(*frontEnd.m_stack, message))
