@@ -33,8 +33,8 @@
 
 #include "GatewayHarness.h"
 #include "SipStatistics.h"
-#include "metrics/LibraryClock.h"
 #include "registrar/Registrar.h"
+#include "sip/LibraryClock.h"
 #include "store/BindingReplay.h"
 #include "store/BindingStore.h"
 #include "store/StoreSchema.h"

@@ -14,7 +14,7 @@
 // A source its SourceFilter does not admit gets 403 before any lookup.
 #pragma once
 
-#include "redirect/SourceFilter.h"
+#include "sip/SourceFilter.h"
 
 class Exchange;
 

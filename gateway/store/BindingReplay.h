@@ -28,8 +28,8 @@
 #include "LS_IIdentity.h"
 #include "RefPtr.h"
 #include "ScriptSession.h"
-#include "metrics/LibraryClock.h"
 #include "registrar/Registrar.h"
+#include "sip/LibraryClock.h"
 #include "store/BindingStore.h"
 
 class BindingReplay {

@@ -53,7 +53,7 @@
 #include "LS_IRegistrationOutbound.h"
 #include "RefPtr.h"
 #include "ScriptSession.h"
-#include "metrics/LibraryClock.h"
+#include "sip/LibraryClock.h"
 #include "sip/Libre.h"
 #include "trunks/TrunkKeepAlive.h"
 #include "trunks/TrunkTls.h"
