@@ -28,13 +28,13 @@
 #include "control/ControlServer.h"
 #include "control/GatewayCommands.h"
 #include "metrics/MetricsServer.h"
+#include "registrar/BindingReplay.h"
 #include "registrar/CredentialMask.h"
 #include "registrar/DigestAuthentication.h"
 #include "sip/LibraryClock.h"
 #include "sip/Libre.h"
 #include "sip/SipFrontEnd.h"
 #include "sip/SourceFilter.h"
-#include "store/BindingReplay.h"
 #include "store/BindingStore.h"
 
 namespace {
