@@ -14,13 +14,14 @@
 // A source its SourceFilter does not admit gets 403 before any lookup.
 #pragma once
 
+#include "sip/RequestHandler.h"
 #include "sip/SourceFilter.h"
 
 class Exchange;
 
-class Redirector {
+class Redirector final : public RequestHandler {
  public:
-  void handle(Exchange& exchange);
+  void handle(Exchange& exchange) override;
   SourceFilter& sources() { return m_sources; }
 
  private:
