@@ -1,5 +1,5 @@
 // GatewayStatistics: one reading of what the gateway counts since it started,
-// taken by the front-end on libre's thread, and its text as the statistics
+// taken by the Gateway on libre's thread, and its text as the statistics
 // question prints it. The Prometheus form of the same reading is
 // PrometheusExposition's.
 #pragma once
