@@ -1,7 +1,8 @@
 // Feeds arbitrary bytes through the gateway's request path as the stack
 // would hand them over: libre's message decoder, then the front-end's
-// routing (SipFrontEnd::route) to Admission, the Registrar with its digest
-// authentication, or the Redirector, against the gateway tests' model
+// routing (SipFrontEnd::route) to Admission, then through a method table
+// filled as the gateway fills it to the Registrar with its digest
+// authentication or the Redirector, against the gateway tests' model
 // (GatewayHarness::loadModel) and a stack without transports.
 //
 // The input is a stream of messages framed as on a TCP connection: each
@@ -34,15 +35,16 @@
 
 #include "GatewayHarness.h"
 #include "SipStatistics.h"
-#include "metrics/LibraryClock.h"
 #include "redirect/Redirector.h"
 #include "registrar/ExpiryRange.h"
 #include "registrar/NonceGenerator.h"
 #include "registrar/Registrar.h"
 #include "sip/Admission.h"
 #include "sip/Exchange.h"
+#include "sip/LibraryClock.h"
 #include "sip/Libre.h"
 #include "sip/Listeners.h"
+#include "sip/MethodTable.h"
 #include "sip/RequestLog.h"
 #include "sip/SipFrontEnd.h"
 
@@ -144,11 +146,10 @@ void route(sip_msg& message,
            RequestLog& log,
            LibraryClock& clock,
            Admission const& admission,
-           Registrar& registrar,
-           Redirector& redirector) {
+           MethodTable const& methods) {
   arrive(message);
   Exchange exchange(stack(), message, session, log, clock);
-  SipFrontEnd::route(exchange, admission, registrar, redirector);
+  SipFrontEnd::route(exchange, admission, methods);
   check(exchange.answered(), "a request was left unanswered");
   checkAnswer(message);
 }
@@ -169,6 +170,10 @@ extern "C" int LLVMFuzzerTestOneInput(uint8_t const* data, size_t size) {
   {
     Registrar registrar(clock);
     registrar.start(stack(), ExpiryRange(), kNatPingSeconds);
+    MethodTable methods;
+    methods.add("REGISTER", registrar);
+    for (char const* method : {"INVITE", "MESSAGE", "SUBSCRIBE", "OPTIONS"})
+      methods.add(method, redirector);
     mbuf* const input = mbuf_alloc(size + 1);
     check(input && mbuf_write_mem(input, data, size) == 0, "out of memory");
     input->pos = 0;
@@ -184,7 +189,7 @@ extern "C" int LLVMFuzzerTestOneInput(uint8_t const* data, size_t size) {
       size_t const left = mbuf_get_left(input);
       size_t const body = pl_isset(&message->clen) ? std::min<size_t>(pl_u32(&message->clen), left) : left;
       if (message->req && pl_strcmp(&message->met, "ACK") != 0)
-        route(*message, session, log, clock, admission, registrar, redirector);
+        route(*message, session, log, clock, admission, methods);
       mem_deref(message);
       input->pos += body;
     }

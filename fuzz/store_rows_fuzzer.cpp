@@ -33,9 +33,9 @@
 
 #include "GatewayHarness.h"
 #include "SipStatistics.h"
-#include "metrics/LibraryClock.h"
+#include "registrar/BindingReplay.h"
 #include "registrar/Registrar.h"
-#include "store/BindingReplay.h"
+#include "sip/LibraryClock.h"
 #include "store/BindingStore.h"
 #include "store/StoreSchema.h"
 

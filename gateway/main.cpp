@@ -4,6 +4,8 @@
 // redirect server (302 to where a subscriber is registered) on UDP and TCP
 // at every address it is given, and registers its trunks with their
 // registrars, found through DNS, until SIGINT or SIGTERM. It uses the library's public interfaces only.
+// This file reads the options into the Gateway's settings and runs the
+// scripts; the Gateway (Gateway.h) builds the parts and runs them.
 //
 // libre is chosen as the stack: Debian packages it for every architecture
 // the gateway runs on, it is small, runs everything on one event loop (which
@@ -16,26 +18,19 @@
 #include <cstring>
 #include <fstream>
 #include <iostream>
-#include <memory>
 #include <string>
 #include <vector>
 
 #include "CommandTable.h"
+#include "Gateway.h"
 #include "ScriptLanguage.h"
 #include "ScriptRunner.h"
 #include "ScriptSession.h"
-#include "control/Autosave.h"
-#include "control/ControlServer.h"
-#include "control/GatewayCommands.h"
-#include "metrics/LibraryClock.h"
-#include "metrics/MetricsServer.h"
-#include "redirect/SourceFilter.h"
 #include "registrar/CredentialMask.h"
 #include "registrar/DigestAuthentication.h"
+#include "registrar/ExpiryRange.h"
 #include "sip/Libre.h"
-#include "sip/SipFrontEnd.h"
-#include "store/BindingReplay.h"
-#include "store/BindingStore.h"
+#include "sip/SourceFilter.h"
 
 namespace {
 
@@ -114,85 +109,69 @@ bool seconds(char const* text, uint32_t& value) {
   return true;
 }
 
-void onSignal(int) {
-  re_cancel();
-}
-
 struct Options {
-  SipFrontEnd::Settings sip;
-  std::string store = "location-gateway.sqlite";
+  Gateway::Settings gateway;
   bool debug = false;
-  bool statistics = false;
-  std::vector<DigestAlgorithm> digest{DigestAlgorithm::SHA256, DigestAlgorithm::MD5};
-  std::string nonceKeyFile;
-  std::vector<std::string> redirectFrom;
-  unsigned long sourceRate = 0;
-  bool relayCalls = true;
-  uint32_t maxCalls = 0;
-  SecureTransportOptions secure;
-  std::string caFile;
-  std::string control;
-  std::string autosave;
-  std::string metrics;
   std::vector<std::string> scripts;
 };
 
 // Options from the command line; false after printing the usage.
 bool parse(int argc, char** argv, Options& options) {
+  Gateway::Settings& settings = options.gateway;
   for (int i = 1; i < argc; ++i) {
     std::string const argument = argv[i];
     if (argument == "--listen" && i + 1 < argc)
-      options.sip.listen.push_back(argv[++i]);
+      settings.sip.listen.push_back(argv[++i]);
     else if (argument == "--dns-server" && i + 1 < argc)
-      options.sip.dnsServers.push_back(argv[++i]);
-    else if (argument == "--min-expires" && i + 1 < argc && seconds(argv[++i], options.sip.expiry.minimum))
+      settings.sip.dnsServers.push_back(argv[++i]);
+    else if (argument == "--min-expires" && i + 1 < argc && seconds(argv[++i], settings.expiry.minimum))
       continue;
-    else if (argument == "--max-expires" && i + 1 < argc && seconds(argv[++i], options.sip.expiry.maximum))
+    else if (argument == "--max-expires" && i + 1 < argc && seconds(argv[++i], settings.expiry.maximum))
       continue;
     else if (argument == "--default-expires" && i + 1 < argc &&
-             seconds(argv[++i], options.sip.expiry.defaultLifetime))
+             seconds(argv[++i], settings.expiry.defaultLifetime))
       continue;
-    else if (argument == "--nat-ping" && i + 1 < argc && seconds(argv[++i], options.sip.natPingSeconds))
+    else if (argument == "--nat-ping" && i + 1 < argc && seconds(argv[++i], settings.natPingSeconds))
       continue;
     else if (argument == "--control" && i + 1 < argc)
-      options.control = argv[++i];
+      settings.control = argv[++i];
     else if (argument == "--autosave" && i + 1 < argc)
-      options.autosave = argv[++i];
+      settings.autosave = argv[++i];
     else if (argument == "--metrics" && i + 1 < argc)
-      options.metrics = argv[++i];
+      settings.metrics = argv[++i];
     else if (argument == "--store" && i + 1 < argc)
-      options.store = argv[++i];
+      settings.store = argv[++i];
     else if (argument == "--debug")
       options.debug = true;
     else if (argument == "--statistics")
-      options.statistics = true;
-    else if (argument == "--digest" && i + 1 < argc && parseDigestAlgorithms(argv[i + 1], options.digest))
+      settings.statistics = true;
+    else if (argument == "--digest" && i + 1 < argc && parseDigestAlgorithms(argv[i + 1], settings.digest))
       ++i;
     else if (argument == "--nonce-key-file" && i + 1 < argc)
-      options.nonceKeyFile = argv[++i];
+      settings.nonceKeyFile = argv[++i];
     else if (argument == "--tls" && i + 1 < argc)
-      options.secure.tls = argv[++i];
+      settings.secure.tls = argv[++i];
     else if (argument == "--ws" && i + 1 < argc)
-      options.secure.ws = argv[++i];
+      settings.secure.ws = argv[++i];
     else if (argument == "--wss" && i + 1 < argc)
-      options.secure.wss = argv[++i];
+      settings.secure.wss = argv[++i];
     else if (argument == "--certificate" && i + 1 < argc)
-      options.secure.certificate = argv[++i];
+      settings.secure.certificate = argv[++i];
     else if (argument == "--key" && i + 1 < argc)
-      options.secure.key = argv[++i];
+      settings.secure.key = argv[++i];
     else if (argument == "--ca-file" && i + 1 < argc)
-      options.caFile = argv[++i];
+      settings.caFile = argv[++i];
     else if (argument == "--allow-vulnerable-websocket")
-      options.secure.allowVulnerableWebSocket = true;
+      settings.secure.allowVulnerableWebSocket = true;
     else if (argument == "--redirect-from" && i + 1 < argc && SourceFilter().allow(argv[i + 1]))
-      options.redirectFrom.push_back(argv[++i]);
+      settings.redirectFrom.push_back(argv[++i]);
     else if (argument == "--calls" && i + 1 < argc &&
              (std::strcmp(argv[i + 1], "relay") == 0 || std::strcmp(argv[i + 1], "redirect") == 0))
-      options.relayCalls = std::strcmp(argv[++i], "relay") == 0;
-    else if (argument == "--max-calls" && i + 1 < argc && seconds(argv[++i], options.maxCalls))
+      settings.relayCalls = std::strcmp(argv[++i], "relay") == 0;
+    else if (argument == "--max-calls" && i + 1 < argc && seconds(argv[++i], settings.maxCalls))
       continue;
     else if (argument == "--source-rate" && i + 1 < argc &&
-             (options.sourceRate = std::strtoul(argv[++i], nullptr, 10)) > 0)
+             (settings.sourceRate = std::strtoul(argv[++i], nullptr, 10)) > 0)
       continue;
     else if (argument.size() > 1 && argument[0] == '-')
       return false;
@@ -200,12 +179,12 @@ bool parse(int argc, char** argv, Options& options) {
       options.scripts.push_back(argument);
   }
   // A default above the maximum is cut to it, as a requested expiry is.
-  ExpiryRange& expiry = options.sip.expiry;
+  ExpiryRange& expiry = settings.expiry;
   expiry.defaultLifetime = std::min(expiry.defaultLifetime, expiry.maximum);
   if (expiry.minimum > expiry.defaultLifetime)
     return false;
-  if (options.sip.listen.empty())
-    options.sip.listen.push_back("127.0.0.1:5060");
+  if (settings.sip.listen.empty())
+    settings.sip.listen.push_back("127.0.0.1:5060");
   return !options.scripts.empty();
 }
 
@@ -227,111 +206,17 @@ int runScripts(ScriptSession& session, std::vector<std::string> const& scripts) 
   return 0;
 }
 
-// The parts that operate a serving gateway: the control socket (with the
-// autosave it drives) and the metrics, each only when asked for.
-struct Operations {
-  CommandTable table;
-  std::unique_ptr<Autosave> autosave;
-  std::unique_ptr<ControlServer> control;
-  std::unique_ptr<MetricsServer> metrics;
-};
-
-bool startOperations(ScriptSession& session,
-                     SipFrontEnd& frontEnd,
-                     Options const& options,
-                     Operations& parts) {
-  std::string error;
-  if (!options.autosave.empty())
-    parts.autosave = std::make_unique<Autosave>(session, options.autosave);
-  if (!options.control.empty()) {
-    addScriptCommands(parts.table);
-    addGatewayCommands(parts.table, frontEnd);
-    parts.control = std::make_unique<ControlServer>(session, parts.table);
-    frontEnd.followChanges();
-    Autosave* const autosave = parts.autosave.get();
-    parts.control->onLine([&frontEnd] { frontEnd.beginChange(); },
-                          [&frontEnd, autosave](bool applied) {
-                            frontEnd.endChange();
-                            if (autosave && applied)
-                              autosave->changed();
-                          });
-    if (!parts.control->start(options.control, error)) {
-      std::cerr << "location-gateway: " << error << "\n";
-      return false;
-    }
-    std::cerr << "location-gateway: control socket " << options.control << std::endl;
-  }
-  if (!options.metrics.empty()) {
-    parts.metrics = std::make_unique<MetricsServer>([&frontEnd] { return frontEnd.statistics(); });
-    std::string bound;
-    if (!parts.metrics->start(options.metrics, bound, error)) {
-      std::cerr << "location-gateway: " << error << "\n";
-      return false;
-    }
-    std::cerr << "location-gateway: metrics on http://" << bound << "/metrics" << std::endl;
-  }
-  return true;
-}
-
 int serve(ScriptSession& session, Options const& options) {
-  // The statistics question and /metrics report the library's share too.
-  LibraryClock clock(options.statistics || !options.control.empty() || !options.metrics.empty());
+  Gateway gateway(session, options.gateway);
   std::string error;
-  // Outlives the front-end, whose registrar reports to it.
-  std::unique_ptr<BindingStore> store;
-  if (!BindingStore::open(options.store, store, error)) {
+  if (!gateway.start(error)) {
     std::cerr << "location-gateway: " << error << "\n";
     return 1;
   }
-  SipFrontEnd frontEnd(session, clock);
-  frontEnd.registrar().authenticator().offerAlgorithms(options.digest);
-  if (!options.nonceKeyFile.empty()) {
-    std::vector<uint8_t> key;
-    if (!NonceGenerator::loadKeyFile(options.nonceKeyFile, key, error)) {
-      std::cerr << "location-gateway: " << error << "\n";
-      return 1;
-    }
-    frontEnd.registrar().authenticator().useNonceKey(key);
-  }
-  frontEnd.trustForTrunks(options.caFile);
-  for (std::string const& network : options.redirectFrom)
-    frontEnd.redirector().sources().allow(network);
-  if (options.relayCalls)
-    frontEnd.relayCalls(options.maxCalls);
-  if (options.sourceRate > 0)
-    frontEnd.limitSourceRate(static_cast<uint32_t>(options.sourceRate));
-  BindingReplay replay(session, frontEnd.registrar(), clock);
-  if (store && !replay.restore(*store, error)) {
-    std::cerr << "location-gateway: " << error << "\n";
-    return 1;
-  }
-  if (!frontEnd.start(options.sip, error)) {
-    std::cerr << "location-gateway: " << error << "\n";
-    return 1;
-  }
-  std::vector<std::string> secure;
-  if (!frontEnd.startSecure(options.secure, secure, error)) {
-    std::cerr << "location-gateway: " << error << "\n";
-    return 1;
-  }
-  if (frontEnd.dnsServers().empty())
-    std::cerr << "location-gateway: no DNS server configured: host names will not resolve\n";
-  std::cerr << "location-gateway: listening on " << frontEnd.listening() << std::endl;
-  for (std::string const& transport : secure)
-    std::cerr << "location-gateway: listening on " << transport << std::endl;
-  {
-    Operations operations;
-    if (!startOperations(session, frontEnd, options, operations)) {
-      frontEnd.shutDown();
-      return 1;
-    }
-    re_main(onSignal);
-  }
-  frontEnd.shutDown();
-  if (store)
-    store->close();
-  if (options.statistics)
-    std::cerr << "location-gateway: " << frontEnd.requests() << " requests, " << clock.summary() << std::endl;
+  gateway.run();
+  gateway.shutDown();
+  if (options.gateway.statistics)
+    std::cerr << "location-gateway: " << gateway.summary() << std::endl;
   return 0;
 }
 

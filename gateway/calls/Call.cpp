@@ -81,6 +81,17 @@ void Call::cancel(sip_msg const& cancel) {
   end();
 }
 
+void Call::hangUp() {
+  if (m_state == State::ENDED)
+    return;
+  if (m_state == State::TRYING || m_state == State::EARLY) {
+    m_bestCode = 503;
+    m_bestReason = "Service Unavailable";
+    return answerFailure();
+  }
+  end();
+}
+
 void Call::startGroup() {
   while (m_next < m_targets.size()) {
     unsigned int const q = m_targets[m_next].q;

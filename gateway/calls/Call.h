@@ -77,6 +77,9 @@ class Call {
   // A CANCEL of the INVITE before the caller leg exists: 487 and the end.
   void cancel(sip_msg const& cancel);
   void retransmitted() const;
+  // Ends the call from the gateway's side: a caller still waiting gets
+  // 503, the legs that exist get BYE or CANCEL.
+  void hangUp();
   // A re-INVITE or UPDATE in one of the call's dialogs, relayed to the
   // other leg and its answer back (see relay below); false when the
   // request is not in either dialog.

@@ -42,11 +42,13 @@ bool Calls::start(sip& stack, std::string& error) {
   return true;
 }
 
-bool Calls::takesInDialog(sip_msg const& request) {
+DialogHandler::Verdict Calls::inDialog(sip_msg const& request) {
+  if (relayedInDialog(request))
+    return Verdict::ANSWERED;
   for (char const* method : {"ACK", "BYE", "INFO", "INVITE", "REFER"})
     if (pl_strcmp(&request.met, method) == 0)
-      return true;
-  return false;
+      return Verdict::PASSED;
+  return Verdict::UNKNOWN;
 }
 
 Call* Calls::find(sip_msg const& request) const {
@@ -85,6 +87,14 @@ bool Calls::cancelled(sip_msg const& cancel) {
 }
 
 void Calls::handle(Exchange& exchange) {
+  if (pl_strcmp(&exchange.request().met, "CANCEL") != 0)
+    return invite(exchange);
+  if (cancelled(exchange.request()))
+    return exchange.handOver();
+  exchange.answer(481, "Call/Transaction Does Not Exist");
+}
+
+void Calls::invite(Exchange& exchange) {
   sip_msg const& invite = exchange.request();
   if (Call* const call = find(invite))
     return call->retransmitted();
@@ -186,6 +196,12 @@ void Calls::onReap(void* argument) {
       }
     }
   }
+}
+
+void Calls::endAll() {
+  for (auto& entry : m_calls)
+    entry.second->hangUp();
+  onReap(this);
 }
 
 std::vector<std::string> Calls::describe() const {

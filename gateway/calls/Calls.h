@@ -17,7 +17,7 @@
 // - The request log gets the INVITE's line when its final answer leaves,
 //   with that answer's code, whatever part of the call decided it.
 // - In-dialog requests that libre's session layer takes (ACK, BYE, INFO,
-//   re-INVITE) are left to it: takesInDialog() tells the front-end which.
+//   REFER) are left to it; re-INVITE and UPDATE of a call are relayed here.
 //
 // Owns every call; destroying it ends them without a word to the phones
 // (the stack goes down with it). Everything runs on libre's thread.
@@ -31,13 +31,15 @@
 
 #include "calls/Call.h"
 #include "registrar/Registrar.h"
+#include "sip/DialogHandler.h"
 #include "sip/Libre.h"
 #include "sip/Listeners.h"
+#include "sip/RequestHandler.h"
 #include "sip/RequestLog.h"
 
 class Exchange;
 
-class Calls {
+class Calls final : public RequestHandler, public DialogHandler {
  public:
   // How long a branch may take to answer finally, when no face says.
   static constexpr uint32_t kDefaultInviteTimeoutMs = 32 * 1000;
@@ -52,16 +54,13 @@ class Calls {
   // listener, so that the front-end sees every request first.
   bool start(sip& stack, std::string& error);
   void limit(uint32_t maxCalls) { m_maxCalls = maxCalls; }
+  // At shut-down: every call ends, its legs told (BYE, CANCEL or a final
+  // answer) while the stack finishes.
+  void endAll();
 
-  // An INVITE without a To tag.
-  void handle(Exchange& exchange);
-  // A CANCEL: true when it was for a call here, and answered.
-  bool cancelled(sip_msg const& cancel);
-  // A request in a dialog: true when it was a re-INVITE or UPDATE of a
-  // call here, and relayed (Call::relayInDialog).
-  bool relayedInDialog(sip_msg const& request);
-  // Whether an in-dialog request is the session layer's.
-  static bool takesInDialog(sip_msg const& request);
+  // An INVITE without a To tag, or a CANCEL.
+  void handle(Exchange& exchange) override;
+  Verdict inDialog(sip_msg const& request) override;
 
   struct Statistics {
     uint64_t active = 0;
@@ -93,6 +92,12 @@ class Calls {
 
  private:
   Call* find(sip_msg const& request) const;
+  void invite(Exchange& exchange);
+  // A CANCEL: true when it was for a call here, and answered.
+  bool cancelled(sip_msg const& cancel);
+  // A request in a dialog: true when it was a re-INVITE or UPDATE of a
+  // call here, and relayed (Call::relayInDialog).
+  bool relayedInDialog(sip_msg const& request);
   std::vector<Registrar::CallTarget> targetsOf(LS_IIdentity* identity) const;
   bool isGateway(Registrar::CallTarget const& target) const;
   static void onReap(void* calls);

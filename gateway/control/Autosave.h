@@ -18,7 +18,7 @@
 // - A failed write is reported on standard error and tried again at the
 //   next change.
 //
-// Owned by main; dying writes a change still pending. Libre's thread only.
+// Owned by the Gateway; dying writes a change still pending. Libre's thread only.
 #pragma once
 
 #include <string>

@@ -24,8 +24,8 @@
 //   client watches, and each event goes to every client watching (to the
 //   client whose line caused it inside that line's answer).
 //
-// Owned by main, after the front-end it serves; everything runs on libre's
-// thread. Dying closes every connection and removes the socket file.
+// Owned by the Gateway, after the front-end it serves; everything runs on
+// libre's thread. Dying closes every connection and removes the socket file.
 #pragma once
 
 #include <cstddef>

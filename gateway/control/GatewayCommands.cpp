@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <tuple>
+#include <utility>
 #include <vector>
 
 #include "ScriptSession.h"
@@ -40,17 +41,30 @@ void printBindings(ScriptSession& session, Registrar const& registrar, Arguments
 
 }  // namespace
 
-void addGatewayCommands(CommandTable& table, SipFrontEnd const& frontEnd) {
+void addGatewayCommands(CommandTable& table,
+                        Registrar const& registrar,
+                        std::function<GatewayStatistics()> statistics,
+                        Calls const* calls) {
   table.add("statistics", "what the gateway answered, its bindings and trunks, the library's CPU share",
-            [&frontEnd](ScriptSession& session, Arguments const&) {
-              session.output() << frontEnd.statistics().text();
+            [statistics = std::move(statistics)](ScriptSession& session, Arguments const&) {
+              session.output() << statistics().text();
             });
   table.add("bindings [<service>]", "the contacts registered here, of one location service or all",
-            [&frontEnd](ScriptSession& session, Arguments const& arguments) {
-              printBindings(session, frontEnd.registrar(), arguments);
+            [&registrar](ScriptSession& session, Arguments const& arguments) {
+              printBindings(session, registrar, arguments);
             });
   table.add("bindings <service> <identity>", "the contacts one identity registered here",
-            [&frontEnd](ScriptSession& session, Arguments const& arguments) {
-              printBindings(session, frontEnd.registrar(), arguments);
+            [&registrar](ScriptSession& session, Arguments const& arguments) {
+              printBindings(session, registrar, arguments);
+            });
+  if (!calls)
+    return;
+  table.add("calls", "the calls relayed now, with both legs and their state",
+            [calls](ScriptSession& session, Arguments const&) {
+              std::vector<std::string> const lines = calls->describe();
+              if (lines.empty())
+                session.output() << "no calls\n";
+              for (std::string const& line : lines)
+                session.output() << line << "\n";
             });
 }

@@ -7,12 +7,23 @@
 //   bindings [<service> [<identity>]]
 //               registered contacts with their remaining lifetime, Call-ID
 //               and source
+//   calls       the calls relayed now (--calls relay), one line each: the
+//               caller, the Request-URI, the state and, once answered,
+//               the contact that answered
 //
-// The handlers borrow the front-end; the table they are added to must not
-// run a line after it died.
+// The handlers read the registrar and take a fresh reading of the
+// statistics for each question; they borrow the registrar, and the table
+// they are added to must not run a line after it died.
 #pragma once
 
-#include "CommandTable.h"
-#include "sip/SipFrontEnd.h"
+#include <functional>
 
-void addGatewayCommands(CommandTable& table, SipFrontEnd const& frontEnd);
+#include "CommandTable.h"
+#include "calls/Calls.h"
+#include "metrics/GatewayStatistics.h"
+#include "registrar/Registrar.h"
+
+void addGatewayCommands(CommandTable& table,
+                        Registrar const& registrar,
+                        std::function<GatewayStatistics()> statistics,
+                        Calls const* calls);

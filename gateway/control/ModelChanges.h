@@ -16,7 +16,7 @@
 // So an identity the gateway creates while serving is not observed, and is
 // never a trunk.
 //
-// Owned by the front-end; a removed identity's pointer is for comparison
+// Owned by the Gateway; a removed identity's pointer is for comparison
 // only, never followed. Everything runs on libre's thread.
 #pragma once
 

@@ -1,5 +1,5 @@
 // GatewayStatistics: one reading of what the gateway counts since it started,
-// taken by the front-end on libre's thread, and its text as the statistics
+// taken by the Gateway on libre's thread, and its text as the statistics
 // question prints it. The Prometheus form of the same reading is
 // PrometheusExposition's.
 #pragma once
@@ -31,6 +31,18 @@ struct GatewayStatistics {
   // The library's process-wide count of registered contacts.
   int64_t registeredContacts = 0;
   std::vector<Trunk> trunks;
+  // Relayed calls (--calls relay): in progress now, answered since the
+  // start, and failed by the final code the caller got. Their set-up
+  // times (INVITE to the 2xx sent back) as a histogram: callSetUpBuckets[i]
+  // counts the calls within callSetUpBoundsSeconds[i] and above the bound
+  // before; the last counts the rest.
+  bool callsRelayed = false;
+  uint64_t callsActive = 0;
+  uint64_t callsSetUp = 0;
+  std::map<uint16_t, uint64_t> callsFailed;
+  std::vector<double> callSetUpBoundsSeconds;
+  std::vector<uint64_t> callSetUpBuckets;
+  double callSetUpSeconds = 0;
   double cpuSeconds = 0;
   double librarySeconds = 0;
 

@@ -2,7 +2,7 @@
 // own HTTP server, for a Prometheus scraper. Each request takes a fresh
 // reading from the source on libre's thread and answers it as
 // PrometheusExposition renders it; any other path gets 404, another method
-// on /metrics 405. Owned by main; dying closes the listening socket.
+// on /metrics 405. Owned by the Gateway; dying closes the listening socket.
 #pragma once
 
 #include <functional>

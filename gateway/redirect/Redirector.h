@@ -16,13 +16,14 @@
 // 403 before its contacts are read.
 #pragma once
 
-#include "redirect/SourceFilter.h"
+#include "sip/RequestHandler.h"
+#include "sip/SourceFilter.h"
 
 class Exchange;
 
-class Redirector {
+class Redirector final : public RequestHandler {
  public:
-  void handle(Exchange& exchange);
+  void handle(Exchange& exchange) override;
   SourceFilter& sources() { return m_sources; }
 
  private:

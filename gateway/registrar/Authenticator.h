@@ -79,11 +79,11 @@
 #include "LS_IIdentity.h"
 #include "String.h"
 #include "Vector.h"
-#include "metrics/LibraryClock.h"
 #include "registrar/DigestAuthentication.h"
 #include "registrar/NonceGenerator.h"
 #include "registrar/NonceTable.h"
 #include "registrar/UnansweredChallenges.h"
+#include "sip/LibraryClock.h"
 #include "sip/Libre.h"
 #include "sip/SourceThrottle.h"
 

@@ -96,18 +96,19 @@
 #include "LS_IIdentity.h"
 #include "LS_IRegistrationInbound.h"
 #include "RefPtr.h"
-#include "metrics/LibraryClock.h"
 #include "registrar/Authenticator.h"
 #include "registrar/ContactHeader.h"
 #include "registrar/ExpiryRange.h"
 #include "registrar/NatPinger.h"
+#include "sip/LibraryClock.h"
 #include "sip/Libre.h"
 #include "sip/MonotonicTimer.h"
+#include "sip/RequestHandler.h"
 #include "store/BindingStore.h"
 
 class Exchange;
 
-class Registrar {
+class Registrar final : public RequestHandler {
  public:
   static constexpr size_t kMaximumBindings = 32;
   static constexpr size_t kMaximumContacts = 16;
@@ -126,7 +127,7 @@ class Registrar {
   // belong to, the range for faces that give none, and the NAT ping
   // interval (0 for none).
   void start(sip& stack, ExpiryRange const& expiry, uint32_t natPingSeconds);
-  void handle(Exchange& exchange);
+  void handle(Exchange& exchange) override;
   Authenticator& authenticator() { return m_authenticator; }
 
   size_t bindingCount() const { return m_expiries.size(); }

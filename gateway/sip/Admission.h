@@ -28,9 +28,9 @@
 // filter it is given outlive it. Runs on libre's thread.
 #pragma once
 
-#include "redirect/SourceFilter.h"
 #include "sip/Exchange.h"
 #include "sip/Listeners.h"
+#include "sip/SourceFilter.h"
 
 class Admission {
  public:

@@ -24,7 +24,8 @@
 
 namespace Capabilities {
 
-// The methods answered, as SipFrontEnd dispatches them.
+// The methods accepted: those the gateway registers in the front-end's
+// method table, ACK (never answered) and CANCEL (481 from the front-end).
 constexpr char kAllow[] = "Allow: REGISTER, INVITE, ACK, CANCEL, MESSAGE, SUBSCRIBE, OPTIONS\r\n";
 constexpr char kSupported[] = "Supported:\r\n";
 constexpr char kAccept[] = "Accept: */*\r\n";

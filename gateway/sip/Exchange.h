@@ -10,7 +10,7 @@
 #include "LS_IIdentity.h"
 #include "RefPtr.h"
 #include "ScriptSession.h"
-#include "metrics/LibraryClock.h"
+#include "sip/LibraryClock.h"
 #include "sip/Libre.h"
 #include "sip/RequestLog.h"
 

@@ -13,7 +13,7 @@
 
 #include <string>
 
-#include "metrics/AnswerCounters.h"
+#include "sip/AnswerCounters.h"
 #include "sip/Libre.h"
 
 class RequestLog {

@@ -3,7 +3,6 @@
 #include <algorithm>
 #include <cstring>
 
-#include "SipStatistics.h"
 #include "sip/Capabilities.h"
 #include "sip/Exchange.h"
 
@@ -31,14 +30,7 @@ void stopLoop(void*) {
 }  // namespace
 
 SipFrontEnd::~SipFrontEnd() {
-  m_changes.reset();
-  m_calls.reset();
-  mem_deref(m_listener);
-  // Forced: a registrar that never answered the unregistration must not
-  // keep a registration alive that points at a trunk about to die.
-  if (m_stack)
-    sip_close(m_stack, true);
-  m_trunks.reset();
+  close();
   mem_deref(m_stack);
 }
 
@@ -53,13 +45,10 @@ bool SipFrontEnd::start(Settings const& settings, std::string& error) {
   }
   if (!m_listeners.open(*m_stack, settings.listen, error))
     return false;
-  m_registrar.start(*m_stack, settings.expiry, settings.natPingSeconds);
   if (sip_listen(&m_listener, m_stack, true, onRequest, this) != 0) {
     error = "the SIP stack cannot take requests";
     return false;
   }
-  if (m_calls && !m_calls->start(*m_stack, error))
-    return false;
   for (Listeners::Listener const& listener : m_listeners.listeners()) {
     if (listener.transport != SIP_TRANSP_UDP)
       continue;
@@ -69,51 +58,11 @@ bool SipFrontEnd::start(Settings const& settings, std::string& error) {
     if (own.Parse(text, std::char_traits<char>::length(text)))
       m_session.stack().localHostPorts.add(own);
   }
-  m_trunks = std::make_unique<TrunkRegistrations>(*m_stack, m_session, m_clock);
-  m_trunks->useCaFile(m_caFile);
-  m_trunks->start();
   return true;
-}
-
-void SipFrontEnd::followChanges() {
-  m_changes = std::make_unique<ModelChanges>(*m_session.locationMaster());
-}
-
-void SipFrontEnd::beginChange() {
-  m_changes->begin();
-}
-
-void SipFrontEnd::endChange() {
-  m_changes->end();
-  m_registrar.dropRemoved(m_changes->removed(), m_changes->anyServiceChanged());
-  if (m_changes->anyServiceChanged())
-    m_trunks->followAll();
-  else
-    m_trunks->follow(m_changes->touched(), m_changes->removed());
-}
-
-GatewayStatistics SipFrontEnd::statistics() const {
-  GatewayStatistics statistics;
-  statistics.answers = m_log.answers().counts();
-  statistics.failedAuthentications = m_registrar.failedAuthentications();
-  statistics.bindings = m_registrar.bindingCount();
-  statistics.bindingsDropped = m_registrar.bindingsDropped();
-  if (BindingStore const* const store = m_registrar.store()) {
-    statistics.storeRowsRefused = store->rowsRefused();
-    statistics.storeChangesDropped = store->changesDropped();
-  }
-  statistics.registeredContacts = s_sipStatistics.getInboundRegistrations();
-  m_trunks->forEach([&](std::string const& path, bool registered) {
-    statistics.trunks.push_back(GatewayStatistics::Trunk{path, registered});
-  });
-  statistics.cpuSeconds = LibraryClock::cpuSeconds();
-  statistics.librarySeconds = m_clock.librarySeconds();
-  return statistics;
 }
 
 void SipFrontEnd::shutDown() {
   m_listener = static_cast<sip_lsnr*>(mem_deref(m_listener));
-  m_trunks->stop();
   tmr deadline;
   tmr_init(&deadline);
   tmr_start(&deadline, kShutDownMs, stopLoop, nullptr);
@@ -122,50 +71,46 @@ void SipFrontEnd::shutDown() {
   tmr_cancel(&deadline);
 }
 
+void SipFrontEnd::close() {
+  m_listener = static_cast<sip_lsnr*>(mem_deref(m_listener));
+  if (!m_stack || m_closed)
+    return;
+  m_closed = true;
+  sip_close(m_stack, true);
+}
+
 bool SipFrontEnd::onRequest(sip_msg const* request, void* argument) {
   SipFrontEnd& frontEnd = *static_cast<SipFrontEnd*>(argument);
   sip_msg const& message = *request;
   // An ACK gets no answer, the one for a 302 included (every request is
-  // answered without a transaction, see Exchange::answer).
+  // answered without a transaction, see Exchange::answer); one in a dialog
+  // of the calls is their session layer's, which drops the others.
   if (pl_strcmp(&message.met, "ACK") == 0)
-    return !frontEnd.m_calls;
-  if (frontEnd.m_calls && pl_isset(&message.to.tag)) {
-    if (frontEnd.m_calls->relayedInDialog(message))
-      return true;
-    if (Calls::takesInDialog(message))
-      return false;
+    return !frontEnd.m_dialogs;
+  if (frontEnd.m_dialogs && pl_isset(&message.to.tag)) {
+    DialogHandler::Verdict const verdict = frontEnd.m_dialogs->inDialog(message);
+    if (verdict != DialogHandler::Verdict::UNKNOWN)
+      return verdict == DialogHandler::Verdict::ANSWERED;
   }
   if (message.tp == SIP_TRANSP_UDP)
     frontEnd.enlarge(message.sock);
   if (frontEnd.m_rateLimit && !frontEnd.m_rateLimit->admit(*frontEnd.m_stack, message))
     return true;
   Exchange exchange(*frontEnd.m_stack, message, frontEnd.m_session, frontEnd.m_log, frontEnd.m_clock);
-  route(exchange, frontEnd.m_admission, frontEnd.m_registrar, frontEnd.m_redirector, frontEnd.m_calls.get());
+  route(exchange, frontEnd.m_admission, frontEnd.m_methods);
   return true;
 }
 
-void SipFrontEnd::route(Exchange& exchange,
-                        Admission const& admission,
-                        Registrar& registrar,
-                        Redirector& redirector,
-                        Calls* calls) {
+void SipFrontEnd::route(Exchange& exchange, Admission const& admission, MethodTable const& methods) {
   sip_msg const& message = exchange.request();
   if (SecureTransports::sipsOverPlainTransport(message))
     return exchange.answer(416, "Unsupported URI Scheme");
   if (admission.answered(exchange))
     return;
-  if (pl_strcmp(&message.met, "REGISTER") == 0)
-    return registrar.handle(exchange);
-  if (pl_strcmp(&message.met, "CANCEL") == 0) {
-    if (calls && calls->cancelled(message))
-      return exchange.handOver();
+  if (RequestHandler* const handler = methods.find(message.met))
+    return handler->handle(exchange);
+  if (pl_strcmp(&message.met, "CANCEL") == 0)
     return exchange.answer(481, "Call/Transaction Does Not Exist");
-  }
-  if (calls && pl_strcmp(&message.met, "INVITE") == 0)
-    return calls->handle(exchange);
-  if (pl_strcmp(&message.met, "INVITE") == 0 || pl_strcmp(&message.met, "MESSAGE") == 0 ||
-      pl_strcmp(&message.met, "SUBSCRIBE") == 0 || pl_strcmp(&message.met, "OPTIONS") == 0)
-    return redirector.handle(exchange);
   exchange.answer(405, "Method Not Allowed", Capabilities::kAllow);
 }
 

@@ -1,15 +1,20 @@
-// SipFrontEnd: the SIP side of the gateway on libre: the stack with its
-// transports, the listener that hands each request to the part that answers
-// it (Admission first, for what the gateway answers itself; then Registrar
-// for REGISTER, Redirector for requests to a user, 405 with Allow for the
-// rest), and the trunk registrations. Malformed messages never reach it: libre drops what it
-// cannot parse, and every length read here is bounded by the parts.
+// SipFrontEnd: the SIP stack of the gateway on libre, with its transports
+// (listeners, TLS and WebSocket, the DNS client), and the listener that
+// hands each request on: the rate limit and Admission first, then the
+// handler a MethodTable names for the request's method (see route()).
+// Malformed messages never reach it: libre drops what it cannot parse, and
+// every length read here is bounded by the parts.
 //
-// Built after the scripts have run; every address listened on joins the
-// stack settings' local host-ports, and the stack resolves names through
-// its DnsClient. Owned by main; shutDown() unregisters the
-// trunks and closes the stack within a bounded time, after which the object
-// may die.
+// It knows no part above the stack: what answers REGISTER, INVITE and the
+// rest is registered in methods() by whoever composes the gateway, and
+// parts that run on the stack themselves (the registrar's NAT pings, the
+// trunks) are started on stack() once start() has opened it.
+//
+// Built after the scripts have run; every UDP address listened on joins the
+// stack settings' local host-ports. Owned by the Gateway. shutDown() lets
+// the stack finish within a bounded time; close() ends every transaction at
+// once, after which the parts holding client transactions (the trunks) may
+// die before the object itself.
 #pragma once
 
 #include <memory>
@@ -17,29 +22,25 @@
 #include <vector>
 
 #include "ScriptSession.h"
-#include "calls/Calls.h"
-#include "control/ModelChanges.h"
-#include "metrics/GatewayStatistics.h"
-#include "metrics/LibraryClock.h"
-#include "redirect/Redirector.h"
-#include "registrar/ExpiryRange.h"
-#include "registrar/Registrar.h"
 #include "sip/Admission.h"
+#include "sip/AnswerCounters.h"
+#include "sip/DialogHandler.h"
 #include "sip/DnsClient.h"
+#include "sip/LibraryClock.h"
 #include "sip/Libre.h"
 #include "sip/Listeners.h"
+#include "sip/MethodTable.h"
 #include "sip/RequestLog.h"
 #include "sip/SecureTransports.h"
+#include "sip/SourceFilter.h"
 #include "sip/SourceRateLimit.h"
-#include "trunks/TrunkRegistrations.h"
 
 class SipFrontEnd {
  public:
-  SipFrontEnd(ScriptSession& session, LibraryClock& clock)
-      : m_session(session),
-        m_clock(clock),
-        m_registrar(clock),
-        m_admission(m_listeners, m_redirector.sources()) {}
+  // redirectSources: the sources the redirect server answers, which
+  // Admission needs too (see there); they outlive the front-end.
+  SipFrontEnd(ScriptSession& session, LibraryClock& clock, SourceFilter const& redirectSources)
+      : m_session(session), m_clock(clock), m_admission(m_listeners, redirectSources) {}
   ~SipFrontEnd();
   SipFrontEnd(SipFrontEnd const&) = delete;
   SipFrontEnd& operator=(SipFrontEnd const&) = delete;
@@ -49,16 +50,13 @@ class SipFrontEnd {
     std::vector<std::string> listen;
     // "ADDR:PORT" each; empty for the system's (see DnsClient).
     std::vector<std::string> dnsServers;
-    // The registrar's lifetimes for faces that give none.
-    ExpiryRange expiry;
-    // OPTIONS to NATed UDP bindings every so many seconds (NatPinger); 0
-    // for none.
-    uint32_t natPingSeconds = 0;
   };
 
-  // False with an error text when a DNS server, a listen address or the
-  // stack is refused.
+  // Opens the stack, its listeners and its listener. False with an error
+  // text when a DNS server, a listen address or the stack is refused.
   bool start(Settings const& settings, std::string& error);
+  // After start().
+  sip& stack() { return *m_stack; }
   // What start() opened: "udp:ADDR:PORT tcp:ADDR:PORT ...".
   std::string listening() const { return m_listeners.describe(); }
   std::vector<std::string> const& dnsServers() const { return m_dns.servers(); }
@@ -69,45 +67,40 @@ class SipFrontEnd {
                    std::string& error) {
     return m_secure.add(*m_stack, options, bound, error);
   }
-  // Unregisters the trunks and lets the stack finish, at most kShutDownMs.
+  // Stops taking requests and lets the stack finish what it sends (the
+  // trunks' unregistrations), at most kShutDownMs.
   void shutDown();
+  // Stops taking requests and ends every transaction at once. Forced: a
+  // registrar that never answered an unregistration must not keep a
+  // registration alive that points at a trunk about to die. Idempotent;
+  // the destructor calls it too.
+  void close();
 
-  unsigned long requests() const { return m_log.requests(); }
-  Registrar& registrar() { return m_registrar; }
-  Redirector& redirector() { return m_redirector; }
-  // --ca-file: what a TLS trunk's carrier is verified against; before start().
-  void trustForTrunks(std::string const& caFile) { m_caFile = caFile; }
+  // Filled before start(); see RequestHandler for the handlers' lifetime.
+  MethodTable& methods() { return m_methods; }
+  // The part that keeps dialogs (see DialogHandler); before start(). Its
+  // session layer listens on the stack after start(), behind the
+  // front-end's listener.
+  void keepDialogs(DialogHandler& dialogs) { m_dialogs = &dialogs; }
+  // Whether a URI names the gateway itself (see Listeners::names).
+  Listeners const& listeners() const { return m_listeners; }
+  RequestLog& log() { return m_log; }
   // --source-rate: more than perSecond requests a second from one address
   // are refused (SourceRateLimit); off unless called.
   void limitSourceRate(uint32_t perSecond) { m_rateLimit = std::make_unique<SourceRateLimit>(perSecond); }
 
-  // Makes the gateway ready for changes while it serves (--control): from
-  // then on it observes every identity, which a gateway never changed
-  // need not pay for. Around each change (a control line), beginChange()
-  // and endChange(): the registrar drops the bindings of identities it
-  // removed, the trunks follow.
-  void followChanges();
-  void beginChange();
-  void endChange();
-  GatewayStatistics statistics() const;
-  Registrar const& registrar() const { return m_registrar; }
+  unsigned long requests() const { return m_log.requests(); }
+  AnswerCounters const& answers() const { return m_log.answers(); }
 
   static constexpr uint64_t kShutDownMs = 2000;
 
-  // Answers a request by the part it is for (see above), once onRequest has
-  // let it through (not an ACK, within the rate limit). Given the parts
-  // rather than a front-end, so that the request path can be driven
-  // without transports, as the message fuzzer drives it.
-  static void route(Exchange& exchange,
-                    Admission const& admission,
-                    Registrar& registrar,
-                    Redirector& redirector,
-                    Calls* calls = nullptr);
-  // --calls relay: INVITE goes to Calls instead of the Redirector; before start().
-  void relayCalls(uint32_t maxCalls) {
-    m_calls = std::make_unique<Calls>(m_registrar, m_listeners, m_log);
-    m_calls->limit(maxCalls);
-  }
+  // Answers a request once onRequest has let it through (not an ACK,
+  // within the rate limit), in this order: 416 for a sips URI over a plain
+  // transport, Admission's answers, then the handler methods has for the
+  // method, else 481 for CANCEL (nothing was pending to cancel) and 405
+  // with Allow for the rest. Given the parts rather than a front-end, so that the request
+  // path can be driven without transports, as the message fuzzer drives it.
+  static void route(Exchange& exchange, Admission const& admission, MethodTable const& methods);
 
  private:
   static bool onRequest(sip_msg const* request, void* frontEnd);
@@ -121,18 +114,15 @@ class SipFrontEnd {
   ScriptSession& m_session;
   LibraryClock& m_clock;
   RequestLog m_log;
-  Registrar m_registrar;
-  Redirector m_redirector;
   DnsClient m_dns;
   Listeners m_listeners;
   Admission m_admission;
+  MethodTable m_methods;
   SecureTransports m_secure;
   sip* m_stack = nullptr;
   sip_lsnr* m_listener = nullptr;
-  std::unique_ptr<TrunkRegistrations> m_trunks;
-  std::unique_ptr<ModelChanges> m_changes;
+  bool m_closed = false;
   std::vector<void*> m_enlarged;  // the UDP sockets enlarge() has seen
   std::unique_ptr<SourceRateLimit> m_rateLimit;
-  std::unique_ptr<Calls> m_calls;
-  std::string m_caFile;
+  DialogHandler* m_dialogs = nullptr;
 };

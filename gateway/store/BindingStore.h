@@ -15,7 +15,7 @@
 //   connection-oriented transport with an outbound flow) is not stored by
 //   the registrar: the connection dies with the process.
 //
-// Owned by main; close() before the registrar is destroyed, so that the
+// Owned by the Gateway; close() before the registrar is destroyed, so that the
 // removals the registrar makes while shutting down never reach the store.
 // Every member is called on the event loop's thread.
 #pragma once

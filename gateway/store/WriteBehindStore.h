@@ -40,7 +40,7 @@
 // - close() writes everything queued before it returns (SIGTERM); a store
 //   still away then loses the queue, and the log says how many.
 //
-// Owned by main through BindingStore; the backend is owned here.
+// Owned by the Gateway through BindingStore; the backend is owned here.
 #pragma once
 
 #include <atomic>

@@ -41,7 +41,7 @@
 //
 // stop() unregisters: it drops every sipreg, which sends its REGISTER with
 // expiry 0 and lives on inside libre until answered; the caller then lets the
-// stack run for a bounded time. Owned by the front-end; everything runs on
+// stack run for a bounded time. Owned by the Gateway; everything runs on
 // libre's thread.
 #pragma once
 
@@ -53,7 +53,7 @@
 #include "LS_IRegistrationOutbound.h"
 #include "RefPtr.h"
 #include "ScriptSession.h"
-#include "metrics/LibraryClock.h"
+#include "sip/LibraryClock.h"
 #include "sip/Libre.h"
 #include "trunks/TrunkKeepAlive.h"
 #include "trunks/TrunkTls.h"

@@ -1,4 +1,4 @@
-#include "redirect/SourceFilter.h"
+#include "sip/SourceFilter.h"
 
 #include <netinet/in.h>
 #include <sys/socket.h>

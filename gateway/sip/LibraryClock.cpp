@@ -1,4 +1,4 @@
-#include "metrics/LibraryClock.h"
+#include "sip/LibraryClock.h"
 
 #include <time.h>
 

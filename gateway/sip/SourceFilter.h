@@ -1,8 +1,8 @@
-// SourceFilter: the networks (CIDR, IPv4 or IPv6) whose requests the
-// redirect server answers, from --redirect-from. A redirect tells where a
-// subscriber is registered, so an operator can keep that answer to the
-// proxies and SBCs that need it. No network given: every source is let in,
-// as before the option existed.
+// SourceFilter: a set of networks (CIDR, IPv4 or IPv6) that a request's
+// source address is matched against. Empty, it admits every source, so that
+// an option that fills it (--redirect-from, for the redirect server and for
+// what Admission tells about subscribers) changes nothing until it is given.
+// What a filtered source is refused is its user's to decide.
 //
 // A mapped IPv4 address (::ffff:a.b.c.d) is matched as the IPv4 address it
 // is, so that a dual-stack socket does not let anyone through or keep

@@ -18,7 +18,8 @@
 // - Restoring happens before the front-end listens, so the first request
 //   already sees every binding.
 //
-// Owned by main beside the store and the front-end; everything on the loop.
+// Owned by the Gateway beside the store and the registrar; everything on the
+// loop.
 #pragma once
 
 #include <map>
@@ -28,8 +29,8 @@
 #include "LS_IIdentity.h"
 #include "RefPtr.h"
 #include "ScriptSession.h"
-#include "metrics/LibraryClock.h"
 #include "registrar/Registrar.h"
+#include "sip/LibraryClock.h"
 #include "store/BindingStore.h"
 
 class BindingReplay {

@@ -1,4 +1,4 @@
-#include "store/BindingReplay.h"
+#include "registrar/BindingReplay.h"
 
 #include <algorithm>
 #include <chrono>

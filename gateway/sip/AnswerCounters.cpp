@@ -1,4 +1,4 @@
-#include "metrics/AnswerCounters.h"
+#include "sip/AnswerCounters.h"
 
 namespace {
 

@@ -1,4 +1,4 @@
-#include "redirect/SourceFilter.h"
+#include "sip/SourceFilter.h"
 
 #include <gtest/gtest.h>
 
