@@ -32,7 +32,9 @@ struct GatewayStatistics {
   int64_t registeredContacts = 0;
   std::vector<Trunk> trunks;
   // Relayed calls (--calls relay): in progress now, answered since the
-  // start, and failed by the final code the caller got. Their set-up
+  // start, and failed by the final code the caller got, once the gateway
+  // had placed them (a call refused before any branch, 480 or 403, shows
+  // in answers only). Their set-up
   // times (INVITE to the 2xx sent back) as a histogram: callSetUpBuckets[i]
   // counts the calls within callSetUpBoundsSeconds[i] and above the bound
   // before; the last counts the rest.

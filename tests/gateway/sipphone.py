@@ -251,6 +251,21 @@ def authorization(challenge, method, uri, user, password, nc=1, cnonce="0a4f113b
             % (user, realm, nonce, uri, algorithm, count, cnonce, response))
 
 
+def ask_control(path, line):
+    """What the gateway's control socket at path prints for one line."""
+    client = socket.socket(socket.AF_UNIX, socket.SOCK_STREAM)
+    client.settimeout(ANSWER_LIMIT_S)
+    client.connect(path)
+    client.sendall(line.encode() + b"\n")
+    data = b""
+    while not (data.endswith(b"\0ok\n") or data.endswith(b"\0failed\n")):
+        chunk = client.recv(65536)
+        check(chunk, "the control socket closed before answering %r" % line)
+        data += chunk
+    client.close()
+    return data[:data.rindex(b"\0")].decode(errors="replace")
+
+
 def run(cases, program, work, emulator):
     """Runs each case (name, function) in order; prints and returns an exit status."""
     os.makedirs(work, exist_ok=True)

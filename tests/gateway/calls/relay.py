@@ -12,10 +12,11 @@ import socket
 import subprocess
 import sys
 import time
+import urllib.request
 
 HERE = os.path.dirname(os.path.abspath(__file__))
 sys.path.insert(0, os.path.join(HERE, ".."))
-from sipphone import Gateway, check, run  # noqa: E402
+from sipphone import Gateway, ask_control, check, run  # noqa: E402
 
 SCRIPT = os.path.join(HERE, "calls.script")
 SIPP = os.environ.get("SIPP", "sipp")
@@ -174,8 +175,11 @@ def refused_calls(program, work, emulator):
                      "identity example.com loop face registration-inbound create\n"
                      "face example.com loop registration-inbound contact add <sip:loop@127.0.0.1:%d> \"\" \"\" 0\n"
                      % port)
+    control = os.path.join(work, "refused.sock")
+    metrics = free_port()
     gateway = Gateway(program, emulator, work, "refused", [SCRIPT, script],
-                      ["--calls", "relay", "--max-calls", "1", "--listen", "127.0.0.1:%d" % port])
+                      ["--calls", "relay", "--max-calls", "1", "--listen", "127.0.0.1:%d" % port,
+                       "--control", control, "--metrics", "127.0.0.1:%d" % metrics])
     try:
         busy = phone(work, "u3", "busy", register(work, gateway, "u3"))
         status, _, _ = final_answer(gateway, "u3")
@@ -196,8 +200,21 @@ def refused_calls(program, work, emulator):
             time.sleep(0.2)
         status, answer, _ = final_answer(gateway, "u6")
         check(status == 503 and "Retry-After: " in answer, "beyond --max-calls: %d" % status)
+        listed = ask_control(control, "calls")
+        check("<sip:caller@outside.example> -> sip:u3@" in listed or "caller@outside.example -> sip:u3@" in listed,
+              "the call in progress: %r" % listed)
+        check(" early" in listed, "the ringing call's state: %r" % listed)
         finished(first, "first caller")
         finished(ringing, "ringing phone")
+        deadline = time.monotonic() + 10
+        while ask_control(control, "calls") != "no calls\n" and time.monotonic() < deadline:
+            time.sleep(0.2)
+        check(ask_control(control, "calls") == "no calls\n", "a call left over")
+        exposition = urllib.request.urlopen("http://127.0.0.1:%d/metrics" % metrics, timeout=10).read().decode()
+        for sample in ('location_gateway_calls_active 0', 'location_gateway_calls_failed_total{code="486"} 1',
+                       'location_gateway_calls_failed_total{code="487"} 1',
+                       'location_gateway_call_setup_seconds_count 0'):
+            check(sample + "\n" in exposition, "metrics lack %r" % sample)
         gateway.stop()
     finally:
         gateway.kill()
