@@ -2,6 +2,7 @@
 
 #include <algorithm>
 
+#include "LS_ICall.h"
 #include "registrar/InboundFilter.h"
 #include "sip/Exchange.h"
 #include "sip/MonotonicClock.h"
@@ -13,6 +14,22 @@ constexpr int kSessionBuckets = 1024;
 
 std::string textOf(pl const& value) {
   return std::string(value.p ? value.p : "", value.l);
+}
+
+// " NAME voip=V tone-set=T sip=S" for the profiles a call face of identity
+// names (the empty ones left out); nothing when it names none.
+std::string profilesOf(LS_IIdentity const& identity, LS_IdentityFace::Type kind, char const* name) {
+  RefPtr<LS_ICall> face;
+  LS_getFaceIf(&identity, kind, face);
+  if (!face)
+    return "";
+  std::string text;
+  for (auto const& profile : {std::make_pair("voip=", face->getVoipProfile()),
+                              std::make_pair("tone-set=", face->getToneSetProfile()),
+                              std::make_pair("sip=", face->getSipProfile())})
+    if (!profile.second.isEmpty())
+      text += std::string(" ") + profile.first + profile.second.str();
+  return text.empty() ? text : " " + std::string(name) + text;
 }
 
 }  // namespace
@@ -115,7 +132,11 @@ void Calls::invite(Exchange& exchange) {
   targets.erase(loops, targets.end());
   if (mbuf_get_left(invite.mb) == 0)
     return exchange.answer(488, "Not Acceptable Here");
-  auto call = std::make_unique<Call>(*this, invite, exchange.result(), std::move(targets), kDefaultInviteTimeoutMs);
+  std::string const result =
+      exchange.result() + exchange.clock().measure([&] {
+        return profilesOf(*identity, LS_IdentityFace::CALL_INBOUND, "inbound-profiles");
+      });
+  auto call = std::make_unique<Call>(*this, invite, result, std::move(targets), kDefaultInviteTimeoutMs);
   Call& started = *call;
   m_calls.emplace(textOf(invite.callid), std::move(call));
   ++m_statistics.active;

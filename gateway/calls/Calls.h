@@ -15,7 +15,12 @@
 // - --max-calls N: beyond N calls in progress, 503 with Retry-After, as a
 //   proxy that is full says so (RFC 3261 section 21.5.4); 0 is no limit.
 // - The request log gets the INVITE's line when its final answer leaves,
-//   with that answer's code, whatever part of the call decided it.
+//   with that answer's code, whatever part of the call decided it. Its
+//   result names the called identity, then the profiles its inbound call
+//   face names, as " inbound-profiles voip=V tone-set=T sip=S" (those set
+//   only, nothing when none is): the profiles are the call handling's
+//   business beyond this gateway, and the line is where an operator sees
+//   which applied.
 // - In-dialog requests that libre's session layer takes (ACK, BYE, INFO,
 //   REFER) are left to it; re-INVITE and UPDATE of a call are relayed here.
 //
