@@ -56,10 +56,24 @@ def register(work, gateway, user, q="1"):
     return port
 
 
+def bound(port):
+    """Whether some process holds the UDP port on loopback."""
+    probe = socket.socket(socket.AF_INET, socket.SOCK_DGRAM)
+    try:
+        probe.bind(("127.0.0.1", port))
+        return False
+    except OSError:
+        return True
+    finally:
+        probe.close()
+
+
 def phone(work, user, scenario, port, arguments=()):
     process = sipp(work, scenario, port, arguments)
-    # SIPp answers once it has bound its port.
-    time.sleep(0.5)
+    # A call to the phone before SIPp holds its port would fail at once.
+    deadline = time.monotonic() + PHONE_LIMIT_S / 2
+    while not bound(port) and process.poll() is None and time.monotonic() < deadline:
+        time.sleep(0.05)
     return process
 
 
