@@ -1,8 +1,10 @@
 // Authenticator: whether a REGISTER may change the bindings of the identity
-// its To names, answering 401 or 403 itself when not. The library says which
-// realms an identity is challenged in and which passwords answer them; the
-// digest arithmetic is DigestAuthentication's, the nonces NonceGenerator's
-// and NonceTable's. Nothing here touches a binding.
+// its To names, answering 401 or 403 itself when not, and the same for a
+// call from the identity its From names, as a proxy answers (407). The
+// library says which realms an identity is challenged in and which
+// passwords answer them; the digest arithmetic is DigestAuthentication's,
+// the nonces NonceGenerator's and NonceTable's. Nothing here touches a
+// binding or a call.
 //
 // Decisions, with their reasons:
 // - Credentials the library takes for the realm they name (HTTP digest) are
@@ -77,6 +79,8 @@
 
 #include "CNameAddr.h"
 #include "LS_IIdentity.h"
+#include "LS_ILocationService.h"
+#include "RefPtr.h"
 #include "String.h"
 #include "Vector.h"
 #include "metrics/LibraryClock.h"
@@ -113,20 +117,26 @@ class Authenticator {
 
   // True, after answering 403, when the request's source is held.
   bool refuseHeldSource(Exchange& exchange);
+  // Who asks for the credentials (RFC 3261 sections 22.2 and 22.3): the
+  // registrar answers 401 with WWW-Authenticate and reads Authorization,
+  // a proxy (the gateway placing a call) 407 with Proxy-Authenticate and
+  // Proxy-Authorization. Nothing else differs, but that only a registration
+  // is followed for the SHA-256 warning.
+  enum class Challenger { REGISTRAR, PROXY };
   // What admit() makes of a request. REPEATED: credentials already used by
   // this very request, from the same source, moments ago; the registrar
   // answers it as the retransmission it is and applies nothing.
   enum class Admission { REFUSED, ACCEPTED, REPEATED };
-  // Whether identity, which to denotes, may register with this request;
-  // REFUSED after answering it.
-  Admission admit(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to);
-  // Answers a REGISTER whose To (to, parsed) denotes no identity.
-  void refuseUnknown(Exchange& exchange, CNameAddr const& to);
+  // Whether identity, which named (the To of a REGISTER, the From of a
+  // call) denotes, may act with this request; REFUSED after answering it.
+  Admission admit(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& named, Challenger challenger);
+  // Answers a request whose named (parsed) denotes no identity.
+  void refuseUnknown(Exchange& exchange, CNameAddr const& named, Challenger challenger);
 
  private:
   // The passwords that answer the realm for the user.
   using Passwords = std::function<Vector<String>(String const& realm, String const& user)>;
-  // What the request's Authorization headers come to.
+  // What the request's credentials headers come to.
   struct Outcome {
     bool accepted = false;
     bool repeated = false;          // accepted as a retransmission
@@ -135,16 +145,33 @@ class Authenticator {
     pl user{};                      // whose it was
   };
 
-  // The first Authorization header with an authentic nonce for one of the
-  // realms (for any realm when realms is null) checked, and its nonce used
-  // when it passes. Answers nothing, logs nothing: a request may be
-  // evaluated again with the realms after failing without them.
+  // The first credentials header (the challenger's: Authorization or
+  // Proxy-Authorization) with an authentic nonce for one of the realms
+  // (for any realm when realms is null) checked, and its nonce used when it
+  // passes. Answers nothing, logs nothing: a request may be evaluated again
+  // with the realms after failing without them.
   Outcome evaluate(sip_msg const& message,
+                   Challenger challenger,
                    std::vector<std::string> const* realms,
                    Passwords const& passwordsOf);
-  // The evaluation against realms, answering 401 or 403 when it does not pass.
-  Admission check(Exchange& exchange, std::vector<std::string> const& realms, Passwords const& passwords);
-  void challenge(Exchange& exchange, std::vector<std::string> const& realms, bool stale);
+  // The evaluation against realms, answering the challenge or 403 when it
+  // does not pass.
+  Admission check(Exchange& exchange,
+                  Challenger challenger,
+                  std::vector<std::string> const& realms,
+                  Passwords const& passwords);
+  void challenge(Exchange& exchange,
+                 Challenger challenger,
+                 std::vector<std::string> const& realms,
+                 bool stale);
+  // The location service serving the host named (set from it); null when
+  // none does.
+  RefPtr<LS_ILocationService> serviceOf(Exchange& exchange, CNameAddr const& named, CHostPort& host);
+  // The challenge for a user of service that no identity answers.
+  void challengeUnknown(Exchange& exchange,
+                        LS_ILocationService const& service,
+                        CHostPort const& host,
+                        Challenger challenger);
   // Notes whether the request answers its registration's last challenge,
   // and warns when it starts over instead.
   void followChallenges(Exchange& exchange);
