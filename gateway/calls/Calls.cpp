@@ -71,6 +71,9 @@ void Calls::handle(Exchange& exchange) {
   if (m_maxCalls != 0 && m_statistics.active >= m_maxCalls)
     return exchange.answer(503, "Service Unavailable",
                            "Retry-After: " + std::to_string(kRetryAfterSeconds) + "\r\n");
+  RefPtr<LS_IIdentity> caller;
+  if (!m_registrar.authenticator().admitCaller(exchange, caller))
+    return;
   CNameAddr target;
   RefPtr<LS_IIdentity> const identity = exchange.resolveOrAnswer(invite.ruri, target);
   if (!identity)
@@ -85,7 +88,8 @@ void Calls::handle(Exchange& exchange) {
   targets.erase(loops, targets.end());
   if (mbuf_get_left(invite.mb) == 0)
     return exchange.answer(488, "Not Acceptable Here");
-  auto call = std::make_unique<Call>(*this, invite, exchange.result(), std::move(targets), kDefaultInviteTimeoutMs);
+  auto call = std::make_unique<Call>(*this, invite, exchange.result(), std::move(caller), std::move(targets),
+                                     kDefaultInviteTimeoutMs);
   Call& started = *call;
   m_calls.emplace(textOf(invite.callid), std::move(call));
   ++m_statistics.active;

@@ -19,6 +19,8 @@ namespace {
 // passed to the library: more is an attack, not a phone.
 constexpr unsigned int kMaximumAuthorizations = 8;
 constexpr size_t kMaximumUserName = 256;
+// A longer From is refused rather than cut, as a longer Request-URI is.
+constexpr size_t kMaximumUri = 1024;
 
 template <class Visit>
 void forEachHeader(sip_msg const& message, sip_hdrid id, Visit visit) {
@@ -216,6 +218,32 @@ void Authenticator::challengeUnknown(Exchange& exchange,
   std::vector<std::string> const realms =
       known != m_realmsByService.end() ? known->second : std::vector<std::string>{host.GetHost().c_str()};
   check(exchange, challenger, realms, [](String const&, String const&) { return Vector<String>(); });
+}
+
+bool Authenticator::admitCaller(Exchange& exchange, RefPtr<LS_IIdentity>& caller) {
+  caller = nullptr;
+  if (refuseHeldSource(exchange))
+    return false;
+  pl const& from = exchange.request().from.auri;
+  CNameAddr named;
+  if (from.l > kMaximumUri || !named.Parse(from.p, from.l)) {
+    exchange.answer(400, "Bad From");
+    return false;
+  }
+  CHostPort host;
+  RefPtr<LS_ILocationService> const service = serviceOf(exchange, named, host);
+  if (!service)
+    return true;
+  String error;
+  RefPtr<LS_IIdentity> identity = m_clock.measure([&] { return exchange.session().resolve(error, named); });
+  if (!identity) {
+    challengeUnknown(exchange, *service, host, Challenger::PROXY);
+    return false;
+  }
+  if (admit(exchange, identity.get(), named, Challenger::PROXY) == Admission::REFUSED)
+    return false;
+  caller = std::move(identity);
+  return true;
 }
 
 Authenticator::Outcome Authenticator::evaluate(sip_msg const& message,

@@ -68,8 +68,36 @@
 //   is bound to it, so a forged UDP source with a nonce obtained elsewhere
 //   gets a challenge, and cannot set off the hold of the address it forges
 //   (a site's NAT address, and with it every phone behind).
+// - A call (admitCaller) is from a subscriber when its From names a user of
+//   a domain a location service serves, found as for a REGISTER's
+//   Request-URI; only such a caller is challenged, as a proxy challenges,
+//   under every rule above but the SHA-256 warning, which follows
+//   registrations only. Any other caller (a carrier, an outside phone) is
+//   not: it may call subscribers only, which Calls sees to. A location
+//   service marked as the default domain serves every host: with one,
+//   every caller, a carrier's included, is taken for a subscriber.
+// - An identity the library does not challenge calls without credentials
+//   when it could register without them (it or its group has an
+//   inbound-registration face): whoever may register as it gets its calls
+//   already, and calling in its name gives them no more. Any other gets
+//   403: a trunk that only registers upstream would otherwise lend its
+//   name, and the way out its outbound call face gives, to anyone.
+// - An INVITE admitted as REPEATED (the same one again from its source,
+//   moments after) is admitted as the first was, and answered as it was:
+//   one that set up a call never gets here (Calls, or libre's transaction
+//   once the call is over, takes it first), so this is one answered
+//   statelessly before any call (480, 482, 488) whose answer was lost, and
+//   a fresh challenge would turn a lost answer into another round trip.
+// - A source held for its failures gets 403 for every INVITE, before any
+//   lookup, as for every REGISTER: the hold spares the gateway a guesser's
+//   lookups, and telling its calls apart by the From they name would take
+//   the lookup the hold spares.
+// - A From the library cannot read (or longer than 1 KiB) gets 400: it
+//   cannot be told a subscriber or not, and the callee's phone, which sees
+//   it, might read a subscriber in it.
 //
-// Owned by the Registrar; everything runs on libre's thread.
+// Owned by the Registrar, shared with Calls (one nonce table, one failure
+// count, one hold); everything runs on libre's thread.
 #pragma once
 
 #include <functional>
@@ -132,6 +160,10 @@ class Authenticator {
   Admission admit(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& named, Challenger challenger);
   // Answers a request whose named (parsed) denotes no identity.
   void refuseUnknown(Exchange& exchange, CNameAddr const& named, Challenger challenger);
+  // Whether the INVITE's caller may call, answering it when not. caller:
+  // the identity its From denotes once authenticated, null for an outside
+  // caller.
+  bool admitCaller(Exchange& exchange, RefPtr<LS_IIdentity>& caller);
 
  private:
   // The passwords that answer the realm for the user.
