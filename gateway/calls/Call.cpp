@@ -2,6 +2,7 @@
 
 #include <algorithm>
 
+#include "ScriptSession.h"
 #include "calls/Calls.h"
 #include "registrar/NatTraversal.h"
 #include "sip/MonotonicClock.h"
@@ -33,11 +34,13 @@ void destroyPendingInfo(void* data) {
 Call::Call(Calls& calls,
            sip_msg const& invite,
            std::string result,
+           RefPtr<LS_IIdentity> caller,
            std::vector<Registrar::CallTarget> targets,
            uint32_t inviteTimeoutMs)
     : m_calls(calls),
       m_invite(static_cast<sip_msg const*>(mem_ref(const_cast<sip_msg*>(&invite)))),
       m_result(std::move(result)),
+      m_callerIdentity(std::move(caller)),
       m_targets(std::move(targets)),
       m_inviteTimeoutMs(inviteTimeoutMs),
       m_startedMs(MonotonicClock::nowMs()) {}
@@ -362,8 +365,10 @@ void Call::onInfoAnswered(int error, sip_msg const* message, void* argument) {
 
 std::string Call::describe() const {
   static char const* const kStates[] = {"trying", "early", "answered", "established", "ended"};
-  std::string text = textOf(m_invite->from.auri) + " -> " + textOf(m_invite->ruri) + " " +
-                     kStates[static_cast<int>(m_state)];
+  std::string text = textOf(m_invite->from.auri);
+  if (m_callerIdentity)
+    text += " (" + ScriptSession::pathOf(m_callerIdentity.get()) + ")";
+  text += " -> " + textOf(m_invite->ruri) + " " + kStates[static_cast<int>(m_state)];
   if (m_winner)
     text += " at " + m_winner->target.uri;
   return text;

@@ -48,6 +48,8 @@
 #include <string>
 #include <vector>
 
+#include "LS_IIdentity.h"
+#include "RefPtr.h"
 #include "registrar/Registrar.h"
 #include "sip/Libre.h"
 
@@ -57,11 +59,13 @@ class Call {
  public:
   enum class State { TRYING, EARLY, ANSWERED, ESTABLISHED, ENDED };
 
-  // invite stays referenced while the call needs it. targets: in the order
-  // they ring, highest q first.
+  // invite stays referenced while the call needs it. caller: the identity
+  // the caller authenticated as, null for an outside caller. targets: in
+  // the order they ring, highest q first.
   Call(Calls& calls,
        sip_msg const& invite,
        std::string result,
+       RefPtr<LS_IIdentity> caller,
        std::vector<Registrar::CallTarget> targets,
        uint32_t inviteTimeoutMs);
   ~Call();
@@ -87,6 +91,7 @@ class Call {
 
   State state() const { return m_state; }
   sip_msg const& invite() const { return *m_invite; }
+  LS_IIdentity* caller() const { return m_callerIdentity.get(); }
   // What the control socket shows of the call.
   std::string describe() const;
   uint64_t startedMs() const { return m_startedMs; }
@@ -135,6 +140,7 @@ class Call {
   Calls& m_calls;
   sip_msg const* m_invite;
   std::string m_result;
+  RefPtr<LS_IIdentity> m_callerIdentity;
   std::vector<Registrar::CallTarget> m_targets;
   size_t m_next = 0;  // the first target not yet rung
   uint32_t m_inviteTimeoutMs;

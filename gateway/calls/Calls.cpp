@@ -118,6 +118,9 @@ void Calls::invite(Exchange& exchange) {
   if (m_maxCalls != 0 && m_statistics.active >= m_maxCalls)
     return exchange.answer(503, "Service Unavailable",
                            "Retry-After: " + std::to_string(kRetryAfterSeconds) + "\r\n");
+  RefPtr<LS_IIdentity> caller;
+  if (!m_registrar.authenticator().admitCaller(exchange, caller))
+    return;
   CNameAddr target;
   RefPtr<LS_IIdentity> const identity = exchange.resolveOrAnswer(invite.ruri, target);
   if (!identity || InboundFilter::refuses(exchange, *identity, LS_IdentityFace::CALL_INBOUND))
@@ -132,11 +135,12 @@ void Calls::invite(Exchange& exchange) {
   targets.erase(loops, targets.end());
   if (mbuf_get_left(invite.mb) == 0)
     return exchange.answer(488, "Not Acceptable Here");
-  std::string const result =
-      exchange.result() + exchange.clock().measure([&] {
-        return profilesOf(*identity, LS_IdentityFace::CALL_INBOUND, "inbound-profiles");
-      });
-  auto call = std::make_unique<Call>(*this, invite, result, std::move(targets), kDefaultInviteTimeoutMs);
+  std::string const result = exchange.result() + exchange.clock().measure([&] {
+    return profilesOf(*identity, LS_IdentityFace::CALL_INBOUND, "inbound-profiles") +
+           (caller ? profilesOf(*caller, LS_IdentityFace::CALL_OUTBOUND, "outbound-profiles") : std::string());
+  });
+  auto call =
+      std::make_unique<Call>(*this, invite, result, std::move(caller), std::move(targets), kDefaultInviteTimeoutMs);
   Call& started = *call;
   m_calls.emplace(textOf(invite.callid), std::move(call));
   ++m_statistics.active;

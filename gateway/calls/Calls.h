@@ -14,6 +14,12 @@
 //   skipped, as 482 Loop Detected.
 // - --max-calls N: beyond N calls in progress, 503 with Retry-After, as a
 //   proxy that is full says so (RFC 3261 section 21.5.4); 0 is no limit.
+// - A caller whose From names a subscriber authenticates first (407), with
+//   the Authenticator and the nonces, failure counts and hold the
+//   Registrar has: Authenticator::admitCaller says who and why. The call
+//   keeps the identity it authenticated as. A 407 leaves statelessly, and
+//   its ACK goes to libre's session layer as every ACK does, which drops
+//   one that matches no session without answering it.
 // - The request log gets the INVITE's line when its final answer leaves,
 //   with that answer's code, whatever part of the call decided it. Its
 //   result names the called identity, then the profiles its inbound call

@@ -73,12 +73,13 @@ void Registrar::handle(Exchange& exchange) {
   RefPtr<LS_IIdentity> const resolved = exchange.resolveOrAnswer(exchange.request().to.auri, to, false);
   if (!resolved) {
     if (!exchange.answered())
-      m_authenticator.refuseUnknown(exchange, to);
+      m_authenticator.refuseUnknown(exchange, to, Authenticator::Challenger::REGISTRAR);
     return;
   }
   if (InboundFilter::refuses(exchange, *resolved, LS_IdentityFace::REGISTRATION_INBOUND))
     return;
-  Authenticator::Admission const admission = m_authenticator.admit(exchange, resolved.get(), to);
+  Authenticator::Admission const admission =
+      m_authenticator.admit(exchange, resolved.get(), to, Authenticator::Challenger::REGISTRAR);
   if (admission == Authenticator::Admission::REFUSED)
     return;
   bool created = false;

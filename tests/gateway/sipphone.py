@@ -107,10 +107,10 @@ class Response:
     def all(self, name):
         return [value for key, value in self.headers if key == name.lower()]
 
-    def challenges(self):
-        """(realm, nonce, algorithm, stale) of each WWW-Authenticate, in order."""
+    def challenges(self, header="WWW-Authenticate"):
+        """(realm, nonce, algorithm, stale) of each challenge header, in order."""
         found = []
-        for value in self.all("WWW-Authenticate"):
+        for value in self.all(header):
             params = dict(re.findall(r'(\w+)="?([^",]*)"?', value))
             found.append((params["realm"], params["nonce"], params.get("algorithm", "MD5"),
                           params.get("stale") == "true"))
