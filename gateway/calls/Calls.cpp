@@ -3,6 +3,7 @@
 #include <algorithm>
 
 #include "LS_ICall.h"
+#include "LS_IOutbound.h"
 #include "registrar/InboundFilter.h"
 #include "sip/Exchange.h"
 #include "sip/MonotonicClock.h"
@@ -139,13 +140,23 @@ void Calls::invite(Exchange& exchange) {
     return profilesOf(*identity, LS_IdentityFace::CALL_INBOUND, "inbound-profiles") +
            (caller ? profilesOf(*caller, LS_IdentityFace::CALL_OUTBOUND, "outbound-profiles") : std::string());
   });
-  auto call =
-      std::make_unique<Call>(*this, invite, result, std::move(caller), std::move(targets), kDefaultInviteTimeoutMs);
+  uint32_t const timeoutMs = exchange.clock().measure([&] { return inviteTimeoutMs(caller.get()); });
+  auto call = std::make_unique<Call>(*this, invite, result, std::move(caller), std::move(targets), timeoutMs);
   Call& started = *call;
   m_calls.emplace(textOf(invite.callid), std::move(call));
   ++m_statistics.active;
   exchange.handOver();
   started.start();
+}
+
+uint32_t Calls::inviteTimeoutMs(LS_IIdentity const* caller) {
+  RefPtr<LS_IOutbound> face;
+  if (caller)
+    LS_getFaceIf(caller, LS_IdentityFace::CALL_OUTBOUND, face);
+  unsigned int const seconds = face ? face->getInviteTransactionTimeout() : 0;
+  if (seconds == 0)
+    return kDefaultInviteTimeoutMs;
+  return std::min(seconds, kMaximumInviteTimeoutSeconds) * 1000;
 }
 
 std::vector<Registrar::CallTarget> Calls::targetsOf(LS_IIdentity* identity) const {

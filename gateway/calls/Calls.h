@@ -52,8 +52,12 @@ class Exchange;
 
 class Calls final : public RequestHandler, public DialogHandler {
  public:
-  // How long a branch may take to answer finally, when no face says.
+  // How long a branch may take to answer finally: the caller's outbound
+  // call face's INVITE transaction timeout, in seconds (the call is the
+  // caller's, each branch an attempt of it), up to a day; 32 s for a
+  // caller from outside, or when the face says 0.
   static constexpr uint32_t kDefaultInviteTimeoutMs = 32 * 1000;
+  static constexpr unsigned int kMaximumInviteTimeoutSeconds = 24 * 60 * 60;
   static constexpr uint32_t kRetryAfterSeconds = 5;
 
   Calls(Registrar& registrar, Listeners const& listeners, RequestLog& log);
@@ -110,6 +114,7 @@ class Calls final : public RequestHandler, public DialogHandler {
   // call here, and relayed (Call::relayInDialog).
   bool relayedInDialog(sip_msg const& request);
   std::vector<Registrar::CallTarget> targetsOf(LS_IIdentity* identity) const;
+  static uint32_t inviteTimeoutMs(LS_IIdentity const* caller);
   bool isGateway(Registrar::CallTarget const& target) const;
   static void onReap(void* calls);
   void reapSoon();

@@ -81,7 +81,7 @@ def call(work, gateway, user, scenario="call"):
     return sipp(work, scenario, free_port(), ["-s", user, "127.0.0.1:%d" % gateway.port])
 
 
-def final_answer(gateway, user, socket_=None):
+def final_answer(gateway, user, socket_=None, caller="caller@outside.example"):
     """What a bare INVITE to user gets at last, from a socket of its own."""
     sock = socket_ or socket.socket(socket.AF_INET, socket.SOCK_DGRAM)
     if not socket_:
@@ -92,7 +92,7 @@ def final_answer(gateway, user, socket_=None):
     request = "\r\n".join([
         "INVITE sip:%s@127.0.0.1:%d SIP/2.0" % (user, gateway.port),
         "Via: SIP/2.0/UDP %s:%d;branch=z9hG4bK-%s-%d" % (address, port, user, port),
-        "From: <sip:caller@outside.example>;tag=%d" % port,
+        "From: <sip:%s>;tag=%d" % (caller, port),
         "To: <sip:%s@127.0.0.1:%d>" % (user, gateway.port),
         "Call-ID: %s-%d@outside.example" % (user, port),
         "CSeq: 1 INVITE",
@@ -147,6 +147,13 @@ def cancelled_while_ringing(program, work, emulator):
         finished(call(work, gateway, "u3", "cancel"), "caller")
         finished(callee, "callee")
         check(logged(gateway, " 487"), "no 487 in the request log")
+        # Nobody answers: the caller's face gives up after 2 s, the phone
+        # is told.
+        callee = phone(work, "u3", "ring", register(work, gateway, "u3"))
+        started = time.monotonic()
+        status, _, _ = final_answer(gateway, "u3", caller="desk@127.0.0.1")
+        check(status == 408 and time.monotonic() - started < PHONE_LIMIT_S / 2, "unanswered: %d" % status)
+        finished(callee, "unanswered callee")
         gateway.stop()
     finally:
         gateway.kill()
