@@ -10,6 +10,7 @@
 #include "LS_IdentityResolution.h"
 #include "LS_IdentityType.h"
 #include "registrar/InboundFilter.h"
+#include "registrar/FaceContacts.h"
 #include "registrar/NatTraversal.h"
 #include "registrar/SipUriComparison.h"
 #include "sip/Capabilities.h"
@@ -664,46 +665,33 @@ void Registrar::onPingsUnanswered(void const* binding, void* argument) {
 std::vector<Registrar::CallTarget> Registrar::callTargets(LS_IIdentity* identity) const {
   std::vector<CallTarget> targets;
   auto const held = m_bindings.find(identity);
-  m_clock.measure([&] {
-    RefPtr<LS_IRegistrationInbound> face;
-    LS_getFaceIf(identity, LS_IdentityFace::REGISTRATION_INBOUND, face);
-    unsigned int const count = face ? face->getNumberOfContacts() : 0;
-    for (unsigned int i = 0; i < count && i < kMaximumBindings; ++i) {
-      String callId, context, provider;
-      CNameAddr contact;
-      CHostPort received;
-      unsigned int priority = 0;
-      unsigned int expires = 0;
-      if (face->getContact(i, callId, contact, received, context, provider, priority, expires).isFailure())
-        continue;
-      CBlob text;
-      contact.Serialize(text);
-      // "<uri>" or "display <uri>": the URI holds no angle bracket.
-      std::string uri(reinterpret_cast<char const*>(text.GetData()), text.GetSize());
-      uri = uri.substr(uri.rfind('<') + 1);
-      uri.erase(uri.rfind('>'));
-      CallTarget target{uri, "", "", callId.isEmpty() ? ContactHeader::kNoQ : priority};
-      if (!callId.isEmpty() && held != m_bindings.end()) {
-        for (auto const& each : held->second.all) {
-          Binding const& binding = *each;
-          if (binding.contact != contact || binding.callId != callId.str())
-            continue;
-          target.uri = binding.uri;
-          pl uri;
-          pl_set_str(&uri, binding.uri.c_str());
-          std::string nated;
-          if (binding.transport != SIP_TRANSP_UDP ||
-              NatTraversal::natedTarget(uri, binding.source, binding.transport, nated)) {
-            char route[96];
-            re_snprintf(route, sizeof route, "sip:%J%s", &binding.source, sip_transp_param(binding.transport));
-            target.route = route;
-            target.flow = NatTraversal::flowTarget(uri, binding.source, binding.transport);
-          }
-          break;
-        }
+  for (FaceContact const& found : m_clock.measure([&] { return faceContacts(identity, kMaximumBindings); })) {
+    CBlob text;
+    found.contact.Serialize(text);
+    // "<uri>" or "display <uri>": the URI holds no angle bracket.
+    std::string uri(reinterpret_cast<char const*>(text.GetData()), text.GetSize());
+    uri = uri.substr(uri.rfind('<') + 1);
+    uri.erase(uri.rfind('>'));
+    CallTarget target{uri, "", "", found.callId.empty() ? ContactHeader::kNoQ : found.priority};
+    Binding const* binding = nullptr;
+    if (!found.callId.empty() && held != m_bindings.end())
+      for (auto const& each : held->second.all)
+        if (each->contact == found.contact && each->callId == found.callId)
+          binding = each.get();
+    if (binding) {
+      target.uri = binding->uri;
+      pl registered;
+      pl_set_str(&registered, binding->uri.c_str());
+      std::string nated;
+      if (binding->transport != SIP_TRANSP_UDP ||
+          NatTraversal::natedTarget(registered, binding->source, binding->transport, nated)) {
+        char route[96];
+        re_snprintf(route, sizeof route, "sip:%J%s", &binding->source, sip_transp_param(binding->transport));
+        target.route = route;
+        target.flow = NatTraversal::flowTarget(registered, binding->source, binding->transport);
       }
-      targets.push_back(std::move(target));
     }
-  });
+    targets.push_back(std::move(target));
+  }
   return targets;
 }
