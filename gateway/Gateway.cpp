@@ -92,7 +92,8 @@ bool Gateway::startOperations(std::string& error) {
     m_autosave = std::make_unique<Autosave>(m_session, m_settings.autosave);
   if (!m_settings.control.empty()) {
     addScriptCommands(m_commands);
-    addGatewayCommands(m_commands, m_registrar, [this] { return statistics(); }, m_calls.get());
+    addGatewayCommands(
+        m_commands, m_registrar, [this] { return statistics(); }, m_calls.get());
     m_control = std::make_unique<ControlServer>(m_session, m_commands);
     followChanges();
     m_control->onLine([this] { beginChange(); },

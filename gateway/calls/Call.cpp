@@ -137,8 +137,9 @@ void Call::failed(Branch& branch, uint16_t code, std::string const& reason) {
     return;
   if (classOf(code) == 6)
     return answerFailure();
-  bool const ringing = std::any_of(m_branches.begin(), m_branches.end(),
-                                   [](std::unique_ptr<Branch> const& each) { return each->session != nullptr; });
+  bool const ringing =
+      std::any_of(m_branches.begin(), m_branches.end(),
+                  [](std::unique_ptr<Branch> const& each) { return each->session != nullptr; });
   if (!ringing)
     startGroup();
 }
@@ -209,10 +210,11 @@ bool Call::send(Branch& branch) {
   char const* route = branch.target.route.c_str();
   mbuf* const offer = bodyOf(invite);
   int const error = sipsess_connect(
-      &branch.session, &m_calls.sessions(), branch.target.uri.c_str(), fromName.empty() ? nullptr : fromName.c_str(),
-      fromUri.c_str(), user.c_str(), branch.target.route.empty() ? nullptr : &route,
-      branch.target.route.empty() ? 0 : 1, contentType(invite).c_str(), offer, nullptr, nullptr, false, nullptr,
-      onBranchAnswer, onBranchProgress, onBranchEstablished, onBranchInfo, nullptr, onBranchClosed, &branch, nullptr);
+      &branch.session, &m_calls.sessions(), branch.target.uri.c_str(),
+      fromName.empty() ? nullptr : fromName.c_str(), fromUri.c_str(), user.c_str(),
+      branch.target.route.empty() ? nullptr : &route, branch.target.route.empty() ? 0 : 1,
+      contentType(invite).c_str(), offer, nullptr, nullptr, false, nullptr, onBranchAnswer, onBranchProgress,
+      onBranchEstablished, onBranchInfo, nullptr, onBranchClosed, &branch, nullptr);
   mem_deref(offer);
   if (error != 0) {
     branch.session = nullptr;
@@ -225,9 +227,10 @@ bool Call::send(Branch& branch) {
 bool Call::acceptCaller(uint16_t code, pl const& reason, mbuf* description) {
   std::string const text = textOf(reason);
   std::string const user = contactUser(m_invite->uri.user);
-  bool const accepted = sipsess_accept(&m_caller, &m_calls.sessions(), m_invite, code, text.c_str(), user.c_str(),
-                        contentType(*m_invite).c_str(), description, nullptr, nullptr, false, nullptr, nullptr,
-                        onCallerEstablished, onCallerInfo, nullptr, onCallerClosed, this, nullptr) == 0;
+  bool const accepted =
+      sipsess_accept(&m_caller, &m_calls.sessions(), m_invite, code, text.c_str(), user.c_str(),
+                     contentType(*m_invite).c_str(), description, nullptr, nullptr, false, nullptr, nullptr,
+                     onCallerEstablished, onCallerInfo, nullptr, onCallerClosed, this, nullptr) == 0;
   if (accepted)
     followCallerFlow();
   return accepted;
@@ -256,7 +259,8 @@ void Call::onBranchProgress(sip_msg const* message, void* argument) {
 int Call::onBranchAnswer(sip_msg const* message, void* argument) {
   Branch& branch = *static_cast<Branch*>(argument);
   if (!branch.call->m_winner)
-    branch.call->m_answer.assign(reinterpret_cast<char const*>(mbuf_buf(message->mb)), mbuf_get_left(message->mb));
+    branch.call->m_answer.assign(reinterpret_cast<char const*>(mbuf_buf(message->mb)),
+                                 mbuf_get_left(message->mb));
   return 0;
 }
 
@@ -302,7 +306,8 @@ void Call::onBranchClosed(int error, sip_msg const* message, void* argument) {
   }
   if (message && message->scode >= 300)
     return call.failed(branch, message->scode, textOf(message->reason));
-  call.failed(branch, error == ETIMEDOUT ? 408 : 503, error == ETIMEDOUT ? "Request Timeout" : "Service Unavailable");
+  call.failed(branch, error == ETIMEDOUT ? 408 : 503,
+              error == ETIMEDOUT ? "Request Timeout" : "Service Unavailable");
 }
 
 void Call::onBranchTimeout(void* argument) {
@@ -435,10 +440,11 @@ bool Call::relayInDialog(sip_msg const& request) {
   std::string const method = textOf(request.met);
   std::string const type = contentType(request);
   bool const hasBody = mbuf_get_left(request.mb) > 0;
-  int const error = sip_drequestf(
-      &m_relay, stack, true, method.c_str(), sipsess_dialog(to), 0, nullptr, onRelaySent, onRelayAnswered, this,
-      "%s%s%sContent-Length: %zu\r\n\r\n%b", hasBody ? "Content-Type: " : "", hasBody ? type.c_str() : "",
-      hasBody ? "\r\n" : "", mbuf_get_left(request.mb), mbuf_buf(request.mb), mbuf_get_left(request.mb));
+  int const error =
+      sip_drequestf(&m_relay, stack, true, method.c_str(), sipsess_dialog(to), 0, nullptr, onRelaySent,
+                    onRelayAnswered, this, "%s%s%sContent-Length: %zu\r\n\r\n%b",
+                    hasBody ? "Content-Type: " : "", hasBody ? type.c_str() : "", hasBody ? "\r\n" : "",
+                    mbuf_get_left(request.mb), mbuf_buf(request.mb), mbuf_get_left(request.mb));
   if (error != 0) {
     sip_treply(&m_relayedTransaction, stack, &request, 500, "Server Internal Error");
     m_relayedTransaction = nullptr;

@@ -123,7 +123,11 @@ class Call {
   void followFlow(sipsess* session, std::string const& flowUri);
   void followCallerFlow();
   static void onRelayAnswered(int error, sip_msg const* message, void* call);
-  static int onRelaySent(sip_transp transport, sa const* source, sa const* destination, mbuf* message, void* call);
+  static int onRelaySent(sip_transp transport,
+                         sa const* source,
+                         sa const* destination,
+                         mbuf* message,
+                         void* call);
   static mbuf* bodyOf(sip_msg const& message);
 
   static void onBranchProgress(sip_msg const* message, void* branch);
@@ -150,7 +154,7 @@ class Call {
   // back with their branch.
   std::vector<std::unique_ptr<Branch>> m_branches;
   Branch* m_winner = nullptr;  // the branch whose 2xx went to the caller
-  bool m_earlyMedia = false;  // a branch's early SDP went to the caller
+  bool m_earlyMedia = false;   // a branch's early SDP went to the caller
   uint16_t m_bestCode = 0;
   std::string m_bestReason;
   std::string m_answer;  // the winning branch's SDP

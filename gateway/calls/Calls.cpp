@@ -138,7 +138,8 @@ void Calls::invite(Exchange& exchange) {
     return exchange.answer(488, "Not Acceptable Here");
   std::string const result = exchange.result() + exchange.clock().measure([&] {
     return profilesOf(*identity, LS_IdentityFace::CALL_INBOUND, "inbound-profiles") +
-           (caller ? profilesOf(*caller, LS_IdentityFace::CALL_OUTBOUND, "outbound-profiles") : std::string());
+           (caller ? profilesOf(*caller, LS_IdentityFace::CALL_OUTBOUND, "outbound-profiles")
+                   : std::string());
   });
   uint32_t const timeoutMs = exchange.clock().measure([&] { return inviteTimeoutMs(caller.get()); });
   auto call = std::make_unique<Call>(*this, invite, result, std::move(caller), std::move(targets), timeoutMs);

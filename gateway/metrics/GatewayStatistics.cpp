@@ -24,7 +24,8 @@ std::string GatewayStatistics::text() const {
   for (Trunk const& trunk : trunks)
     text += "  " + trunk.path + ": " + (trunk.registered ? "registered" : "not registered") + "\n";
   if (callsRelayed) {
-    text += "calls: " + std::to_string(callsActive) + " in progress, " + std::to_string(callsSetUp) + " set up\n";
+    text +=
+        "calls: " + std::to_string(callsActive) + " in progress, " + std::to_string(callsSetUp) + " set up\n";
     for (auto const& entry : callsFailed)
       text += "  failed " + std::to_string(entry.first) + ": " + std::to_string(entry.second) + "\n";
   }

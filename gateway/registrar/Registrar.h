@@ -163,7 +163,7 @@ class Registrar final : public RequestHandler {
     // With a route: the contact URI over the flow, the target of the
     // dialog's later requests (NatTraversal::flowTarget).
     std::string flow;
-    unsigned int q;     // thousandths
+    unsigned int q;  // thousandths
   };
   std::vector<CallTarget> callTargets(LS_IIdentity* identity) const;
 
