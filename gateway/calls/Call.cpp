@@ -220,7 +220,8 @@ bool Call::send(Branch& branch) {
     branch.session = nullptr;
     return false;
   }
-  m_calls.index(sip_dialog_callid(sipsess_dialog(branch.session)), *this);
+  m_branchCallIds.push_back(sip_dialog_callid(sipsess_dialog(branch.session)));
+  m_calls.index(m_branchCallIds.back(), *this);
   return true;
 }
 

@@ -95,6 +95,8 @@ class Call {
   // What the control socket shows of the call.
   std::string describe() const;
   uint64_t startedMs() const { return m_startedMs; }
+  // The Call-IDs of the branches sent, each a dialog of the gateway's.
+  std::vector<std::string> const& branchCallIds() const { return m_branchCallIds; }
 
  private:
   struct Branch {
@@ -154,6 +156,7 @@ class Call {
   // back with their branch.
   std::vector<std::unique_ptr<Branch>> m_branches;
   Branch* m_winner = nullptr;  // the branch whose 2xx went to the caller
+  std::vector<std::string> m_branchCallIds;
   bool m_earlyMedia = false;   // a branch's early SDP went to the caller
   uint16_t m_bestCode = 0;
   std::string m_bestReason;

@@ -77,9 +77,8 @@ Call* Calls::find(sip_msg const& request) const {
   return nullptr;
 }
 
-void Calls::index(char const* callId, Call& call) {
-  if (callId)
-    m_branchCalls[callId] = &call;
+void Calls::index(std::string const& callId, Call& call) {
+  m_branchCalls[callId] = &call;
 }
 
 bool Calls::relayedInDialog(sip_msg const& request) {
@@ -223,8 +222,8 @@ void Calls::onReap(void* argument) {
   std::vector<Call*> finished;
   finished.swap(calls.m_finished);
   for (Call* call : finished) {
-    for (auto each = calls.m_branchCalls.begin(); each != calls.m_branchCalls.end();)
-      each = each->second == call ? calls.m_branchCalls.erase(each) : std::next(each);
+    for (std::string const& callId : call->branchCallIds())
+      calls.m_branchCalls.erase(callId);
     auto const range = calls.m_calls.equal_range(textOf(call->invite().callid));
     for (auto each = range.first; each != range.second; ++each) {
       if (each->second.get() == call) {

@@ -98,7 +98,7 @@ class Calls final : public RequestHandler, public DialogHandler {
   // The callee answered and the caller got it.
   void established(Call& call);
   // A branch's Call-ID, under which its dialog's requests find the call.
-  void index(char const* callId, Call& call);
+  void index(std::string const& callId, Call& call);
   // Lets go of a session on the next turn of the loop: libre may still be
   // inside one of its calls.
   void release(sipsess* session);
