@@ -28,6 +28,12 @@
 //   phone rings.
 // - Either leg ending (BYE, CANCEL, a transport error, a timeout) ends the
 //   other: libre sends the BYE or the CANCEL.
+// - A call that leaves the gateway has one target, its Request-URI, and an
+//   OutboundRoute: its branch goes through the route's current hop, answers
+//   the carrier's challenges with the route's credentials, and when the
+//   route gives a hop up, a new branch goes to the next hop. A 401 or 407
+//   that ends such a branch reaches the caller as 403: the challenge was
+//   the gateway's to answer, and a caller cannot answer it.
 //
 // Owned by Calls; it dies only from its own timer (finish()), never inside
 // a libre callback, since libre still touches the session after calling it.
@@ -37,6 +43,7 @@
 #include <string>
 #include <vector>
 
+#include "calls/OutboundRoute.h"
 #include "registrar/Registrar.h"
 #include "sip/Libre.h"
 
@@ -47,12 +54,14 @@ class Call {
   enum class State { TRYING, EARLY, ANSWERED, ESTABLISHED, ENDED };
 
   // invite stays referenced while the call needs it. targets: in the order
-  // they ring, highest q first.
+  // they ring, highest q first. route: for a call that leaves the gateway,
+  // with the one target.
   Call(Calls& calls,
        sip_msg const& invite,
        std::string result,
        std::vector<Registrar::CallTarget> targets,
-       uint32_t inviteTimeoutMs);
+       uint32_t inviteTimeoutMs,
+       std::unique_ptr<OutboundRoute> route = nullptr);
   ~Call();
   Call(Call const&) = delete;
   Call& operator=(Call const&) = delete;
@@ -79,9 +88,17 @@ class Call {
     sipsess* session = nullptr;
     Registrar::CallTarget target;
     tmr timeout;
+    bool heard = false;  // any answer came, a provisional one included
   };
 
   void startGroup();
+  // Sends a branch to target; false when libre refused it.
+  bool launch(Registrar::CallTarget const& target);
+  // The route's next hop for a branch that failed with code, when the
+  // route gives the branch's hop up; true when a branch went there.
+  bool failOver(Branch const& failed, uint16_t code);
+  // The branch's hop answered something: it is alive.
+  void heard(Branch& branch);
   // Keeps the best final answer so far (RFC 3261 section 16.7).
   void noteFailure(uint16_t code, std::string const& reason);
   void failed(Branch& branch, uint16_t code, std::string const& reason);
@@ -125,4 +142,5 @@ class Call {
   std::string m_bestReason;
   std::string m_answer;  // the winning branch's SDP
   uint64_t m_startedMs;
+  std::unique_ptr<OutboundRoute> m_route;  // null for a call to a subscriber
 };

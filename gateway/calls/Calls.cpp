@@ -2,6 +2,9 @@
 
 #include <algorithm>
 
+#include "LS_IdentityResolution.h"
+#include "LS_ServiceResolution.h"
+#include "calls/OutboundRoute.h"
 #include "sip/Exchange.h"
 #include "sip/MonotonicClock.h"
 
@@ -71,6 +74,10 @@ void Calls::handle(Exchange& exchange) {
   if (m_maxCalls != 0 && m_statistics.active >= m_maxCalls)
     return exchange.answer(503, "Service Unavailable",
                            "Retry-After: " + std::to_string(kRetryAfterSeconds) + "\r\n");
+  bool const fromCarrier = m_trunks && m_trunks->trunkAt(invite.src);
+  std::string outside;
+  if (!fromCarrier && !served(exchange, outside))
+    return callOut(exchange, outside);
   CNameAddr target;
   RefPtr<LS_IIdentity> const identity = exchange.resolveOrAnswer(invite.ruri, target);
   if (!identity)
@@ -91,6 +98,73 @@ void Calls::handle(Exchange& exchange) {
   ++m_statistics.active;
   exchange.handOver();
   started.start();
+}
+
+bool Calls::served(Exchange& exchange, std::string& why) {
+  sip_msg const& invite = exchange.request();
+  CNameAddr nameAddr;
+  // What does not parse is left to the lookup of the callee, which says so.
+  if (!nameAddr.Parse(invite.ruri.p, invite.ruri.l))
+    return true;
+  ScriptSession::StackSettings const& settings = exchange.session().stack();
+  return exchange.clock().measure([&] {
+    String error;
+    String user;
+    CHostPort host;
+    if (LS_splitNameAddr(error, user, host, nameAddr).isFailure())
+      return true;
+    RefPtr<LS_ILocationService> service;
+    XCode const found =
+        settings.services.isEmpty()
+            ? LS_getLocationService(error, service, host, settings.localHostPorts, settings.imperative, nullptr)
+            : LS_getLocationService(error, service, host, settings.services, settings.localHostPorts,
+                                    settings.imperative, nullptr);
+    why = error.str();
+    return found.isSuccess();
+  });
+}
+
+void Calls::callOut(Exchange& exchange, std::string const& why) {
+  sip_msg const& invite = exchange.request();
+  RefPtr<LS_IIdentity> const caller = callerOf(exchange);
+  if (!caller) {
+    exchange.setResult("\"" + why + "\"");
+    return exchange.answer(403, "Forbidden");
+  }
+  exchange.setResult(exchange.clock().measure([&] { return ScriptSession::pathOf(caller.get()); }));
+  if (!m_trunks)
+    return exchange.answer(503, "Service Unavailable");
+  if (mbuf_get_left(invite.mb) == 0)
+    return exchange.answer(488, "Not Acceptable Here");
+  CNameAddr from;
+  from.Parse(invite.from.auri.p, invite.from.auri.l);
+  auto route = std::make_unique<OutboundRoute>(caller.get(), from, *m_trunks, m_penaltyBox, exchange.clock(),
+                                               [this](std::string const& hop) {
+                                                 return isGateway(Registrar::CallTarget{hop, hop, 0});
+                                               });
+  if (!route->available())
+    return exchange.answer(503, "Service Unavailable");
+  std::vector<Registrar::CallTarget> targets{Registrar::CallTarget{textOf(invite.ruri), route->route(), 1000}};
+  uint32_t const timeoutMs = route->inviteTimeoutMs();
+  auto call = std::make_unique<Call>(*this, invite, exchange.result(), std::move(targets), timeoutMs,
+                                     std::move(route));
+  Call& started = *call;
+  m_calls.emplace(textOf(invite.callid), std::move(call));
+  ++m_statistics.active;
+  exchange.handOver();
+  started.start();
+}
+
+// Stands in for the authentication of callers until it lands: the identity
+// the From address resolves to, unauthenticated. To be replaced by the
+// identity the caller authenticated as.
+RefPtr<LS_IIdentity> Calls::callerOf(Exchange& exchange) const {
+  sip_msg const& invite = exchange.request();
+  CNameAddr from;
+  if (!from.Parse(invite.from.auri.p, invite.from.auri.l))
+    return nullptr;
+  String error;
+  return exchange.clock().measure([&] { return exchange.session().resolve(error, from); });
 }
 
 std::vector<Registrar::CallTarget> Calls::targetsOf(LS_IIdentity* identity) const {

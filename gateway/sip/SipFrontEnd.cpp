@@ -72,6 +72,8 @@ bool SipFrontEnd::start(Settings const& settings, std::string& error) {
   m_trunks = std::make_unique<TrunkRegistrations>(*m_stack, m_session, m_clock);
   m_trunks->useCaFile(m_caFile);
   m_trunks->start();
+  if (m_calls)
+    m_calls->useTrunks(*m_trunks);
   return true;
 }
 
