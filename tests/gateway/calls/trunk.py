@@ -1,7 +1,7 @@
 #!/usr/bin/python3
 """End to end, with the gateway relaying calls: calls to numbers outside its
-domains leave through the caller's call-outbound face, and calls from a
-carrier reach the subscriber they are for.
+domains leave through the caller's call-outbound face (a trunk's own to its
+registrar), and calls from a carrier reach the subscriber they are for.
 
     trunk.py GATEWAY WORK-DIR [EMULATOR...]     (SIPP in the environment)
 
@@ -27,8 +27,10 @@ from sipphone import Gateway, Phone, check, hash_hex, run  # noqa: E402
 HERE = os.path.dirname(os.path.abspath(__file__))
 SIPP = os.environ.get("SIPP", "sipp")
 CALL_LIMIT_S = 30
-# How long a proxy may stay silent before the gateway tries the next one.
-INVITE_TIMEOUT_S = 2
+# How long a proxy may stay silent before the gateway tries the next one:
+# far above a carrier's answer on loopback, the gateway under an emulator
+# included.
+INVITE_TIMEOUT_S = 3
 CARRIER_ACCOUNT = ("gateway-7", "carrier.example", "s3cret")
 CARRIER = "127.0.0.2"
 
@@ -40,8 +42,8 @@ authentication-service carrier credentials set gateway-7 s3cret
 """
 
 
-def free_port(address="127.0.0.1"):
-    probe = socket.socket(socket.AF_INET, socket.SOCK_DGRAM)
+def free_port(address="127.0.0.1", kind=socket.SOCK_DGRAM):
+    probe = socket.socket(socket.AF_INET, kind)
     probe.bind((address, 0))
     port = probe.getsockname()[1]
     probe.close()
@@ -161,6 +163,7 @@ def calls_out_through_the_callers_proxies(program, work, emulator):
     silent = SilentProxy()
     silent.start()
     carrier_port = free_port()
+    tcp_carrier_port = free_port(kind=socket.SOCK_STREAM)
     script = os.path.join(work, "outbound.script")
     with open(script, "w") as file:
         file.write(BASE_SCRIPT)
@@ -171,9 +174,11 @@ def calls_out_through_the_callers_proxies(program, work, emulator):
                            "proxy insert 1 127.0.0.1:%d loose" % carrier_port,
                            "penalty-box set on",
                            "invite-transaction-timeout set %d" % INVITE_TIMEOUT_S]),
-                # The forced destination wins over the silent proxy.
+                # The forced destination wins over the silent proxy, and
+                # is reached over the transport the face asks for.
                 ("dave", ["proxy insert 0 127.0.0.1:%d loose" % silent.port,
-                          "forced-destination set manual 127.0.0.1:%d" % carrier_port,
+                          "forced-destination set manual 127.0.0.1:%d" % tcp_carrier_port,
+                          "preferred-protocol set forced-tcp",
                           "invite-transaction-timeout set %d" % INVITE_TIMEOUT_S]),
                 # No credentials for the carrier.
                 ("carol", ["proxy insert 0 127.0.0.1:%d loose" % carrier_port]),
@@ -189,7 +194,9 @@ def calls_out_through_the_callers_proxies(program, work, emulator):
                 file.write("identity example.com %s face authentication-outbound create\n" % name)
                 file.write("face example.com %s authentication-outbound authenticate insert 0 carrier gateway-7\n"
                            % name)
-    carrier = Sipp(work, "outbound-carrier", "carrier.xml", ["-i", "127.0.0.1", "-p", str(carrier_port), "-m", "4"])
+    carrier = Sipp(work, "outbound-carrier", "carrier.xml", ["-i", "127.0.0.1", "-p", str(carrier_port), "-m", "3"])
+    tcp_carrier = Sipp(work, "outbound-tcp-carrier", "carrier.xml",
+                       ["-t", "t1", "-i", "127.0.0.1", "-p", str(tcp_carrier_port), "-m", "1"])
     gateway = Gateway(program, emulator, work, "outbound", [script], ["--calls", "relay"])
     try:
         check(invite("127.0.0.1", gateway, "sip:mallory@example.com", "sip:4930123@pstn.example") == 403,
@@ -200,6 +207,7 @@ def calls_out_through_the_callers_proxies(program, work, emulator):
         check(len(silent.calls) == 1, "the penalty box did not keep the silent proxy out")
         call(work, "outbound-dave", gateway, "127.0.0.1", "dave@example.com", "4930125", "pstn.example")
         check(len(silent.calls) == 1, "the forced destination did not replace the proxies")
+        check(tcp_carrier.succeeded(), "the call over TCP failed at the carrier: " + tcp_carrier.errors())
         # The carrier waits for a second INVITE that does not come.
         check(invite("127.0.0.1", gateway, "sip:carol@example.com", "sip:4930126@pstn.example") == 403,
               "the challenge the gateway had no credentials for was not the call's end as 403")
@@ -208,6 +216,7 @@ def calls_out_through_the_callers_proxies(program, work, emulator):
                   "a call through a silent proxy did not time out")
         check(len(silent.calls) == 3, "a boxed proxy was skipped when no other was left")
         credentials = carrier.logged()
+        credentials += tcp_carrier.logged()
         check(len(credentials) == 3 and all(verify_credentials(line) for line in credentials),
               "the carrier did not get the account's credentials: %s" % credentials)
         check(re.search(r"^INVITE sip:4930123@pstn\.example example\.com/alice 200$", gateway.output(), re.M),
@@ -216,10 +225,11 @@ def calls_out_through_the_callers_proxies(program, work, emulator):
     finally:
         gateway.kill()
         carrier.kill()
+        tcp_carrier.kill()
         silent.stop()
 
 
-def carrier_calls_reach_subscribers_unchallenged(program, work, emulator):
+def trunk_calls_come_in_unchallenged_and_go_out_to_its_registrar(program, work, emulator):
     silent = SilentProxy()
     silent.start()
     registrar_port = free_port(CARRIER)
@@ -232,6 +242,13 @@ def carrier_calls_reach_subscribers_unchallenged(program, work, emulator):
                    "face example.com trunk registration-outbound registrar set %s:%d\n"
                    "face example.com trunk registration-outbound lifetime set 300\n"
                    "face example.com trunk registration-outbound retry-timeout-on-system-error set 1\n"
+                   # The trunk's own calls go to its registrar, not its proxy.
+                   "identity example.com trunk face call-outbound create\n"
+                   "face example.com trunk call-outbound proxy insert 0 127.0.0.1:%d loose\n"
+                   "face example.com trunk call-outbound forced-destination set registrar-address\n"
+                   "face example.com trunk call-outbound invite-transaction-timeout set %d\n"
+                   "identity example.com trunk face authentication-outbound create\n"
+                   "face example.com trunk authentication-outbound authenticate insert 0 carrier gateway-7\n"
                    "identity example.com bob create identity\n"
                    "identity example.com bob face registration-inbound create\n"
                    # A subscriber whose calls out would reach the silent proxy.
@@ -239,11 +256,12 @@ def carrier_calls_reach_subscribers_unchallenged(program, work, emulator):
                    "identity example.com alice face call-outbound create\n"
                    "face example.com alice call-outbound proxy insert 0 127.0.0.1:%d loose\n"
                    "face example.com alice call-outbound invite-transaction-timeout set %d\n"
-                   % (CARRIER, registrar_port, silent.port, INVITE_TIMEOUT_S))
+                   % (CARRIER, registrar_port, silent.port, INVITE_TIMEOUT_S, silent.port, INVITE_TIMEOUT_S))
     registrar = Sipp(work, "inbound-registrar", "registrar.xml",
                      ["-i", CARRIER, "-p", str(registrar_port), "-m", "1"])
     gateway = Gateway(program, emulator, work, "inbound", [script], ["--calls", "relay"])
     bob = None
+    carrier = None
     try:
         check(registrar.succeeded(), "the trunk did not register: " + registrar.errors() + gateway.errors())
         subscriber = Sipp(work, "inbound-subscriber", "subscriber.xml",
@@ -259,12 +277,19 @@ def carrier_calls_reach_subscribers_unchallenged(program, work, emulator):
         check(invite(CARRIER, gateway, "sip:alice@example.com", "sip:4930999@pstn.example") == 404,
               "a carrier's call to a number outside was not refused as not found")
         check(not silent.calls, "a carrier's call went back out")
+        carrier = Sipp(work, "inbound-registrar-calls", "carrier.xml",
+                       ["-i", CARRIER, "-p", str(registrar_port), "-m", "1"])
+        call(work, "inbound-trunk-out", gateway, "127.0.0.1", "trunk@example.com", "4930777", "pstn.example")
+        check(carrier.succeeded(), "the trunk's call did not reach its registrar: " + carrier.errors())
+        check(all(verify_credentials(line) for line in carrier.logged()), "the trunk's credentials were wrong")
+        check(not silent.calls, "the trunk's call went to its proxy, not its registrar")
         gateway.stop()
     finally:
         gateway.kill()
         registrar.kill()
-        if bob:
-            bob.kill()
+        for process in (bob, carrier):
+            if process:
+                process.kill()
         silent.stop()
 
 
@@ -272,5 +297,6 @@ if __name__ == "__main__":
     if len(sys.argv) < 3:
         sys.exit("usage: trunk.py GATEWAY WORK-DIR [EMULATOR...]")
     sys.exit(run([("calls_out_through_the_callers_proxies", calls_out_through_the_callers_proxies),
-                  ("carrier_calls_reach_subscribers_unchallenged", carrier_calls_reach_subscribers_unchallenged)],
+                  ("trunk_calls_come_in_unchallenged_and_go_out_to_its_registrar",
+                   trunk_calls_come_in_unchallenged_and_go_out_to_its_registrar)],
                  sys.argv[1], sys.argv[2], sys.argv[3:]))
