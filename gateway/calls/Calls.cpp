@@ -155,9 +155,7 @@ void Calls::callOut(Exchange& exchange, std::string const& why) {
   started.start();
 }
 
-// Stands in for the authentication of callers until it lands: the identity
-// the From address resolves to, unauthenticated. To be replaced by the
-// identity the caller authenticated as.
+// STAND-IN until callers authenticate (see the header).
 RefPtr<LS_IIdentity> Calls::callerOf(Exchange& exchange) const {
   sip_msg const& invite = exchange.request();
   CNameAddr from;

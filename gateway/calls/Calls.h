@@ -106,6 +106,9 @@ class Calls {
   // lookup's message in why when none does.
   static bool served(Exchange& exchange, std::string& why);
   void callOut(Exchange& exchange, std::string const& why);
+  // STAND-IN until callers authenticate: the identity the From address
+  // resolves to, taken on trust. To be replaced by the identity the caller
+  // authenticated as.
   RefPtr<LS_IIdentity> callerOf(Exchange& exchange) const;
   std::vector<Registrar::CallTarget> targetsOf(LS_IIdentity* identity) const;
   bool isGateway(Registrar::CallTarget const& target) const;

@@ -49,17 +49,9 @@ bool sameHost(std::vector<sa> const& addresses, sa const& source) {
 }  // namespace
 
 RefPtr<LS_IIdentity> TrunkRegistrations::trunkAt(sa const& source) const {
-  for (std::unique_ptr<Trunk> const& trunk : m_trunks) {
+  for (std::unique_ptr<Trunk> const& trunk : m_trunks)
     if (sameHost(trunk->carrierAddresses, source))
       return trunk->identity;
-    CHostPort answered;
-    if (m_clock.measure([&] { return trunk->face->getRegistrarAddr(answered).isFailure(); }))
-      continue;
-    std::vector<sa> learnt;
-    addAddress(learnt, answered);
-    if (sameHost(learnt, source))
-      return trunk->identity;
-  }
   return nullptr;
 }
 
@@ -285,6 +277,8 @@ void TrunkRegistrations::onResponse(int error, sip_msg const* response, void* ar
     CHostPort registrar;
     registrar.Parse(address, std::char_traits<char>::length(address));
     clock.measure([&] { trunk.face->setRegistrarAddr(registrar); });
+    if (!sameHost(trunk.carrierAddresses, response->src))
+      trunk.carrierAddresses.push_back(response->src);
     trunk.registered = true;
     trunk.lastFailure.clear();
     std::string transport = sip_transp_name(response->tp);

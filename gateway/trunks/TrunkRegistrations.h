@@ -118,7 +118,8 @@ class TrunkRegistrations {
     // The host whose certificate a TLS registration verifies; empty when
     // the trunk registers over a plain transport.
     std::string tlsHost;
-    // The numeric registrar and proxy hosts of the face, for trunkAt().
+    // For trunkAt(): the face's numeric registrar and proxy hosts, and the
+    // addresses registrations were answered from.
     std::vector<sa> carrierAddresses;
     uint32_t lifetime;
     sipreg* registration = nullptr;
