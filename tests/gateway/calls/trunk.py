@@ -6,9 +6,9 @@ registrar), and calls from a carrier reach the subscriber they are for.
     trunk.py GATEWAY WORK-DIR [EMULATOR...]     (SIPP in the environment)
 
 SIPp plays the carrier (carrier.xml: it challenges with 407 and logs the
-credentials, which are checked here against the account's password), the
-calling phones (caller.xml) and the subscriber (subscriber.xml, then
-SIPp's own uas). A proxy that never answers is a UDP socket here that
+credentials, which are checked here against the account's password), an
+overloaded proxy (overloaded.xml), the calling phones (caller.xml) and the
+subscriber (subscriber.xml, then SIPp's own uas). A proxy that never answers is a UDP socket here that
 reads and keeps quiet, noting the calls it was offered. Every process is
 bounded in time and stopped by its PID.
 """
@@ -164,6 +164,7 @@ def calls_out_through_the_callers_proxies(program, work, emulator):
     silent.start()
     carrier_port = free_port()
     tcp_carrier_port = free_port(kind=socket.SOCK_STREAM)
+    overloaded_port = free_port()
     script = os.path.join(work, "outbound.script")
     with open(script, "w") as file:
         file.write(BASE_SCRIPT)
@@ -180,6 +181,9 @@ def calls_out_through_the_callers_proxies(program, work, emulator):
                           "forced-destination set manual 127.0.0.1:%d" % tcp_carrier_port,
                           "preferred-protocol set forced-tcp",
                           "invite-transaction-timeout set %d" % INVITE_TIMEOUT_S]),
+                # An overloaded proxy's 503 moves on too.
+                ("frank", ["proxy insert 0 127.0.0.1:%d loose" % overloaded_port,
+                           "proxy insert 1 127.0.0.1:%d loose" % carrier_port]),
                 # No credentials for the carrier.
                 ("carol", ["proxy insert 0 127.0.0.1:%d loose" % carrier_port]),
                 # Every proxy boxed: tried all the same.
@@ -190,13 +194,15 @@ def calls_out_through_the_callers_proxies(program, work, emulator):
             file.write("identity example.com %s face call-outbound create\n" % name)
             for line in lines:
                 file.write("face example.com %s call-outbound %s\n" % (name, line))
-            if name in ("alice", "dave"):
+            if name in ("alice", "dave", "frank"):
                 file.write("identity example.com %s face authentication-outbound create\n" % name)
                 file.write("face example.com %s authentication-outbound authenticate insert 0 carrier gateway-7\n"
                            % name)
-    carrier = Sipp(work, "outbound-carrier", "carrier.xml", ["-i", "127.0.0.1", "-p", str(carrier_port), "-m", "3"])
+    carrier = Sipp(work, "outbound-carrier", "carrier.xml", ["-i", "127.0.0.1", "-p", str(carrier_port), "-m", "4"])
     tcp_carrier = Sipp(work, "outbound-tcp-carrier", "carrier.xml",
                        ["-t", "t1", "-i", "127.0.0.1", "-p", str(tcp_carrier_port), "-m", "1"])
+    overloaded = Sipp(work, "outbound-overloaded", "overloaded.xml",
+                      ["-i", "127.0.0.1", "-p", str(overloaded_port), "-m", "1"])
     gateway = Gateway(program, emulator, work, "outbound", [script], ["--calls", "relay"])
     try:
         check(invite("127.0.0.1", gateway, "sip:mallory@example.com", "sip:4930123@pstn.example") == 403,
@@ -208,6 +214,8 @@ def calls_out_through_the_callers_proxies(program, work, emulator):
         call(work, "outbound-dave", gateway, "127.0.0.1", "dave@example.com", "4930125", "pstn.example")
         check(len(silent.calls) == 1, "the forced destination did not replace the proxies")
         check(tcp_carrier.succeeded(), "the call over TCP failed at the carrier: " + tcp_carrier.errors())
+        call(work, "outbound-frank", gateway, "127.0.0.1", "frank@example.com", "4930128", "pstn.example")
+        check(overloaded.succeeded(), "the overloaded proxy was not tried first: " + overloaded.errors())
         # The carrier waits for a second INVITE that does not come.
         check(invite("127.0.0.1", gateway, "sip:carol@example.com", "sip:4930126@pstn.example") == 403,
               "the challenge the gateway had no credentials for was not the call's end as 403")
@@ -217,7 +225,7 @@ def calls_out_through_the_callers_proxies(program, work, emulator):
         check(len(silent.calls) == 3, "a boxed proxy was skipped when no other was left")
         credentials = carrier.logged()
         credentials += tcp_carrier.logged()
-        check(len(credentials) == 3 and all(verify_credentials(line) for line in credentials),
+        check(len(credentials) == 4 and all(verify_credentials(line) for line in credentials),
               "the carrier did not get the account's credentials: %s" % credentials)
         check(re.search(r"^INVITE sip:4930123@pstn\.example example\.com/alice 200$", gateway.output(), re.M),
               "no request line for alice's call: " + gateway.output())
@@ -226,6 +234,7 @@ def calls_out_through_the_callers_proxies(program, work, emulator):
         gateway.kill()
         carrier.kill()
         tcp_carrier.kill()
+        overloaded.kill()
         silent.stop()
 
 
