@@ -27,6 +27,9 @@ from sipphone import Gateway, Phone, check, hash_hex, run  # noqa: E402
 HERE = os.path.dirname(os.path.abspath(__file__))
 SIPP = os.environ.get("SIPP", "sipp")
 CALL_LIMIT_S = 30
+# The carriers and the subscriber serve the whole test, the gateway's
+# start under an emulator included.
+SERVER_LIMIT_S = 90
 # How long a proxy may stay silent before the gateway tries the next one:
 # far above a carrier's answer on loopback, the gateway under an emulator
 # included.
@@ -53,21 +56,22 @@ def free_port(address="127.0.0.1", kind=socket.SOCK_DGRAM):
 class Sipp:
     """One SIPp run in the work directory; options follow the scenario."""
 
-    def __init__(self, work, name, scenario, options):
+    def __init__(self, work, name, scenario, options, limit_s=SERVER_LIMIT_S):
         self.name = name
+        self.limit_s = limit_s
         self.work = work
         scenario_options = ["-sn", scenario] if scenario == "uas" else ["-sf", os.path.join(HERE, scenario)]
         with open(os.path.join(work, name + ".sipp.out"), "wb") as out:
             self.process = subprocess.Popen(
                 [SIPP] + scenario_options + list(options) +
-                ["-timeout", "%ds" % CALL_LIMIT_S, "-timeout_error", "-trace_err", "-trace_logs",
+                ["-timeout", "%ds" % limit_s, "-timeout_error", "-trace_err", "-trace_logs",
                  "-error_file", os.path.join(work, name + ".errors"),
                  "-log_file", os.path.join(work, name + ".logs")],
                 cwd=work, stdout=out, stderr=subprocess.STDOUT, stdin=subprocess.DEVNULL)
 
     def succeeded(self):
         try:
-            status = self.process.wait(timeout=CALL_LIMIT_S + 10)
+            status = self.process.wait(timeout=self.limit_s + 10)
         except subprocess.TimeoutExpired:
             self.kill()
             return False
@@ -92,7 +96,7 @@ def call(work, name, gateway, source, from_uri, number, domain):
     answered and torn down."""
     caller = Sipp(work, name, "caller.xml",
                   ["-i", source, "-p", str(free_port(source)), "-key", "from", from_uri, "-key", "domain", domain, "-s", number, "-m", "1",
-                   "127.0.0.1:%d" % gateway.port])
+                   "127.0.0.1:%d" % gateway.port], CALL_LIMIT_S)
     answered = caller.succeeded()
     check(answered, "call %s failed: %s" % (name, caller.errors()))
 
@@ -275,7 +279,7 @@ def trunk_calls_come_in_unchallenged_and_go_out_to_its_registrar(program, work, 
         check(registrar.succeeded(), "the trunk did not register: " + registrar.errors() + gateway.errors())
         subscriber = Sipp(work, "inbound-subscriber", "subscriber.xml",
                           ["-i", "127.0.0.1", "-p", str(bob_port), "-s", "bob", "-m", "1",
-                           "127.0.0.1:%d" % gateway.port])
+                           "127.0.0.1:%d" % gateway.port], CALL_LIMIT_S)
         check(subscriber.succeeded(), "bob did not register: " + subscriber.errors())
         bob = Sipp(work, "inbound-bob", "uas", ["-i", "127.0.0.1", "-p", str(bob_port), "-m", "1"])
         # SIPp's caller fails on a 407: the carrier is not challenged.
