@@ -22,7 +22,7 @@ import threading
 import time
 
 sys.path.insert(0, os.path.join(os.path.dirname(os.path.abspath(__file__)), ".."))
-from sipphone import Gateway, Phone, check, hash_hex, run  # noqa: E402
+from sipphone import START_LIMIT_S, Gateway, Phone, check, hash_hex, run  # noqa: E402
 
 HERE = os.path.dirname(os.path.abspath(__file__))
 SIPP = os.environ.get("SIPP", "sipp")
@@ -68,6 +68,22 @@ class Sipp:
                  "-error_file", os.path.join(work, name + ".errors"),
                  "-log_file", os.path.join(work, name + ".logs")],
                 cwd=work, stdout=out, stderr=subprocess.STDOUT, stdin=subprocess.DEVNULL)
+        # Whatever is sent to its port before SIPp has bound it is lost.
+        if "-p" in options:
+            kind = socket.SOCK_STREAM if "t1" in options else socket.SOCK_DGRAM
+            self.await_bound(options[options.index("-i") + 1], int(options[options.index("-p") + 1]), kind)
+
+    def await_bound(self, address, port, kind):
+        deadline = time.monotonic() + START_LIMIT_S
+        while time.monotonic() < deadline and self.process.poll() is None:
+            probe = socket.socket(socket.AF_INET, kind)
+            try:
+                probe.bind((address, port))
+            except OSError:
+                return
+            finally:
+                probe.close()
+            time.sleep(0.05)
 
     def succeeded(self):
         try:
