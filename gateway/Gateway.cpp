@@ -72,6 +72,8 @@ bool Gateway::start(std::string& error) {
   m_trunks = std::make_unique<TrunkRegistrations>(m_frontEnd.stack(), m_session, m_clock);
   m_trunks->useCaFile(m_settings.caFile);
   m_trunks->start();
+  if (m_calls)
+    m_calls->useTrunks(*m_trunks);
   std::vector<std::string> secure;
   if (!m_frontEnd.startSecure(m_settings.secure, secure, error))
     return false;

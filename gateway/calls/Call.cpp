@@ -36,14 +36,16 @@ Call::Call(Calls& calls,
            std::string result,
            RefPtr<LS_IIdentity> caller,
            std::vector<Registrar::CallTarget> targets,
-           uint32_t inviteTimeoutMs)
+           uint32_t inviteTimeoutMs,
+           std::unique_ptr<OutboundRoute> route)
     : m_calls(calls),
       m_invite(static_cast<sip_msg const*>(mem_ref(const_cast<sip_msg*>(&invite)))),
       m_result(std::move(result)),
       m_callerIdentity(std::move(caller)),
       m_targets(std::move(targets)),
       m_inviteTimeoutMs(inviteTimeoutMs),
-      m_startedMs(MonotonicClock::nowMs()) {}
+      m_startedMs(MonotonicClock::nowMs()),
+      m_route(std::move(route)) {}
 
 Call::~Call() {
   // A relay still waiting: libre forgets its handler, and the phone that
@@ -100,22 +102,46 @@ void Call::startGroup() {
     unsigned int const q = m_targets[m_next].q;
     size_t sent = 0;
     for (; m_next < m_targets.size() && m_targets[m_next].q == q; ++m_next) {
-      auto branch = std::make_unique<Branch>();
-      branch->call = this;
-      branch->target = m_targets[m_next];
-      tmr_init(&branch->timeout);
-      if (send(*branch)) {
-        tmr_start(&branch->timeout, m_inviteTimeoutMs, onBranchTimeout, branch.get());
-        m_branches.push_back(std::move(branch));
+      if (launch(m_targets[m_next]))
         ++sent;
-      } else {
+      else
         noteFailure(503, "Service Unavailable");
-      }
     }
     if (sent > 0)
       return;
   }
   answerFailure();
+}
+
+bool Call::launch(Registrar::CallTarget const& target) {
+  auto branch = std::make_unique<Branch>();
+  branch->call = this;
+  branch->target = target;
+  tmr_init(&branch->timeout);
+  if (!send(*branch))
+    return false;
+  tmr_start(&branch->timeout, m_inviteTimeoutMs, onBranchTimeout, branch.get());
+  m_branches.push_back(std::move(branch));
+  return true;
+}
+
+void Call::heard(Branch& branch) {
+  if (!branch.heard && m_route)
+    m_route->answered();
+  branch.heard = true;
+}
+
+bool Call::failOver(Branch const& failed, uint16_t code) {
+  bool heard = failed.heard;
+  while (m_route->failOver(code, heard, MonotonicClock::nowMs())) {
+    Registrar::CallTarget target = failed.target;
+    target.route = m_route->route();
+    if (launch(target))
+      return true;
+    code = 503;
+    heard = false;
+  }
+  return false;
 }
 
 void Call::noteFailure(uint16_t code, std::string const& reason) {
@@ -132,9 +158,11 @@ void Call::failed(Branch& branch, uint16_t code, std::string const& reason) {
   tmr_cancel(&branch.timeout);
   m_calls.release(branch.session);
   branch.session = nullptr;
-  noteFailure(code, reason);
   if (m_state != State::TRYING && m_state != State::EARLY)
+    return noteFailure(code, reason);
+  if (m_route && failOver(branch, code))
     return;
+  noteFailure(code, reason);
   if (classOf(code) == 6)
     return answerFailure();
   bool const ringing =
@@ -210,11 +238,11 @@ bool Call::send(Branch& branch) {
   char const* route = branch.target.route.c_str();
   mbuf* const offer = bodyOf(invite);
   int const error = sipsess_connect(
-      &branch.session, &m_calls.sessions(), branch.target.uri.c_str(),
-      fromName.empty() ? nullptr : fromName.c_str(), fromUri.c_str(), user.c_str(),
-      branch.target.route.empty() ? nullptr : &route, branch.target.route.empty() ? 0 : 1,
-      contentType(invite).c_str(), offer, nullptr, nullptr, false, nullptr, onBranchAnswer, onBranchProgress,
-      onBranchEstablished, onBranchInfo, nullptr, onBranchClosed, &branch, nullptr);
+      &branch.session, &m_calls.sessions(), branch.target.uri.c_str(), fromName.empty() ? nullptr : fromName.c_str(),
+      fromUri.c_str(), user.c_str(), branch.target.route.empty() ? nullptr : &route,
+      branch.target.route.empty() ? 0 : 1, contentType(invite).c_str(), offer,
+      m_route ? OutboundRoute::onChallenge : nullptr, m_route.get(), false, nullptr,
+      onBranchAnswer, onBranchProgress, onBranchEstablished, onBranchInfo, nullptr, onBranchClosed, &branch, nullptr);
   mem_deref(offer);
   if (error != 0) {
     branch.session = nullptr;
@@ -240,6 +268,7 @@ bool Call::acceptCaller(uint16_t code, pl const& reason, mbuf* description) {
 void Call::onBranchProgress(sip_msg const* message, void* argument) {
   Branch& branch = *static_cast<Branch*>(argument);
   Call& call = *branch.call;
+  call.heard(branch);
   if (message->scode <= 100 || (call.m_state != State::TRYING && call.m_state != State::EARLY))
     return;
   mbuf* description = nullptr;
@@ -269,6 +298,7 @@ void Call::onBranchEstablished(sip_msg const* message, void* argument) {
   Branch& branch = *static_cast<Branch*>(argument);
   Call& call = *branch.call;
   tmr_cancel(&branch.timeout);
+  call.heard(branch);
   if (call.m_state != State::TRYING && call.m_state != State::EARLY) {
     // Another branch won first, or the caller left: libre says BYE.
     call.m_calls.release(branch.session);
@@ -305,6 +335,10 @@ void Call::onBranchClosed(int error, sip_msg const* message, void* argument) {
     branch.session = nullptr;
     return call.end();
   }
+  if (message)
+    call.heard(branch);
+  if (message && call.m_route && (message->scode == 401 || message->scode == 407))
+    return call.failed(branch, 403, "Forbidden");
   if (message && message->scode >= 300)
     return call.failed(branch, message->scode, textOf(message->reason));
   call.failed(branch, error == ETIMEDOUT ? 408 : 503,

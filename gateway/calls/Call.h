@@ -39,6 +39,12 @@
 //   fix_nated_contact makes it, so that a BYE finds the phone.
 // - Either leg ending (BYE, CANCEL, a transport error, a timeout) ends the
 //   other: libre sends the BYE or the CANCEL.
+// - A call that leaves the gateway has one target, its Request-URI, and an
+//   OutboundRoute: its branch goes through the route's current hop, answers
+//   the carrier's challenges with the route's credentials, and when the
+//   route gives a hop up, a new branch goes to the next hop. A 401 or 407
+//   that ends such a branch reaches the caller as 403: the challenge was
+//   the gateway's to answer, and a caller cannot answer it.
 //
 // Owned by Calls; it dies only from its own timer (finish()), never inside
 // a libre callback, since libre still touches the session after calling it.
@@ -50,6 +56,7 @@
 
 #include "LS_IIdentity.h"
 #include "RefPtr.h"
+#include "calls/OutboundRoute.h"
 #include "registrar/Registrar.h"
 #include "sip/Libre.h"
 
@@ -61,13 +68,15 @@ class Call {
 
   // invite stays referenced while the call needs it. caller: the identity
   // the caller authenticated as, null for an outside caller. targets: in
-  // the order they ring, highest q first.
+  // the order they ring, highest q first. route: for a call that leaves the
+  // gateway, with the one target.
   Call(Calls& calls,
        sip_msg const& invite,
        std::string result,
        RefPtr<LS_IIdentity> caller,
        std::vector<Registrar::CallTarget> targets,
-       uint32_t inviteTimeoutMs);
+       uint32_t inviteTimeoutMs,
+       std::unique_ptr<OutboundRoute> route = nullptr);
   ~Call();
   Call(Call const&) = delete;
   Call& operator=(Call const&) = delete;
@@ -104,9 +113,17 @@ class Call {
     sipsess* session = nullptr;
     Registrar::CallTarget target;
     tmr timeout;
+    bool heard = false;  // any answer came, a provisional one included
   };
 
   void startGroup();
+  // Sends a branch to target; false when libre refused it.
+  bool launch(Registrar::CallTarget const& target);
+  // The route's next hop for a branch that failed with code, when the
+  // route gives the branch's hop up; true when a branch went there.
+  bool failOver(Branch const& failed, uint16_t code);
+  // The branch's hop answered something: it is alive.
+  void heard(Branch& branch);
   // Keeps the best final answer so far (RFC 3261 section 16.7).
   void noteFailure(uint16_t code, std::string const& reason);
   void failed(Branch& branch, uint16_t code, std::string const& reason);
@@ -168,4 +185,5 @@ class Call {
   sip_strans* m_relayedTransaction = nullptr;
   struct sip_request* m_relay = nullptr;
   sipsess* m_relayTo = nullptr;
+  std::unique_ptr<OutboundRoute> m_route;  // null for a call to a subscriber
 };

@@ -5,6 +5,9 @@
 #include "LS_ICall.h"
 #include "LS_IOutbound.h"
 #include "registrar/InboundFilter.h"
+#include "LS_IdentityResolution.h"
+#include "LS_ServiceResolution.h"
+#include "calls/OutboundRoute.h"
 #include "sip/Exchange.h"
 #include "sip/MonotonicClock.h"
 
@@ -118,9 +121,13 @@ void Calls::invite(Exchange& exchange) {
   if (m_maxCalls != 0 && m_statistics.active >= m_maxCalls)
     return exchange.answer(503, "Service Unavailable",
                            "Retry-After: " + std::to_string(kRetryAfterSeconds) + "\r\n");
+  bool const fromCarrier = m_trunks && m_trunks->trunkAt(invite.src);
   RefPtr<LS_IIdentity> caller;
-  if (!m_registrar.authenticator().admitCaller(exchange, caller))
+  if (!fromCarrier && !m_registrar.authenticator().admitCaller(exchange, caller))
     return;
+  std::string outside;
+  if (!fromCarrier && !served(exchange, outside))
+    return callOut(exchange, outside, std::move(caller));
   CNameAddr target;
   RefPtr<LS_IIdentity> const identity = exchange.resolveOrAnswer(invite.ruri, target);
   if (!identity || InboundFilter::refuses(exchange, *identity, LS_IdentityFace::CALL_INBOUND))
@@ -157,6 +164,63 @@ uint32_t Calls::inviteTimeoutMs(LS_IIdentity const* caller) {
   if (seconds == 0)
     return kDefaultInviteTimeoutMs;
   return std::min(seconds, kMaximumInviteTimeoutSeconds) * 1000;
+}
+
+bool Calls::served(Exchange& exchange, std::string& why) {
+  sip_msg const& invite = exchange.request();
+  CNameAddr nameAddr;
+  // What does not parse is left to the lookup of the callee, which says so.
+  if (!nameAddr.Parse(invite.ruri.p, invite.ruri.l))
+    return true;
+  ScriptSession::StackSettings const& settings = exchange.session().stack();
+  return exchange.clock().measure([&] {
+    String error;
+    String user;
+    CHostPort host;
+    if (LS_splitNameAddr(error, user, host, nameAddr).isFailure())
+      return true;
+    RefPtr<LS_ILocationService> service;
+    XCode const found =
+        settings.services.isEmpty()
+            ? LS_getLocationService(error, service, host, settings.localHostPorts, settings.imperative, nullptr)
+            : LS_getLocationService(error, service, host, settings.services, settings.localHostPorts,
+                                    settings.imperative, nullptr);
+    why = error.str();
+    return found.isSuccess();
+  });
+}
+
+void Calls::callOut(Exchange& exchange, std::string const& why, RefPtr<LS_IIdentity> caller) {
+  sip_msg const& invite = exchange.request();
+  if (!caller) {
+    exchange.setResult("\"" + why + "\"");
+    return exchange.answer(403, "Forbidden");
+  }
+  exchange.setResult(exchange.clock().measure([&] { return ScriptSession::pathOf(caller.get()); }));
+  if (!m_trunks)
+    return exchange.answer(503, "Service Unavailable");
+  if (mbuf_get_left(invite.mb) == 0)
+    return exchange.answer(488, "Not Acceptable Here");
+  CNameAddr from;
+  from.Parse(invite.from.auri.p, invite.from.auri.l);
+  auto route = std::make_unique<OutboundRoute>(caller.get(), from, *m_trunks, m_penaltyBox, exchange.clock(),
+                                               [this](std::string const& hop) {
+                                                 return isGateway(Registrar::CallTarget{hop, hop, "", 0});
+                                               });
+  if (!route->available())
+    return exchange.answer(503, "Service Unavailable");
+  std::vector<Registrar::CallTarget> targets{Registrar::CallTarget{textOf(invite.ruri), route->route(), "", 1000}};
+  uint32_t const timeoutMs = exchange.clock().measure([&] { return inviteTimeoutMs(caller.get()); });
+  std::string const result = exchange.result() + exchange.clock().measure([&] {
+    return profilesOf(*caller, LS_IdentityFace::CALL_OUTBOUND, "outbound-profiles");
+  });
+  auto call = std::make_unique<Call>(*this, invite, result, std::move(caller), std::move(targets), timeoutMs,
+                                     std::move(route));
+  Call& started = *call;
+  m_calls.emplace(textOf(invite.callid), std::move(call));
+  ++m_statistics.active;
+  exchange.handOver();
+  started.start();
 }
 
 std::vector<Registrar::CallTarget> Calls::targetsOf(LS_IIdentity* identity) const {

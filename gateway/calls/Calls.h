@@ -29,6 +29,15 @@
 //   which applied.
 // - In-dialog requests that libre's session layer takes (ACK, BYE, INFO,
 //   REFER) are left to it; re-INVITE and UPDATE of a call are relayed here.
+// - A call whose Request-URI is in no served domain (no location service
+//   answers for its host) leaves the gateway through the caller identity's
+//   call-outbound face (OutboundRoute). Without a caller identity it gets
+//   403: the gateway is no open relay.
+// - A request from a carrier (TrunkRegistrations::trunkAt) is its trunk's
+//   and is not challenged; it goes to the subscriber its Request-URI names,
+//   and never back out: a Request-URI outside gets 404, as a number the
+//   gateway does not serve, so that two carriers cannot bounce a call
+//   through it.
 //
 // Owns every call; destroying it ends them without a word to the phones
 // (the stack goes down with it). Everything runs on libre's thread.
@@ -41,12 +50,14 @@
 #include <vector>
 
 #include "calls/Call.h"
+#include "calls/PenaltyBox.h"
 #include "registrar/Registrar.h"
 #include "sip/DialogHandler.h"
 #include "sip/Libre.h"
 #include "sip/Listeners.h"
 #include "sip/RequestHandler.h"
 #include "sip/RequestLog.h"
+#include "trunks/TrunkRegistrations.h"
 
 class Exchange;
 
@@ -68,6 +79,9 @@ class Calls final : public RequestHandler, public DialogHandler {
   // Starts libre's session layer on the stack, after the front-end's own
   // listener, so that the front-end sees every request first.
   bool start(sip& stack, std::string& error);
+  // Where outbound calls find trunks, and requests from carriers their
+  // trunk; before the first call. Borrowed: the trunks outlive the calls.
+  void useTrunks(TrunkRegistrations& trunks) { m_trunks = &trunks; }
   void limit(uint32_t maxCalls) { m_maxCalls = maxCalls; }
   // At shut-down: every call ends, its legs told (BYE, CANCEL or a final
   // answer) while the stack finishes.
@@ -113,6 +127,10 @@ class Calls final : public RequestHandler, public DialogHandler {
   // A request in a dialog: true when it was a re-INVITE or UPDATE of a
   // call here, and relayed (Call::relayInDialog).
   bool relayedInDialog(sip_msg const& request);
+  // Whether a location service answers for the Request-URI's host; the
+  // lookup's message in why when none does.
+  static bool served(Exchange& exchange, std::string& why);
+  void callOut(Exchange& exchange, std::string const& why, RefPtr<LS_IIdentity> caller);
   std::vector<Registrar::CallTarget> targetsOf(LS_IIdentity* identity) const;
   static uint32_t inviteTimeoutMs(LS_IIdentity const* caller);
   bool isGateway(Registrar::CallTarget const& target) const;
@@ -133,4 +151,6 @@ class Calls final : public RequestHandler, public DialogHandler {
   std::vector<sipsess*> m_released;
   tmr m_reap;
   Statistics m_statistics;
+  TrunkRegistrations* m_trunks = nullptr;
+  PenaltyBox m_penaltyBox;
 };
