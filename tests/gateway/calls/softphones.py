@@ -37,7 +37,12 @@ PASSWORDS = {"u1": "one-secret", "u3": "three-secret"}
 # natively; the gateway may run under qemu-user or AddressSanitizer.
 WAIT_S = 60
 STOP_S = 15
+# How long the first call of each pair stays up: the gateway sends a 200
+# again after 0.5 s and 1.5 s without an ACK (RFC 3261 timer G).
+HOLD_S = 2
 
+TIMESTAMP = re.compile(r"\d{4}-\d\d-\d\d \d\d:")
+START_LINE = re.compile(r"(SIP/2\.0 \d{3} |[A-Z]+ sips?:\S+ SIP/2\.0$)")
 STATE = re.compile(r"CallSession \[(0x[0-9a-f]+)\] moving from state (\w+) to (\w+)")
 
 
@@ -107,6 +112,9 @@ class Softphone:
                 "verify_server_cn=1",
                 "[rtp]",
                 "bind_address=127.0.0.1",
+                # Without a sound card a phone sends hardly any RTP; the
+                # calls end well before this.
+                "nortp_timeout=300",
                 "audio_rtp_port=%d" % free_rtp_port(),
                 "video_rtp_port=%d" % free_rtp_port(),
                 "[video]",
@@ -170,12 +178,45 @@ class Softphone:
         return set(int(port) for port in
                    re.findall(r"received \[\d+\] new bytes from \[\w+://127\.0\.0\.1:(\d+)\]", self.log()))
 
+    def received(self):
+        """The SIP messages this phone received, in order: (start line,
+        Call-ID, CSeq method). A read over TCP or TLS may hold several."""
+        messages = []
+        receiving = False
+        current = None
+        for line in self.log().split("\n"):
+            if TIMESTAMP.match(line):
+                receiving = "new bytes from" in line
+                current = None
+            elif receiving and START_LINE.match(line):
+                current = [line, None, None]
+                messages.append(current)
+            elif current and line.lower().startswith("call-id:"):
+                current[1] = line.split(":", 1)[1].strip()
+            elif current and line.lower().startswith("cseq:"):
+                current[2] = line.split()[-1]
+        return [tuple(message) for message in messages]
+
+    def await_ack(self, call_id):
+        deadline = time.monotonic() + WAIT_S
+        while time.monotonic() < deadline:
+            if any(start.startswith("ACK ") and each == call_id for start, each, _ in self.received()):
+                return
+            time.sleep(0.1)
+        raise Failure("%s: no ACK for the call %s (%s)" % (self.name, call_id, self.log_path))
+
     def calls(self):
-        """The states each call went through, in the order the calls began."""
-        sessions = {}
+        """The states each call went through, in the order the calls began.
+        A call begins in the state Idle; the next may reuse its session's
+        address."""
+        calls = []
+        current = {}
         for session, before, after in STATE.findall(self.log()):
-            sessions.setdefault(session, [before]).append(after)
-        return list(sessions.values())
+            if before == "LinphoneCallIdle" or session not in current:
+                current[session] = [before]
+                calls.append(current[session])
+            current[session].append(after)
+        return calls
 
     def await_state(self, index, state):
         deadline = time.monotonic() + WAIT_S
@@ -216,10 +257,9 @@ def call_twice(program, work, emulator, name, caller_transport, callee_transport
                       ["--calls", "relay", "--tls", "127.0.0.1:0", "--certificate", certificate, "--key", key])
     phones = []
     try:
-        ports = dict(re.findall(r"\b(udp|tcp|tls):127\.0\.0\.1:(\d+)", gateway.errors()))
-        callee = Softphone(work, name + ".u3", "u3", callee_transport, int(ports[callee_transport]), certificate)
+        callee = Softphone(work, name + ".u3", "u3", callee_transport, gateway.listening(callee_transport), certificate)
         phones.append(callee)
-        caller = Softphone(work, name + ".u1", "u1", caller_transport, int(ports[caller_transport]), certificate)
+        caller = Softphone(work, name + ".u1", "u1", caller_transport, gateway.listening(caller_transport), certificate)
         phones.append(caller)
         callee.await_registered()
         caller.await_registered()
@@ -234,6 +274,17 @@ def call_twice(program, work, emulator, name, caller_transport, callee_transport
             check("LinphoneCallIncomingReceived" in callee.calls()[index],
                   "the callee's phone never rang: %r" % callee.calls()[index])
             await_output(gateway, "INVITE sip:u3@127.0.0.1 lab/u3 200", index + 1)
+            # The ACK of each leg reaches its phone: the callee's through the
+            # gateway's dialog with it, the caller's taken by the gateway,
+            # which would otherwise send its 200 again every so often.
+            invites = [each for start, each, _ in callee.received() if start.startswith("INVITE ")]
+            callee.await_ack(invites[index])
+            if index == 0:
+                time.sleep(HOLD_S)
+                answers = [(each, method) for start, each, method in caller.received()
+                           if start.startswith("SIP/2.0 200 ") and method == "INVITE"]
+                check(len(answers) <= 2, "the caller got the 200 %d times: the gateway did not take its ACK"
+                      % len(answers))
             hanging_up.command("terminate")
             for side, phone in sides.items():
                 states = phone.await_state(index, "LinphoneCallReleased")
