@@ -12,8 +12,11 @@ its own on loopback, no video, no sound card (linphonec's "soundcard use
 files"), no STUN, ICE or UPnP. The callee answers by itself; its phone
 rings first (the caller sees 180). A call is up when both phones' logs
 (-d 6) show it in the state StreamsRunning: media set up from the SDP the
-gateway relayed. Each pair of phones places two calls, the first hung up by
-the caller, the second by the callee, and both phones must see each end.
+gateway relayed. Each leg's ACK must reach its end: the callee's phone
+logs the gateway's, and the gateway does not send the caller its 200 again
+and again while the first call stays up for a while. Each pair
+of phones places two calls, the first hung up by the caller, the second by
+the callee, and both phones must see each end.
 The TLS phone verifies the gateway's certificate, made here with openssl.
 """
 
@@ -281,10 +284,10 @@ def call_twice(program, work, emulator, name, caller_transport, callee_transport
             callee.await_ack(invites[index])
             if index == 0:
                 time.sleep(HOLD_S)
-                answers = [(each, method) for start, each, method in caller.received()
-                           if start.startswith("SIP/2.0 200 ") and method == "INVITE"]
-                check(len(answers) <= 2, "the caller got the 200 %d times: the gateway did not take its ACK"
-                      % len(answers))
+                # One retransmission may cross a slow ACK under an emulator.
+                answers = sum(1 for start, _, method in caller.received()
+                              if start.startswith("SIP/2.0 200 ") and method == "INVITE")
+                check(answers <= 2, "the caller got the 200 %d times: the gateway did not take its ACK" % answers)
             hanging_up.command("terminate")
             for side, phone in sides.items():
                 states = phone.await_state(index, "LinphoneCallReleased")
