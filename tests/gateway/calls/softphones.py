@@ -150,10 +150,14 @@ class Softphone:
             self.process = subprocess.Popen([shutil.which("linphonec"), "-c", self.config, "-d", "6"],
                                             stdin=subprocess.PIPE, stdout=log, stderr=subprocess.STDOUT, env=env,
                                             preexec_fn=die_with_parent)
-        self.command("soundcard use files")
-        self.command("autoanswer enable")
-        self.await_text("Using wav files instead of soundcard.", "no sound card")
-        self.await_text("Auto answer enabled.", "autoanswer")
+        try:
+            self.command("soundcard use files")
+            self.command("autoanswer enable")
+            self.await_text("Using wav files instead of soundcard.", "no sound card")
+            self.await_text("Auto answer enabled.", "autoanswer")
+        except (Failure, OSError):
+            self.stop()
+            raise
 
     def command(self, line):
         self.process.stdin.write((line + "\n").encode())
