@@ -62,6 +62,20 @@ class Gateway:
         self.kill()
         raise Failure("the gateway did not start: " + self.errors())
 
+    def listening(self, transport):
+        """The port of the gateway's first listener of transport (udp, tcp,
+        tls, ws, wss) on 127.0.0.1. The secure ones are told on lines of
+        their own, after the one the constructor waits for: wait for it."""
+        pattern = re.compile(r"^location-gateway: listening on .*\b%s:127\.0\.0\.1:(\d+)" % transport, re.M)
+        deadline = time.monotonic() + START_LIMIT_S
+        while True:
+            found = pattern.search(self.errors())
+            if found:
+                return int(found.group(1))
+            if time.monotonic() > deadline or self.process.poll() is not None:
+                raise Failure("the gateway does not listen on %s: %s" % (transport, self.errors()))
+            time.sleep(0.1)
+
     def errors(self):
         with open(self.err_path, errors="replace") as err:
             return err.read()
