@@ -288,6 +288,9 @@ void Call::onBranchProgress(sip_msg const* message, void* argument) {
 
 int Call::onBranchAnswer(sip_msg const* message, void* argument) {
   Branch& branch = *static_cast<Branch*>(argument);
+  // libre has just made the dialog, its target the 2xx's Contact, and
+  // sends the ACK on return: the flow must be the target before.
+  branch.call->followFlow(branch.session, branch.target.flow);
   if (!branch.call->m_winner)
     branch.call->m_answer.assign(reinterpret_cast<char const*>(mbuf_buf(message->mb)),
                                  mbuf_get_left(message->mb));
@@ -322,7 +325,6 @@ void Call::onBranchEstablished(sip_msg const* message, void* argument) {
   if (!answered)
     return call.end();
   call.m_state = State::ANSWERED;
-  call.followFlow(branch.session, branch.target.flow);
   call.m_calls.established(call);
 }
 

@@ -36,7 +36,14 @@
 // - A leg reached over a connection (TCP, TLS, WebSocket) or through NAT
 //   keeps being reached that way: the dialog's remote target is its
 //   Contact at the address the flow came from, as Kamailio's
-//   fix_nated_contact makes it, so that a BYE finds the phone.
+//   fix_nated_contact makes it, set the moment libre makes the dialog, so
+//   that the ACK of the 2xx, a re-INVITE and the BYE find the phone. The
+//   branch's INVITE reaches the flow through a Route header naming it
+//   (libre sends a dialog's first request where its first route points),
+//   which the phone, a user agent, ignores.
+// - libre's session layer writes a branch's Request-URI into its To as well:
+//   the callee sees its contact there, not its address of record. Phones
+//   match a request by its Request-URI and tags, not by its To URI.
 // - Either leg ending (BYE, CANCEL, a transport error, a timeout) ends the
 //   other: libre sends the BYE or the CANCEL.
 // - A call that leaves the gateway has one target, its Request-URI, and an

@@ -32,13 +32,14 @@ def free_port():
     return port
 
 
-def sipp(work, scenario, port, arguments=()):
-    """A SIPp phone playing scenario on port, started in the background."""
+def sipp(work, scenario, port, arguments=(), contact=None):
+    """A SIPp phone playing scenario on port, started in the background; its
+    Contact names port contact (its own by default)."""
     log = open(os.path.join(work, "%s-%d.sipp.log" % (scenario, port)), "wb")
     process = subprocess.Popen(
         ["timeout", str(PHONE_LIMIT_S), SIPP, "-sf", os.path.join(HERE, scenario + ".xml"), "-i", "127.0.0.1",
          "-p", str(port), "-m", "1", "-nostdin", "-trace_err", "-timeout", "%ds" % (PHONE_LIMIT_S - 5),
-         "-timeout_error"] + list(arguments),
+         "-timeout_error", "-key", "contact", str(contact or port)] + list(arguments),
         stdout=log, stderr=subprocess.STDOUT, cwd=work)
     log.close()
     return process
@@ -48,10 +49,10 @@ def finished(process, what):
     check(process.wait(PHONE_LIMIT_S) == 0, "%s: SIPp exit status %d" % (what, process.returncode))
 
 
-def register(work, gateway, user, q="1"):
+def register(work, gateway, user, q="1", contact=None):
     """A port whose phone is registered as user, nobody playing it yet."""
     port = free_port()
-    finished(sipp(work, "register", port, ["-s", user, "-key", "q", q, "127.0.0.1:%d" % gateway.port]),
+    finished(sipp(work, "register", port, ["-s", user, "-key", "q", q, "127.0.0.1:%d" % gateway.port], contact),
              "registering " + user)
     return port
 
@@ -68,8 +69,8 @@ def bound(port):
         probe.close()
 
 
-def phone(work, user, scenario, port, arguments=()):
-    process = sipp(work, scenario, port, arguments)
+def phone(work, user, scenario, port, arguments=(), contact=None):
+    process = sipp(work, scenario, port, arguments, contact)
     # A call to the phone before SIPp holds its port would fail at once.
     deadline = time.monotonic() + PHONE_LIMIT_S / 2
     while not bound(port) and process.poll() is None and time.monotonic() < deadline:
@@ -135,6 +136,14 @@ def held_resumed_and_hung_up(program, work, emulator):
         finished(callee, "callee")
         check(logged(gateway, "INVITE sip:u3@127.0.0.1:%d example.com/u3 inbound-profiles voip=wideband sip=trunking 200"
                      % gateway.port), "no 200 with u3's profiles in the request log")
+        # A phone behind NAT names a port nobody listens on: every request
+        # of the call (the ACK, the hold, the BYE) must take the way its
+        # REGISTER came.
+        unreachable = free_port()
+        callee = phone(work, "u6", "answer", register(work, gateway, "u6", contact=unreachable),
+                       contact=unreachable)
+        finished(call(work, gateway, "u6"), "caller of a phone behind NAT")
+        finished(callee, "phone behind NAT")
         gateway.stop()
     finally:
         gateway.kill()
