@@ -237,12 +237,13 @@ bool Call::send(Branch& branch) {
   std::string const user = contactUser(invite.from.uri.user);
   char const* route = branch.target.route.c_str();
   mbuf* const offer = bodyOf(invite);
-  int const error = sipsess_connect(
-      &branch.session, &m_calls.sessions(), branch.target.uri.c_str(), fromName.empty() ? nullptr : fromName.c_str(),
-      fromUri.c_str(), user.c_str(), branch.target.route.empty() ? nullptr : &route,
-      branch.target.route.empty() ? 0 : 1, contentType(invite).c_str(), offer,
-      m_route ? OutboundRoute::onChallenge : nullptr, m_route.get(), false, nullptr,
-      onBranchAnswer, onBranchProgress, onBranchEstablished, onBranchInfo, nullptr, onBranchClosed, &branch, nullptr);
+  int const error =
+      sipsess_connect(&branch.session, &m_calls.sessions(), branch.target.uri.c_str(),
+                      fromName.empty() ? nullptr : fromName.c_str(), fromUri.c_str(), user.c_str(),
+                      branch.target.route.empty() ? nullptr : &route, branch.target.route.empty() ? 0 : 1,
+                      contentType(invite).c_str(), offer, m_route ? OutboundRoute::onChallenge : nullptr,
+                      m_route.get(), false, nullptr, onBranchAnswer, onBranchProgress, onBranchEstablished,
+                      onBranchInfo, nullptr, onBranchClosed, &branch, nullptr);
   mem_deref(offer);
   if (error != 0) {
     branch.session = nullptr;

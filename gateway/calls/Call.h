@@ -181,7 +181,7 @@ class Call {
   std::vector<std::unique_ptr<Branch>> m_branches;
   Branch* m_winner = nullptr;  // the branch whose 2xx went to the caller
   std::vector<std::string> m_branchCallIds;
-  bool m_earlyMedia = false;   // a branch's early SDP went to the caller
+  bool m_earlyMedia = false;  // a branch's early SDP went to the caller
   uint16_t m_bestCode = 0;
   std::string m_bestReason;
   std::string m_answer;  // the winning branch's SDP

@@ -4,10 +4,10 @@
 
 #include "LS_ICall.h"
 #include "LS_IOutbound.h"
-#include "registrar/InboundFilter.h"
 #include "LS_IdentityResolution.h"
 #include "LS_ServiceResolution.h"
 #include "calls/OutboundRoute.h"
+#include "registrar/InboundFilter.h"
 #include "sip/Exchange.h"
 #include "sip/MonotonicClock.h"
 
@@ -180,11 +180,11 @@ bool Calls::served(Exchange& exchange, std::string& why) {
     if (LS_splitNameAddr(error, user, host, nameAddr).isFailure())
       return true;
     RefPtr<LS_ILocationService> service;
-    XCode const found =
-        settings.services.isEmpty()
-            ? LS_getLocationService(error, service, host, settings.localHostPorts, settings.imperative, nullptr)
-            : LS_getLocationService(error, service, host, settings.services, settings.localHostPorts,
-                                    settings.imperative, nullptr);
+    XCode const found = settings.services.isEmpty()
+                            ? LS_getLocationService(error, service, host, settings.localHostPorts,
+                                                    settings.imperative, nullptr)
+                            : LS_getLocationService(error, service, host, settings.services,
+                                                    settings.localHostPorts, settings.imperative, nullptr);
     why = error.str();
     return found.isSuccess();
   });
@@ -209,7 +209,8 @@ void Calls::callOut(Exchange& exchange, std::string const& why, RefPtr<LS_IIdent
                                                });
   if (!route->available())
     return exchange.answer(503, "Service Unavailable");
-  std::vector<Registrar::CallTarget> targets{Registrar::CallTarget{textOf(invite.ruri), route->route(), "", 1000}};
+  std::vector<Registrar::CallTarget> targets{
+      Registrar::CallTarget{textOf(invite.ruri), route->route(), "", 1000}};
   uint32_t const timeoutMs = exchange.clock().measure([&] { return inviteTimeoutMs(caller.get()); });
   std::string const result = exchange.result() + exchange.clock().measure([&] {
     return profilesOf(*caller, LS_IdentityFace::CALL_OUTBOUND, "outbound-profiles");

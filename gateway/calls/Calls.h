@@ -24,9 +24,10 @@
 //   with that answer's code, whatever part of the call decided it. Its
 //   result names the called identity, then the profiles its inbound call
 //   face names, as " inbound-profiles voip=V tone-set=T sip=S" (those set
-//   only, nothing when none is): the profiles are the call handling's
-//   business beyond this gateway, and the line is where an operator sees
-//   which applied.
+//   only, nothing when none is), and those of the caller's outbound call
+//   face as " outbound-profiles ..." when the caller is a subscriber: the
+//   profiles are the call handling's business beyond this gateway, and the
+//   line is where an operator sees which applied.
 // - In-dialog requests that libre's session layer takes (ACK, BYE, INFO,
 //   REFER) are left to it; re-INVITE and UPDATE of a call are relayed here.
 // - A call whose Request-URI is in no served domain (no location service
