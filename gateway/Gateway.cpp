@@ -26,12 +26,24 @@ Gateway::Gateway(ScriptSession& session, Settings settings)
       m_frontEnd(session, m_clock, m_redirector.sources()),
       m_replay(session, m_registrar, m_clock) {
   m_frontEnd.methods().add("REGISTER", m_registrar);
-  for (char const* method : {"INVITE", "MESSAGE", "SUBSCRIBE", "OPTIONS"})
-    m_frontEnd.methods().add(method, m_redirector);
+  if (m_settings.relayCalls) {
+    m_calls = std::make_unique<Calls>(m_registrar, m_frontEnd.listeners(), m_frontEnd.log());
+    m_calls->limit(m_settings.maxCalls);
+    m_frontEnd.methods().add("INVITE", *m_calls);
+    m_frontEnd.methods().add("CANCEL", *m_calls);
+    m_frontEnd.keepDialogs(*m_calls);
+  }
+  for (char const* method : {"INVITE", "MESSAGE", "SUBSCRIBE", "OPTIONS"}) {
+    pl name;
+    pl_set_str(&name, method);
+    if (!m_frontEnd.methods().find(name))
+      m_frontEnd.methods().add(method, m_redirector);
+  }
 }
 
 Gateway::~Gateway() {
   m_changes.reset();
+  m_calls.reset();
   m_frontEnd.close();
   m_trunks.reset();
 }
@@ -55,9 +67,13 @@ bool Gateway::start(std::string& error) {
   if (!m_frontEnd.start(m_settings.sip, error))
     return false;
   m_registrar.start(m_frontEnd.stack(), m_settings.expiry, m_settings.natPingSeconds);
+  if (m_calls && !m_calls->start(m_frontEnd.stack(), error))
+    return false;
   m_trunks = std::make_unique<TrunkRegistrations>(m_frontEnd.stack(), m_session, m_clock);
   m_trunks->useCaFile(m_settings.caFile);
   m_trunks->start();
+  if (m_calls)
+    m_calls->useTrunks(*m_trunks);
   std::vector<std::string> secure;
   if (!m_frontEnd.startSecure(m_settings.secure, secure, error))
     return false;
@@ -78,7 +94,8 @@ bool Gateway::startOperations(std::string& error) {
     m_autosave = std::make_unique<Autosave>(m_session, m_settings.autosave);
   if (!m_settings.control.empty()) {
     addScriptCommands(m_commands);
-    addGatewayCommands(m_commands, m_registrar, [this] { return statistics(); });
+    addGatewayCommands(
+        m_commands, m_registrar, [this] { return statistics(); }, m_calls.get());
     m_control = std::make_unique<ControlServer>(m_session, m_commands);
     followChanges();
     m_control->onLine([this] { beginChange(); },
@@ -110,6 +127,9 @@ void Gateway::shutDown() {
   m_control.reset();
   m_autosave.reset();
   m_trunks->stop();
+  // The calls end with a BYE or a CANCEL each, sent while the stack finishes.
+  if (m_calls)
+    m_calls->endAll();
   m_frontEnd.shutDown();
   if (m_store)
     m_store->close();
@@ -138,6 +158,17 @@ GatewayStatistics Gateway::statistics() const {
   statistics.failedAuthentications = m_registrar.failedAuthentications();
   statistics.bindings = m_registrar.bindingCount();
   statistics.bindingsDropped = m_registrar.bindingsDropped();
+  if (m_calls) {
+    Calls::Statistics const& calls = m_calls->statistics();
+    statistics.callsRelayed = true;
+    statistics.callsActive = calls.active;
+    statistics.callsSetUp = calls.setUp;
+    statistics.callsFailed = calls.failed;
+    for (uint64_t bound : Calls::setUpBoundsMs())
+      statistics.callSetUpBoundsSeconds.push_back(static_cast<double>(bound) / 1000.0);
+    statistics.callSetUpBuckets = calls.setUpBuckets;
+    statistics.callSetUpSeconds = calls.setUpSecondsSum;
+  }
   if (BindingStore const* const store = m_registrar.store()) {
     statistics.storeRowsRefused = store->rowsRefused();
     statistics.storeChangesDropped = store->changesDropped();

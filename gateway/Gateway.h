@@ -16,7 +16,8 @@
 //   sip/                      the stack, its transports, the table of handlers by method
 //   store/                    the bindings that outlive the process
 //   registrar/                REGISTER, and the store's rows put back into it
-//   redirect/ trunks/ calls/  the redirect server, the trunks' registrations, calls
+//   redirect/ trunks/         the redirect server, the trunks' registrations
+//   calls/                    calls relayed, to subscribers and out through trunks
 //   metrics/                  the statistics and their HTTP exposition
 //   control/                  the control socket and what a change there sets off
 //
@@ -45,6 +46,7 @@
 
 #include "CommandTable.h"
 #include "ScriptSession.h"
+#include "calls/Calls.h"
 #include "control/Autosave.h"
 #include "control/ControlServer.h"
 #include "control/ModelChanges.h"
@@ -85,6 +87,9 @@ class Gateway {
     std::string control;
     std::string autosave;
     std::string metrics;
+    // --calls relay (the default) or redirect, and --max-calls (0: none).
+    bool relayCalls = true;
+    uint32_t maxCalls = 0;
   };
 
   Gateway(ScriptSession& session, Settings settings);
@@ -127,6 +132,8 @@ class Gateway {
   SipFrontEnd m_frontEnd;
   BindingReplay m_replay;
   std::unique_ptr<TrunkRegistrations> m_trunks;
+  // --calls relay; on the stack after the front-end, ended before it.
+  std::unique_ptr<Calls> m_calls;
   std::unique_ptr<ModelChanges> m_changes;
   CommandTable m_commands;
   std::unique_ptr<Autosave> m_autosave;

@@ -70,6 +70,12 @@ char const kUsage[] =
     "                fresh challenge with stale=true at another, and after\n"
     "                a restart; made (mode 0600) when missing; default a\n"
     "                key of the process's own\n"
+    "  --calls MODE  relay (the default): the gateway places the calls to its\n"
+    "                subscribers itself and relays the signalling between\n"
+    "                the phones (the media go from phone to phone); redirect:\n"
+    "                302 to where the subscriber is registered\n"
+    "  --max-calls N  at most N calls relayed at once; beyond, 503 with\n"
+    "                Retry-After (default no limit)\n"
     "  --redirect-from CIDR  answer INVITE and the other redirected requests\n"
     "                only from this network (repeatable; default any source)\n"
     "  --source-rate N  refuse a source address sending more than N requests\n"
@@ -159,6 +165,11 @@ bool parse(int argc, char** argv, Options& options) {
       settings.secure.allowVulnerableWebSocket = true;
     else if (argument == "--redirect-from" && i + 1 < argc && SourceFilter().allow(argv[i + 1]))
       settings.redirectFrom.push_back(argv[++i]);
+    else if (argument == "--calls" && i + 1 < argc &&
+             (std::strcmp(argv[i + 1], "relay") == 0 || std::strcmp(argv[i + 1], "redirect") == 0))
+      settings.relayCalls = std::strcmp(argv[++i], "relay") == 0;
+    else if (argument == "--max-calls" && i + 1 < argc && seconds(argv[++i], settings.maxCalls))
+      continue;
     else if (argument == "--source-rate" && i + 1 < argc &&
              (settings.sourceRate = std::strtoul(argv[++i], nullptr, 10)) > 0)
       continue;

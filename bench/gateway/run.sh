@@ -180,7 +180,7 @@ start_server() { # TARGET
   case $1 in
     gateway)
       # SIPp answers only an MD5 first challenge.
-      "$gateway" --listen 127.0.0.1:0 --store "$store" --statistics --digest MD5 subscribers.script >gateway.out 2>gateway.err &
+      "$gateway" --listen 127.0.0.1:0 --store "$store" --calls redirect --statistics --digest MD5 subscribers.script >gateway.out 2>gateway.err &
       server_pid=$!
       while [ -z "$address" ]; do
         if ! kill -0 "$server_pid" 2>/dev/null || [ $((SECONDS - start)) -gt 600 ]; then

@@ -43,7 +43,8 @@ void printBindings(ScriptSession& session, Registrar const& registrar, Arguments
 
 void addGatewayCommands(CommandTable& table,
                         Registrar const& registrar,
-                        std::function<GatewayStatistics()> statistics) {
+                        std::function<GatewayStatistics()> statistics,
+                        Calls const* calls) {
   table.add("statistics", "what the gateway answered, its bindings and trunks, the library's CPU share",
             [statistics = std::move(statistics)](ScriptSession& session, Arguments const&) {
               session.output() << statistics().text();
@@ -55,5 +56,15 @@ void addGatewayCommands(CommandTable& table,
   table.add("bindings <service> <identity>", "the contacts one identity registered here",
             [&registrar](ScriptSession& session, Arguments const& arguments) {
               printBindings(session, registrar, arguments);
+            });
+  if (!calls)
+    return;
+  table.add("calls", "the calls relayed now, with both legs and their state",
+            [calls](ScriptSession& session, Arguments const&) {
+              std::vector<std::string> const lines = calls->describe();
+              if (lines.empty())
+                session.output() << "no calls\n";
+              for (std::string const& line : lines)
+                session.output() << line << "\n";
             });
 }

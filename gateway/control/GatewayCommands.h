@@ -7,6 +7,9 @@
 //   bindings [<service> [<identity>]]
 //               registered contacts with their remaining lifetime, Call-ID
 //               and source
+//   calls       the calls relayed now (--calls relay), one line each: the
+//               caller, the Request-URI, the state and, once answered,
+//               the contact that answered
 //
 // The handlers read the registrar and take a fresh reading of the
 // statistics for each question; they borrow the registrar, and the table
@@ -16,9 +19,11 @@
 #include <functional>
 
 #include "CommandTable.h"
+#include "calls/Calls.h"
 #include "metrics/GatewayStatistics.h"
 #include "registrar/Registrar.h"
 
 void addGatewayCommands(CommandTable& table,
                         Registrar const& registrar,
-                        std::function<GatewayStatistics()> statistics);
+                        std::function<GatewayStatistics()> statistics,
+                        Calls const* calls);

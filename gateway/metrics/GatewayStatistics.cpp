@@ -23,6 +23,12 @@ std::string GatewayStatistics::text() const {
   text += "trunks: " + std::to_string(trunks.size()) + ", registered: " + std::to_string(registered) + "\n";
   for (Trunk const& trunk : trunks)
     text += "  " + trunk.path + ": " + (trunk.registered ? "registered" : "not registered") + "\n";
+  if (callsRelayed) {
+    text +=
+        "calls: " + std::to_string(callsActive) + " in progress, " + std::to_string(callsSetUp) + " set up\n";
+    for (auto const& entry : callsFailed)
+      text += "  failed " + std::to_string(entry.first) + ": " + std::to_string(entry.second) + "\n";
+  }
   char line[128];
   std::snprintf(line, sizeof line, "CPU %.3f s, in the library %.3f s (%.1f%%)\n", cpuSeconds, librarySeconds,
                 cpuSeconds > 0 ? 100.0 * librarySeconds / cpuSeconds : 0.0);

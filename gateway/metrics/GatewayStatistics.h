@@ -31,6 +31,20 @@ struct GatewayStatistics {
   // The library's process-wide count of registered contacts.
   int64_t registeredContacts = 0;
   std::vector<Trunk> trunks;
+  // Relayed calls (--calls relay): in progress now, answered since the
+  // start, and failed by the final code the caller got, once the gateway
+  // had placed them (a call refused before any branch, 480 or 403, shows
+  // in answers only). Their set-up
+  // times (INVITE to the 2xx sent back) as a histogram: callSetUpBuckets[i]
+  // counts the calls within callSetUpBoundsSeconds[i] and above the bound
+  // before; the last counts the rest.
+  bool callsRelayed = false;
+  uint64_t callsActive = 0;
+  uint64_t callsSetUp = 0;
+  std::map<uint16_t, uint64_t> callsFailed;
+  std::vector<double> callSetUpBoundsSeconds;
+  std::vector<uint64_t> callSetUpBuckets;
+  double callSetUpSeconds = 0;
   double cpuSeconds = 0;
   double librarySeconds = 0;
 

@@ -65,6 +65,30 @@ std::string render(GatewayStatistics const& statistics) {
   sample(out, "trunks", "", static_cast<double>(statistics.trunks.size()));
   family(out, "trunks_registered", "gauge", "Trunks registered now.");
   sample(out, "trunks_registered", "", static_cast<double>(registered));
+  if (statistics.callsRelayed) {
+    family(out, "calls_active", "gauge", "Calls relayed now.");
+    sample(out, "calls_active", "", static_cast<double>(statistics.callsActive));
+    family(out, "calls_set_up_total", "counter", "Calls answered and relayed to their caller.");
+    sample(out, "calls_set_up_total", "", static_cast<double>(statistics.callsSetUp));
+    family(out, "calls_failed_total", "counter", "Calls that failed, by the final code their caller got.");
+    for (auto const& entry : statistics.callsFailed)
+      sample(out, "calls_failed_total", "{code=\"" + std::to_string(entry.first) + "\"}",
+             static_cast<double>(entry.second));
+    family(out, "call_setup_seconds", "histogram", "Time from a call's INVITE to the answer sent back.");
+    uint64_t cumulative = 0;
+    for (size_t i = 0; i < statistics.callSetUpBuckets.size(); ++i) {
+      cumulative += statistics.callSetUpBuckets[i];
+      char bound[32];
+      if (i < statistics.callSetUpBoundsSeconds.size())
+        std::snprintf(bound, sizeof bound, "%g", statistics.callSetUpBoundsSeconds[i]);
+      else
+        std::snprintf(bound, sizeof bound, "+Inf");
+      sample(out, "call_setup_seconds_bucket", std::string("{le=\"") + bound + "\"}",
+             static_cast<double>(cumulative));
+    }
+    sample(out, "call_setup_seconds_sum", "", statistics.callSetUpSeconds);
+    sample(out, "call_setup_seconds_count", "", static_cast<double>(cumulative));
+  }
   family(out, "cpu_seconds_total", "counter", "CPU time of the gateway's event loop.");
   sample(out, "cpu_seconds_total", "", statistics.cpuSeconds);
   family(out, "library_cpu_seconds_total", "counter", "CPU time spent inside the location library's calls.");

@@ -5,6 +5,7 @@
 
 #include "CBlob.h"
 #include "LS_IRegistrationInbound.h"
+#include "registrar/FaceContacts.h"
 #include "registrar/InboundFilter.h"
 #include "sip/Exchange.h"
 
@@ -37,20 +38,9 @@ void Redirector::handle(Exchange& exchange) {
   if (InboundFilter::refuses(exchange, *identity, LS_IdentityFace::CALL_INBOUND))
     return;
   std::vector<Found> found;
-  exchange.clock().measure([&] {
-    RefPtr<LS_IRegistrationInbound> face;
-    LS_getFaceIf(identity.get(), LS_IdentityFace::REGISTRATION_INBOUND, face);
-    unsigned int const count = face ? face->getNumberOfContacts() : 0;
-    for (unsigned int i = 0; i < count && i < kMaximumContacts; ++i) {
-      String callId, context, provider;
-      CNameAddr contact;
-      CHostPort received;
-      unsigned int priority = 0;
-      unsigned int expires = 0;
-      if (face->getContact(i, callId, contact, received, context, provider, priority, expires).isSuccess())
-        found.push_back(Found{contact, !callId.isEmpty(), priority});
-    }
-  });
+  for (FaceContact const& each :
+       exchange.clock().measure([&] { return faceContacts(identity.get(), kMaximumContacts); }))
+    found.push_back(Found{each.contact, !each.callId.empty(), each.priority});
   // Static contacts carry no Call-ID and stay in front.
   std::stable_sort(found.begin(), found.end(), [](Found const& a, Found const& b) {
     if (a.registered != b.registered)

@@ -19,6 +19,8 @@ namespace {
 // passed to the library: more is an attack, not a phone.
 constexpr unsigned int kMaximumAuthorizations = 8;
 constexpr size_t kMaximumUserName = 256;
+// A longer From is refused rather than cut, as a longer Request-URI is.
+constexpr size_t kMaximumUri = 1024;
 
 template <class Visit>
 void forEachHeader(sip_msg const& message, sip_hdrid id, Visit visit) {
@@ -95,6 +97,21 @@ bool hasCredentials(sip_msg const& message) {
   return found;
 }
 
+// What a challenger sends and where the answer to it comes.
+struct ChallengeForm {
+  uint16_t code;
+  char const* reason;
+  char const* header;
+  sip_hdrid credentials;
+};
+
+ChallengeForm const& formOf(Authenticator::Challenger challenger) {
+  static ChallengeForm const kRegistrar{401, "Unauthorized", "WWW-Authenticate", SIP_HDR_AUTHORIZATION};
+  static ChallengeForm const kProxy{407, "Proxy Authentication Required", "Proxy-Authenticate",
+                                    SIP_HDR_PROXY_AUTHORIZATION};
+  return challenger == Authenticator::Challenger::PROXY ? kProxy : kRegistrar;
+}
+
 std::string addressOf(sa const& source) {
   char text[64];
   re_snprintf(text, sizeof text, "%j port %u", &source, static_cast<unsigned int>(sa_port(&source)));
@@ -114,17 +131,20 @@ bool Authenticator::refuseHeldSource(Exchange& exchange) {
 
 Authenticator::Admission Authenticator::admit(Exchange& exchange,
                                               LS_IIdentity* identity,
-                                              CNameAddr const& to) {
-  followChallenges(exchange);
+                                              CNameAddr const& named,
+                                              Challenger challenger) {
+  if (challenger == Challenger::REGISTRAR)
+    followChallenges(exchange);
   String error;
-  Outcome const quick = evaluate(exchange.request(), nullptr, [&](String const& realm, String const& user) {
-    Vector<String> passwords;
-    m_clock.measure([&] {
-      LS_getInboundAuthenticationResponse(error, passwords, identity, to, LS_AuthenticationProtocol::HTTP,
-                                          realm, user, nullptr);
-    });
-    return passwords;
-  });
+  Outcome const quick =
+      evaluate(exchange.request(), challenger, nullptr, [&](String const& realm, String const& user) {
+        Vector<String> passwords;
+        m_clock.measure([&] {
+          LS_getInboundAuthenticationResponse(error, passwords, identity, named,
+                                              LS_AuthenticationProtocol::HTTP, realm, user, nullptr);
+        });
+        return passwords;
+      });
   if (quick.accepted)
     return quick.repeated ? Admission::REPEATED : Admission::ACCEPTED;
   Vector<LS_ProtocolRealm> realms;
@@ -147,7 +167,7 @@ Authenticator::Admission Authenticator::admit(Exchange& exchange,
   });
   if (service && m_realmsByService.count(service.get()) == 0)
     m_realmsByService.emplace(service.get(), names);
-  return check(exchange, names, [&](String const& realm, String const& user) {
+  return check(exchange, challenger, names, [&](String const& realm, String const& user) {
     Vector<String> passwords;
     auto const found = std::find_if(realms.begin(), realms.end(), [&](LS_ProtocolRealm const& candidate) {
       return candidate.realm == realm;
@@ -155,21 +175,22 @@ Authenticator::Admission Authenticator::admit(Exchange& exchange,
     if (found == realms.end())
       return passwords;
     m_clock.measure([&] {
-      LS_getInboundAuthenticationResponse(error, passwords, identity, to, found->protocol, realm, user,
+      LS_getInboundAuthenticationResponse(error, passwords, identity, named, found->protocol, realm, user,
                                           nullptr);
     });
     return passwords;
   });
 }
 
-void Authenticator::refuseUnknown(Exchange& exchange, CNameAddr const& to) {
+RefPtr<LS_ILocationService> Authenticator::serviceOf(Exchange& exchange,
+                                                     CNameAddr const& named,
+                                                     CHostPort& host) {
   ScriptSession::StackSettings const& stack = exchange.session().stack();
   String error;
   String user;
-  CHostPort host;
   RefPtr<LS_ILocationService> service;
   m_clock.measure([&] {
-    if (LS_splitNameAddr(error, user, host, to).isFailure())
+    if (LS_splitNameAddr(error, user, host, named).isFailure())
       return;
     if (stack.services.isEmpty())
       LS_getLocationService(error, service, host, stack.localHostPorts, stack.imperative,
@@ -178,15 +199,55 @@ void Authenticator::refuseUnknown(Exchange& exchange, CNameAddr const& to) {
       LS_getLocationService(error, service, host, stack.services, stack.localHostPorts, stack.imperative,
                             exchange.session().locationMaster());
   });
+  return service;
+}
+
+void Authenticator::refuseUnknown(Exchange& exchange, CNameAddr const& named, Challenger challenger) {
+  CHostPort host;
+  RefPtr<LS_ILocationService> const service = serviceOf(exchange, named, host);
   if (!service)
     return exchange.answer(404, "Not Found");
-  auto const known = m_realmsByService.find(service.get());
+  challengeUnknown(exchange, *service, host, challenger);
+}
+
+void Authenticator::challengeUnknown(Exchange& exchange,
+                                     LS_ILocationService const& service,
+                                     CHostPort const& host,
+                                     Challenger challenger) {
+  auto const known = m_realmsByService.find(&service);
   std::vector<std::string> const realms =
       known != m_realmsByService.end() ? known->second : std::vector<std::string>{host.GetHost().c_str()};
-  check(exchange, realms, [](String const&, String const&) { return Vector<String>(); });
+  check(exchange, challenger, realms, [](String const&, String const&) { return Vector<String>(); });
+}
+
+bool Authenticator::admitCaller(Exchange& exchange, RefPtr<LS_IIdentity>& caller) {
+  caller = nullptr;
+  if (refuseHeldSource(exchange))
+    return false;
+  pl const& from = exchange.request().from.auri;
+  CNameAddr named;
+  if (from.l > kMaximumUri || !named.Parse(from.p, from.l)) {
+    exchange.answer(400, "Bad From");
+    return false;
+  }
+  CHostPort host;
+  RefPtr<LS_ILocationService> const service = serviceOf(exchange, named, host);
+  if (!service)
+    return true;
+  String error;
+  RefPtr<LS_IIdentity> identity = m_clock.measure([&] { return exchange.session().resolve(error, named); });
+  if (!identity) {
+    challengeUnknown(exchange, *service, host, Challenger::PROXY);
+    return false;
+  }
+  if (admit(exchange, identity.get(), named, Challenger::PROXY) == Admission::REFUSED)
+    return false;
+  caller = std::move(identity);
+  return true;
 }
 
 Authenticator::Outcome Authenticator::evaluate(sip_msg const& message,
+                                               Challenger challenger,
                                                std::vector<std::string> const* realms,
                                                Passwords const& passwordsOf) {
   uint64_t const now = MonotonicClock::nowMs();
@@ -194,7 +255,7 @@ Authenticator::Outcome Authenticator::evaluate(sip_msg const& message,
   std::string const source = nonceSourceOf(message);
   unsigned int looked = 0;
   Outcome outcome;
-  forEachHeader(message, SIP_HDR_AUTHORIZATION, [&](sip_hdr const& header) {
+  forEachHeader(message, formOf(challenger).credentials, [&](sip_hdr const& header) {
     if (++looked > kMaximumAuthorizations)
       return false;
     DigestResponse response;
@@ -254,16 +315,17 @@ Authenticator::Outcome Authenticator::evaluate(sip_msg const& message,
 }
 
 Authenticator::Admission Authenticator::check(Exchange& exchange,
+                                              Challenger challenger,
                                               std::vector<std::string> const& realms,
                                               Passwords const& passwordsOf) {
-  Outcome const outcome = evaluate(exchange.request(), &realms, passwordsOf);
+  Outcome const outcome = evaluate(exchange.request(), challenger, &realms, passwordsOf);
   if (outcome.accepted)
     return outcome.repeated ? Admission::REPEATED : Admission::ACCEPTED;
   if (outcome.failure) {
     fail(exchange, outcome.user, outcome.failure);
     return Admission::REFUSED;
   }
-  challenge(exchange, realms, outcome.stale);
+  challenge(exchange, challenger, realms, outcome.stale);
   return Admission::REFUSED;
 }
 
@@ -288,7 +350,11 @@ void Authenticator::followChallenges(Exchange& exchange) {
             << std::endl;
 }
 
-void Authenticator::challenge(Exchange& exchange, std::vector<std::string> const& realms, bool stale) {
+void Authenticator::challenge(Exchange& exchange,
+                              Challenger challenger,
+                              std::vector<std::string> const& realms,
+                              bool stale) {
+  ChallengeForm const& form = formOf(challenger);
   uint64_t const now = WallClock::nowMs();
   std::string const source = nonceSourceOf(exchange.request());
   std::string challenges;
@@ -297,11 +363,11 @@ void Authenticator::challenge(Exchange& exchange, std::vector<std::string> const
     pl_set_str(&name, realm.c_str());
     std::string const nonce = m_nonces.make(name, exchange.request().callid, source, now);
     for (DigestAlgorithm algorithm : m_offered)
-      challenges += "WWW-Authenticate: " + digestChallenge(name, nonce, algorithm, stale) + "\r\n";
+      challenges += std::string(form.header) + ": " + digestChallenge(name, nonce, algorithm, stale) + "\r\n";
   }
-  if (m_offered.front() == DigestAlgorithm::SHA256)
+  if (challenger == Challenger::REGISTRAR && m_offered.front() == DigestAlgorithm::SHA256)
     m_unanswered.challenged(registrationOf(exchange.request()), exchange.request().cseq.num);
-  exchange.answer(401, "Unauthorized", challenges);
+  exchange.answer(form.code, form.reason, challenges);
 }
 
 void Authenticator::fail(Exchange& exchange, pl const& user, char const* reason) {

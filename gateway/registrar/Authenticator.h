@@ -1,8 +1,10 @@
 // Authenticator: whether a REGISTER may change the bindings of the identity
-// its To names, answering 401 or 403 itself when not. The library says which
-// realms an identity is challenged in and which passwords answer them; the
-// digest arithmetic is DigestAuthentication's, the nonces NonceGenerator's
-// and NonceTable's. Nothing here touches a binding.
+// its To names, answering 401 or 403 itself when not, and the same for a
+// call from the identity its From names, as a proxy answers (407). The
+// library says which realms an identity is challenged in and which
+// passwords answer them; the digest arithmetic is DigestAuthentication's,
+// the nonces NonceGenerator's and NonceTable's. Nothing here touches a
+// binding or a call.
 //
 // Decisions, with their reasons:
 // - Credentials the library takes for the realm they name (HTTP digest) are
@@ -66,8 +68,36 @@
 //   is bound to it, so a forged UDP source with a nonce obtained elsewhere
 //   gets a challenge, and cannot set off the hold of the address it forges
 //   (a site's NAT address, and with it every phone behind).
+// - A call (admitCaller) is from a subscriber when its From names a user of
+//   a domain a location service serves, found as for a REGISTER's
+//   Request-URI; only such a caller is challenged, as a proxy challenges,
+//   under every rule above but the SHA-256 warning, which follows
+//   registrations only. Any other caller (a carrier, an outside phone) is
+//   not: it may call subscribers only, which Calls sees to. A location
+//   service marked as the default domain serves every host: with one,
+//   every caller, a carrier's included, is taken for a subscriber.
+// - An identity the library does not challenge calls without credentials
+//   when it could register without them (it or its group has an
+//   inbound-registration face): whoever may register as it gets its calls
+//   already, and calling in its name gives them no more. Any other gets
+//   403: a trunk that only registers upstream would otherwise lend its
+//   name, and the way out its outbound call face gives, to anyone.
+// - An INVITE admitted as REPEATED (the same one again from its source,
+//   moments after) is admitted as the first was, and answered as it was:
+//   one that set up a call never gets here (Calls, or libre's transaction
+//   once the call is over, takes it first), so this is one answered
+//   statelessly before any call (480, 482, 488) whose answer was lost, and
+//   a fresh challenge would turn a lost answer into another round trip.
+// - A source held for its failures gets 403 for every INVITE, before any
+//   lookup, as for every REGISTER: the hold spares the gateway a guesser's
+//   lookups, and telling its calls apart by the From they name would take
+//   the lookup the hold spares.
+// - A From the library cannot read (or longer than 1 KiB) gets 400: it
+//   cannot be told a subscriber or not, and the callee's phone, which sees
+//   it, might read a subscriber in it.
 //
-// Owned by the Registrar; everything runs on libre's thread.
+// Owned by the Registrar, shared with Calls (one nonce table, one failure
+// count, one hold); everything runs on libre's thread.
 #pragma once
 
 #include <functional>
@@ -77,6 +107,8 @@
 
 #include "CNameAddr.h"
 #include "LS_IIdentity.h"
+#include "LS_ILocationService.h"
+#include "RefPtr.h"
 #include "String.h"
 #include "Vector.h"
 #include "registrar/DigestAuthentication.h"
@@ -113,20 +145,30 @@ class Authenticator {
 
   // True, after answering 403, when the request's source is held.
   bool refuseHeldSource(Exchange& exchange);
+  // Who asks for the credentials (RFC 3261 sections 22.2 and 22.3): the
+  // registrar answers 401 with WWW-Authenticate and reads Authorization,
+  // a proxy (the gateway placing a call) 407 with Proxy-Authenticate and
+  // Proxy-Authorization. Nothing else differs, but that only a registration
+  // is followed for the SHA-256 warning.
+  enum class Challenger { REGISTRAR, PROXY };
   // What admit() makes of a request. REPEATED: credentials already used by
   // this very request, from the same source, moments ago; the registrar
   // answers it as the retransmission it is and applies nothing.
   enum class Admission { REFUSED, ACCEPTED, REPEATED };
-  // Whether identity, which to denotes, may register with this request;
-  // REFUSED after answering it.
-  Admission admit(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& to);
-  // Answers a REGISTER whose To (to, parsed) denotes no identity.
-  void refuseUnknown(Exchange& exchange, CNameAddr const& to);
+  // Whether identity, which named (the To of a REGISTER, the From of a
+  // call) denotes, may act with this request; REFUSED after answering it.
+  Admission admit(Exchange& exchange, LS_IIdentity* identity, CNameAddr const& named, Challenger challenger);
+  // Answers a request whose named (parsed) denotes no identity.
+  void refuseUnknown(Exchange& exchange, CNameAddr const& named, Challenger challenger);
+  // Whether the INVITE's caller may call, answering it when not. caller:
+  // the identity its From denotes once authenticated, null for an outside
+  // caller.
+  bool admitCaller(Exchange& exchange, RefPtr<LS_IIdentity>& caller);
 
  private:
   // The passwords that answer the realm for the user.
   using Passwords = std::function<Vector<String>(String const& realm, String const& user)>;
-  // What the request's Authorization headers come to.
+  // What the request's credentials headers come to.
   struct Outcome {
     bool accepted = false;
     bool repeated = false;          // accepted as a retransmission
@@ -135,16 +177,33 @@ class Authenticator {
     pl user{};                      // whose it was
   };
 
-  // The first Authorization header with an authentic nonce for one of the
-  // realms (for any realm when realms is null) checked, and its nonce used
-  // when it passes. Answers nothing, logs nothing: a request may be
-  // evaluated again with the realms after failing without them.
+  // The first credentials header (the challenger's: Authorization or
+  // Proxy-Authorization) with an authentic nonce for one of the realms
+  // (for any realm when realms is null) checked, and its nonce used when it
+  // passes. Answers nothing, logs nothing: a request may be evaluated again
+  // with the realms after failing without them.
   Outcome evaluate(sip_msg const& message,
+                   Challenger challenger,
                    std::vector<std::string> const* realms,
                    Passwords const& passwordsOf);
-  // The evaluation against realms, answering 401 or 403 when it does not pass.
-  Admission check(Exchange& exchange, std::vector<std::string> const& realms, Passwords const& passwords);
-  void challenge(Exchange& exchange, std::vector<std::string> const& realms, bool stale);
+  // The evaluation against realms, answering the challenge or 403 when it
+  // does not pass.
+  Admission check(Exchange& exchange,
+                  Challenger challenger,
+                  std::vector<std::string> const& realms,
+                  Passwords const& passwords);
+  void challenge(Exchange& exchange,
+                 Challenger challenger,
+                 std::vector<std::string> const& realms,
+                 bool stale);
+  // The location service serving the host named (set from it); null when
+  // none does.
+  RefPtr<LS_ILocationService> serviceOf(Exchange& exchange, CNameAddr const& named, CHostPort& host);
+  // The challenge for a user of service that no identity answers.
+  void challengeUnknown(Exchange& exchange,
+                        LS_ILocationService const& service,
+                        CHostPort const& host,
+                        Challenger challenger);
   // Notes whether the request answers its registration's last challenge,
   // and warns when it starts over instead.
   void followChallenges(Exchange& exchange);

@@ -34,8 +34,13 @@ bool NatTraversal::natedTarget(pl const& contactUri,
   bool const connection = transport != SIP_TRANSP_UDP;
   if (!isUnreachable(host) || sa_cmp(&host, &source, connection ? SA_ADDR : SA_ALL))
     return false;
+  return atSource(contactUri, source, target);
+}
+
+bool NatTraversal::atSource(pl const& contactUri, sa const& source, std::string& target) {
+  uri contact;
   char address[64];
-  if (sa_ntop(&source, address, sizeof address) != 0)
+  if (uri_decode(&contact, &contactUri) != 0 || sa_ntop(&source, address, sizeof address) != 0)
     return false;
   pl_set_str(&contact.host, address);
   contact.af = sa_af(&source);
@@ -46,4 +51,19 @@ bool NatTraversal::natedTarget(pl const& contactUri,
   target = text;
   mem_deref(text);
   return true;
+}
+
+std::string NatTraversal::flowTarget(pl const& contactUri, sa const& source, sip_transp transport) {
+  std::string target;
+  if (!atSource(contactUri, source, target))
+    return target;
+  // The transport the flow runs over, whatever the Contact said.
+  pl value;
+  pl_set_str(&value, target.c_str());
+  uri parsed;
+  pl transportParameter;
+  if (uri_decode(&parsed, &value) == 0 &&
+      msg_param_decode(&parsed.params, "transport", &transportParameter) != 0)
+    target += sip_transp_param(transport);
+  return target;
 }

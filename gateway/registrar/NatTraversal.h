@@ -37,4 +37,12 @@ bool isUnreachable(sa const& address);
 // false (target untouched) when it is to be used as it is.
 bool natedTarget(pl const& contactUri, sa const& source, sip_transp transport, std::string& target);
 
+// The contact URI with its host and port replaced by source's.
+bool atSource(pl const& contactUri, sa const& source, std::string& target);
+
+// Where in-dialog requests reach a phone over the flow it came on: the
+// contact URI at source, with the flow's transport when the URI names
+// none. Empty when the URI cannot be read.
+std::string flowTarget(pl const& contactUri, sa const& source, sip_transp transport);
+
 }  // namespace NatTraversal

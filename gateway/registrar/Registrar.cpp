@@ -5,9 +5,11 @@
 #include <iostream>
 #include <vector>
 
+#include "CBlob.h"
 #include "LS_ILocationService.h"
 #include "LS_IdentityResolution.h"
 #include "LS_IdentityType.h"
+#include "registrar/FaceContacts.h"
 #include "registrar/InboundFilter.h"
 #include "registrar/NatTraversal.h"
 #include "registrar/SipUriComparison.h"
@@ -72,12 +74,13 @@ void Registrar::handle(Exchange& exchange) {
   RefPtr<LS_IIdentity> const resolved = exchange.resolveOrAnswer(exchange.request().to.auri, to, false);
   if (!resolved) {
     if (!exchange.answered())
-      m_authenticator.refuseUnknown(exchange, to);
+      m_authenticator.refuseUnknown(exchange, to, Authenticator::Challenger::REGISTRAR);
     return;
   }
   if (InboundFilter::refuses(exchange, *resolved, LS_IdentityFace::REGISTRATION_INBOUND))
     return;
-  Authenticator::Admission const admission = m_authenticator.admit(exchange, resolved.get(), to);
+  Authenticator::Admission const admission =
+      m_authenticator.admit(exchange, resolved.get(), to, Authenticator::Challenger::REGISTRAR);
   if (admission == Authenticator::Admission::REFUSED)
     return;
   bool created = false;
@@ -657,4 +660,38 @@ void Registrar::onPingsUnanswered(void const* binding, void* argument) {
   Registrar& registrar = *static_cast<Registrar*>(argument);
   std::string const reason = std::to_string(NatPinger::kMisses) + " NAT pings unanswered";
   registrar.lose(*const_cast<Binding*>(static_cast<Binding const*>(binding)), reason.c_str());
+}
+
+std::vector<Registrar::CallTarget> Registrar::callTargets(LS_IIdentity* identity) const {
+  std::vector<CallTarget> targets;
+  auto const held = m_bindings.find(identity);
+  for (FaceContact const& found : m_clock.measure([&] { return faceContacts(identity, kMaximumBindings); })) {
+    CBlob text;
+    found.contact.Serialize(text);
+    // "<uri>" or "display <uri>": the URI holds no angle bracket.
+    std::string uri(reinterpret_cast<char const*>(text.GetData()), text.GetSize());
+    uri = uri.substr(uri.rfind('<') + 1);
+    uri.erase(uri.rfind('>'));
+    CallTarget target{uri, "", "", found.callId.empty() ? ContactHeader::kNoQ : found.priority};
+    Binding const* binding = nullptr;
+    if (!found.callId.empty() && held != m_bindings.end())
+      for (auto const& each : held->second.all)
+        if (each->contact == found.contact && each->callId == found.callId)
+          binding = each.get();
+    if (binding) {
+      target.uri = binding->uri;
+      pl registered;
+      pl_set_str(&registered, binding->uri.c_str());
+      std::string nated;
+      if (binding->transport != SIP_TRANSP_UDP ||
+          NatTraversal::natedTarget(registered, binding->source, binding->transport, nated)) {
+        char route[96];
+        re_snprintf(route, sizeof route, "sip:%J%s", &binding->source, sip_transp_param(binding->transport));
+        target.route = route;
+        target.flow = NatTraversal::flowTarget(registered, binding->source, binding->transport);
+      }
+    }
+    targets.push_back(std::move(target));
+  }
+  return targets;
 }

@@ -152,6 +152,21 @@ class Registrar final : public RequestHandler {
   // service. Bindings of identities that remain are kept as they are.
   void dropRemoved(std::vector<LS_IIdentity const*> const& removed, bool checkAll);
 
+  // Where a call to an identity goes: each contact in effect on its face,
+  // the static ones as configured, the registered ones with the flow they
+  // registered on. route is empty when the URI itself is the way in;
+  // otherwise it names the flow: the connection (TCP, TLS, WebSocket),
+  // which a phone's listening port never is, or the NATed UDP source.
+  struct CallTarget {
+    std::string uri;    // the Request-URI: the contact as registered
+    std::string route;  // "sip:ADDR:PORT;transport=..." or empty
+    // With a route: the contact URI over the flow, the target of the
+    // dialog's later requests (NatTraversal::flowTarget).
+    std::string flow;
+    unsigned int q;  // thousandths
+  };
+  std::vector<CallTarget> callTargets(LS_IIdentity* identity) const;
+
   // One binding as the bindings question shows it.
   struct BindingView {
     LS_IIdentity const* identity;

@@ -60,7 +60,7 @@ bool Admission::unsupportedExtension(Exchange& exchange) const {
 bool Admission::toGateway(Exchange& exchange) const {
   sip_msg const& message = exchange.request();
   bool own = !pl_isset(&message.uri.user);
-  if (!own && namesListener(message.uri)) {
+  if (!own && m_listeners.names(message.uri)) {
     CNameAddr target;
     String error;
     own = !m_redirectSources.admits(message.src) ||
@@ -95,14 +95,4 @@ bool Admission::registrarDomainUnknown(Exchange& exchange) const {
   exchange.setResult("\"" + error.str() + "\"");
   exchange.answer(404, "Not Found");
   return true;
-}
-
-bool Admission::namesListener(uri const& target) const {
-  sa address;
-  if (sa_set(&address, &target.host, target.port != 0 ? target.port : 5060) != 0)
-    return false;
-  for (Listeners::Listener const& listener : m_listeners.listeners())
-    if (sa_cmp(&listener.address, &address, SA_ALL))
-      return true;
-  return false;
 }

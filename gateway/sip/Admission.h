@@ -44,9 +44,6 @@ class Admission {
   bool unsupportedExtension(Exchange& exchange) const;
   bool toGateway(Exchange& exchange) const;
   bool registrarDomainUnknown(Exchange& exchange) const;
-  // Whether the request URI's host and port (5060 when none) are those of
-  // a listener.
-  bool namesListener(uri const& target) const;
 
   Listeners const& m_listeners;
   SourceFilter const& m_redirectSources;

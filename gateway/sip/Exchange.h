@@ -32,6 +32,11 @@ class Exchange {
   // false (see answered()).
   RefPtr<LS_IIdentity> resolveOrAnswer(pl const& uri, CNameAddr& nameAddr, bool answerNotFound = true);
   bool answered() const { return m_answered; }
+  // What the log line says about the lookup so far.
+  std::string const& result() const { return m_result; }
+  // The request is answered by a part that outlives the exchange (a call
+  // in progress), which writes its log line when its final answer leaves.
+  void handOver() { m_answered = true; }
 
   // What the log line says about the lookup, for a part that looked
   // without resolveOrAnswer: "service/identity" or the error text in quotes.

@@ -133,3 +133,13 @@ std::string Listeners::describe() const {
   }
   return text;
 }
+
+bool Listeners::names(uri const& target) const {
+  sa address;
+  if (sa_set(&address, &target.host, target.port != 0 ? target.port : 5060) != 0)
+    return false;
+  for (Listener const& listener : m_listeners)
+    if (sa_cmp(&listener.address, &address, SA_ALL))
+      return true;
+  return false;
+}

@@ -44,6 +44,9 @@ class Listeners {
   bool open(sip& stack, std::vector<std::string> const& listens, std::string& error);
 
   std::vector<Listener> const& listeners() const { return m_listeners; }
+  // Whether a URI's host and port (5060 when none) are those of a
+  // listener: a request to it is a request to the gateway itself.
+  bool names(uri const& target) const;
   // "udp:ADDR:PORT tcp:ADDR:PORT ...", in the order opened.
   std::string describe() const;
 

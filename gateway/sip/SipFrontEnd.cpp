@@ -83,9 +83,15 @@ bool SipFrontEnd::onRequest(sip_msg const* request, void* argument) {
   SipFrontEnd& frontEnd = *static_cast<SipFrontEnd*>(argument);
   sip_msg const& message = *request;
   // An ACK gets no answer, the one for a 302 included (every request is
-  // answered without a transaction, see Exchange::answer).
+  // answered without a transaction, see Exchange::answer); one in a dialog
+  // of the calls is their session layer's, which drops the others.
   if (pl_strcmp(&message.met, "ACK") == 0)
-    return true;
+    return !frontEnd.m_dialogs;
+  if (frontEnd.m_dialogs && pl_isset(&message.to.tag)) {
+    DialogHandler::Verdict const verdict = frontEnd.m_dialogs->inDialog(message);
+    if (verdict != DialogHandler::Verdict::UNKNOWN)
+      return verdict == DialogHandler::Verdict::ANSWERED;
+  }
   if (message.tp == SIP_TRANSP_UDP)
     frontEnd.enlarge(message.sock);
   if (frontEnd.m_rateLimit && !frontEnd.m_rateLimit->admit(*frontEnd.m_stack, message))
@@ -101,10 +107,10 @@ void SipFrontEnd::route(Exchange& exchange, Admission const& admission, MethodTa
     return exchange.answer(416, "Unsupported URI Scheme");
   if (admission.answered(exchange))
     return;
-  if (pl_strcmp(&message.met, "CANCEL") == 0)
-    return exchange.answer(481, "Call/Transaction Does Not Exist");
   if (RequestHandler* const handler = methods.find(message.met))
     return handler->handle(exchange);
+  if (pl_strcmp(&message.met, "CANCEL") == 0)
+    return exchange.answer(481, "Call/Transaction Does Not Exist");
   exchange.answer(405, "Method Not Allowed", Capabilities::kAllow);
 }
 

@@ -24,6 +24,7 @@
 #include "ScriptSession.h"
 #include "sip/Admission.h"
 #include "sip/AnswerCounters.h"
+#include "sip/DialogHandler.h"
 #include "sip/DnsClient.h"
 #include "sip/LibraryClock.h"
 #include "sip/Libre.h"
@@ -77,6 +78,13 @@ class SipFrontEnd {
 
   // Filled before start(); see RequestHandler for the handlers' lifetime.
   MethodTable& methods() { return m_methods; }
+  // The part that keeps dialogs (see DialogHandler); before start(). Its
+  // session layer listens on the stack after start(), behind the
+  // front-end's listener.
+  void keepDialogs(DialogHandler& dialogs) { m_dialogs = &dialogs; }
+  // Whether a URI names the gateway itself (see Listeners::names).
+  Listeners const& listeners() const { return m_listeners; }
+  RequestLog& log() { return m_log; }
   // --source-rate: more than perSecond requests a second from one address
   // are refused (SourceRateLimit); off unless called.
   void limitSourceRate(uint32_t perSecond) { m_rateLimit = std::make_unique<SourceRateLimit>(perSecond); }
@@ -88,9 +96,9 @@ class SipFrontEnd {
 
   // Answers a request once onRequest has let it through (not an ACK,
   // within the rate limit), in this order: 416 for a sips URI over a plain
-  // transport, Admission's answers, 481 for CANCEL (nothing is ever pending
-  // to cancel), then the handler methods has for the method, else 405 with
-  // Allow. Given the parts rather than a front-end, so that the request
+  // transport, Admission's answers, then the handler methods has for the
+  // method, else 481 for CANCEL (nothing was pending to cancel) and 405
+  // with Allow for the rest. Given the parts rather than a front-end, so that the request
   // path can be driven without transports, as the message fuzzer drives it.
   static void route(Exchange& exchange, Admission const& admission, MethodTable const& methods);
 
@@ -116,4 +124,5 @@ class SipFrontEnd {
   bool m_closed = false;
   std::vector<void*> m_enlarged;  // the UDP sockets enlarge() has seen
   std::unique_ptr<SourceRateLimit> m_rateLimit;
+  DialogHandler* m_dialogs = nullptr;
 };

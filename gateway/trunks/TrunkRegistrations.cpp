@@ -30,7 +30,37 @@ std::string hostPortText(CHostPort const& hostPort) {
   return text;
 }
 
+// Appends the address of hostPort when its host is numeric, the port
+// aside.
+void addAddress(std::vector<sa>& addresses, CHostPort const& hostPort) {
+  std::string host = hostPort.GetHost().c_str();
+  if (host.size() > 2 && host.front() == '[' && host.back() == ']')
+    host = host.substr(1, host.size() - 2);
+  sa address;
+  if (!host.empty() && sa_set_str(&address, host.c_str(), 0) == 0)
+    addresses.push_back(address);
+}
+
+bool sameHost(std::vector<sa> const& addresses, sa const& source) {
+  return std::any_of(addresses.begin(), addresses.end(),
+                     [&](sa const& address) { return sa_cmp(&address, &source, SA_ADDR); });
+}
+
 }  // namespace
+
+RefPtr<LS_IIdentity> TrunkRegistrations::trunkAt(sa const& source) const {
+  for (std::unique_ptr<Trunk> const& trunk : m_trunks)
+    if (sameHost(trunk->carrierAddresses, source))
+      return trunk->identity;
+  return nullptr;
+}
+
+std::string TrunkRegistrations::registrarOf(LS_IIdentity const* identity) const {
+  for (std::unique_ptr<Trunk> const& trunk : m_trunks)
+    if (trunk->identity.get() == identity)
+      return trunk->registrarUri;
+  return std::string();
+}
 
 void TrunkRegistrations::report(std::string const& line) {
   m_session.flushDebugLines();
@@ -154,6 +184,8 @@ std::unique_ptr<TrunkRegistrations::Trunk> TrunkRegistrations::findTrunk(LS_IIde
   trunk->face = face;
   trunk->path = path;
   trunk->user = identity->getName().str();
+  addAddress(trunk->carrierAddresses, registrar);
+  addAddress(trunk->carrierAddresses, tlsRegistrar);
   bool const secure = face->getUriScheme() == LS_UriScheme::SIPS || !tlsRegistrar.GetHost().isEmpty();
   if (!tlsRegistrar.GetHost().isEmpty())
     registrar = tlsRegistrar;
@@ -170,6 +202,12 @@ std::unique_ptr<TrunkRegistrations::Trunk> TrunkRegistrations::findTrunk(LS_IIde
   CHostPort proxy;
   CHostPort tlsProxy;
   bool strictRoute = false;
+  for (unsigned int index = 0; outbound && index < outbound->getNumberOfProxies(); ++index) {
+    if (outbound->getProxy(index, proxy, tlsProxy, strictRoute).isFailure())
+      continue;
+    addAddress(trunk->carrierAddresses, proxy);
+    addAddress(trunk->carrierAddresses, tlsProxy);
+  }
   if (outbound && outbound->getNumberOfProxies() != 0 &&
       outbound->getProxy(0, proxy, tlsProxy, strictRoute).isSuccess() && !proxy.GetHost().isEmpty()) {
     if (secure && !tlsProxy.GetHost().isEmpty())
@@ -239,6 +277,8 @@ void TrunkRegistrations::onResponse(int error, sip_msg const* response, void* ar
     CHostPort registrar;
     registrar.Parse(address, std::char_traits<char>::length(address));
     clock.measure([&] { trunk.face->setRegistrarAddr(registrar); });
+    if (!sameHost(trunk.carrierAddresses, response->src))
+      trunk.carrierAddresses.push_back(response->src);
     trunk.registered = true;
     trunk.lastFailure.clear();
     std::string transport = sip_transp_name(response->tp);

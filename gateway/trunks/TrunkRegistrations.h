@@ -75,6 +75,23 @@ class TrunkRegistrations {
   void followAll();
   void stop();
 
+  // The identity of the trunk whose carrier sent a request from source:
+  // one of its registrar's or proxies' addresses, or the address its
+  // registrar answered from. Addresses are compared without the port, since
+  // a carrier's servers send from other ports than they listen on (every
+  // connection they open has a port of its own); a registrar or proxy named
+  // by host name is known by the address that answered the registration.
+  // Null for any other source.
+  RefPtr<LS_IIdentity> trunkAt(sa const& source) const;
+  // The registrar URI identity registers at, transport=tls included, as
+  // the trunk's REGISTER is sent; empty when identity is no trunk.
+  std::string registrarOf(LS_IIdentity const* identity) const;
+  // Lets a request over TLS to host verify the carrier as the trunks'
+  // registrations do (TrunkTls); false with the reason in error.
+  bool verifyTls(std::string const& host, std::string& error) {
+    return m_tls.verify(m_stack, host, m_caFile, error);
+  }
+
   // Each trunk's "service/identity" path and whether it is registered now.
   template <class Visit>
   void forEach(Visit visit) const {
@@ -101,6 +118,9 @@ class TrunkRegistrations {
     // The host whose certificate a TLS registration verifies; empty when
     // the trunk registers over a plain transport.
     std::string tlsHost;
+    // For trunkAt(): the face's numeric registrar and proxy hosts, and the
+    // addresses registrations were answered from.
+    std::vector<sa> carrierAddresses;
     uint32_t lifetime;
     sipreg* registration = nullptr;
     bool registered = false;

@@ -73,7 +73,7 @@ source "$(cd "$(dirname "$0")" && pwd)/await-line.sh"
 # Starts the gateway on a free IPv4 loopback port, gateway_port, and with
 # "--listen [::1]:0" among the arguments also an IPv6 one, gateway_port6.
 start_gateway() {
-  "${emulator[@]}" "$gateway" --listen 127.0.0.1:0 --store none "$@" >"$scenario".gateway.out 2>"$scenario".gateway.err &
+  "${emulator[@]}" "$gateway" --listen 127.0.0.1:0 --store none --calls redirect "$@" >"$scenario".gateway.out 2>"$scenario".gateway.err &
   gateway_pid=$!
   await_line "$scenario".gateway.err "listening on " || fail "the gateway did not start"
   gateway_port=$(sed -n 's/.* udp:127\.0\.0\.1:\([0-9]*\).*/\1/p' "$scenario".gateway.err)
@@ -141,7 +141,7 @@ case $scenario in
     start_gateway "${ipv6[@]}" --nat-ping 1 "$here/protocol.script"
     # A second gateway on the same port must stop, naming the listener.
     status=0
-    timeout "$wait_limit" "${emulator[@]}" "$gateway" --listen 127.0.0.1:"$gateway_port" --store none "$here/protocol.script" \
+    timeout "$wait_limit" "${emulator[@]}" "$gateway" --listen 127.0.0.1:"$gateway_port" --store none --calls redirect "$here/protocol.script" \
       >/dev/null 2>"$scenario".taken.err || status=$?
     ((status == 1)) && grep -q "cannot listen on udp:127.0.0.1:$gateway_port: " "$scenario".taken.err ||
       fail "a taken port did not stop the start ($status)"

@@ -43,6 +43,10 @@ class Gateway:
         # Freed memory goes back at once, so that resident memory shows what
         # the gateway keeps rather than what the sanitizer holds back.
         env["ASAN_OPTIONS"] = "quarantine_size_mb=0:" + env.get("ASAN_OPTIONS", "")
+        # The scenarios here check the gateway as registrar and redirect
+        # server unless they ask for relayed calls.
+        if "--calls" not in options:
+            options = ["--calls", "redirect"] + list(options)
         with open(self.out_path, "wb") as out, open(self.err_path, "wb") as err:
             self.process = subprocess.Popen(
                 list(emulator) + [program, "--listen", "127.0.0.1:0", "--store", "none"] + list(options) + list(scripts),
@@ -57,6 +61,20 @@ class Gateway:
             time.sleep(0.1)
         self.kill()
         raise Failure("the gateway did not start: " + self.errors())
+
+    def listening(self, transport):
+        """The port of the gateway's first listener of transport (udp, tcp,
+        tls, ws, wss) on 127.0.0.1. The secure ones are told on lines of
+        their own, after the one the constructor waits for: wait for it."""
+        pattern = re.compile(r"^location-gateway: listening on .*\b%s:127\.0\.0\.1:(\d+)" % transport, re.M)
+        deadline = time.monotonic() + START_LIMIT_S
+        while True:
+            found = pattern.search(self.errors())
+            if found:
+                return int(found.group(1))
+            if time.monotonic() > deadline or self.process.poll() is not None:
+                raise Failure("the gateway does not listen on %s: %s" % (transport, self.errors()))
+            time.sleep(0.1)
 
     def errors(self):
         with open(self.err_path, errors="replace") as err:
@@ -103,10 +121,10 @@ class Response:
     def all(self, name):
         return [value for key, value in self.headers if key == name.lower()]
 
-    def challenges(self):
-        """(realm, nonce, algorithm, stale) of each WWW-Authenticate, in order."""
+    def challenges(self, header="WWW-Authenticate"):
+        """(realm, nonce, algorithm, stale) of each challenge header, in order."""
         found = []
-        for value in self.all("WWW-Authenticate"):
+        for value in self.all(header):
             params = dict(re.findall(r'(\w+)="?([^",]*)"?', value))
             found.append((params["realm"], params["nonce"], params.get("algorithm", "MD5"),
                           params.get("stale") == "true"))
@@ -245,6 +263,21 @@ def authorization(challenge, method, uri, user, password, nc=1, cnonce="0a4f113b
     return ('Authorization: Digest username="%s", realm="%s", nonce="%s", uri="%s", algorithm=%s, '
             'qop=auth, nc=%s, cnonce="%s", response="%s"'
             % (user, realm, nonce, uri, algorithm, count, cnonce, response))
+
+
+def ask_control(path, line):
+    """What the gateway's control socket at path prints for one line."""
+    client = socket.socket(socket.AF_UNIX, socket.SOCK_STREAM)
+    client.settimeout(ANSWER_LIMIT_S)
+    client.connect(path)
+    client.sendall(line.encode() + b"\n")
+    data = b""
+    while not (data.endswith(b"\0ok\n") or data.endswith(b"\0failed\n")):
+        chunk = client.recv(65536)
+        check(chunk, "the control socket closed before answering %r" % line)
+        data += chunk
+    client.close()
+    return data[:data.rindex(b"\0")].decode(errors="replace")
 
 
 def run(cases, program, work, emulator):

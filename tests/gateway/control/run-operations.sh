@@ -65,7 +65,7 @@ console() {
 # SIPp 3.6 answers only an MD5 first challenge, with its digest over the
 # Request-URI only when told it (-auth_uri).
 start_gateway() {
-  "${emulator[@]}" "$gateway" --listen 127.0.0.1:0 --store none --control "$PWD/control.sock" --digest MD5 "$@" \
+  "${emulator[@]}" "$gateway" --listen 127.0.0.1:0 --store none --calls redirect --control "$PWD/control.sock" --digest MD5 "$@" \
     >gateway.out 2>gateway.err &
   gateway_pid=$!
   await_line gateway.err "control socket" || fail "the gateway did not start"
@@ -95,7 +95,7 @@ case $case in
     metrics_url=$(sed -n 's#.*metrics on \(http://.*/metrics\)$#\1#p' gateway.err)
 
     # A second gateway on the same socket is refused while the first lives.
-    "${emulator[@]}" "$gateway" --listen 127.0.0.1:0 --store none --control "$PWD/control.sock" "$here/operated.script" \
+    "${emulator[@]}" "$gateway" --listen 127.0.0.1:0 --store none --calls redirect --control "$PWD/control.sock" "$here/operated.script" \
       >second.out 2>second.err && fail "a second gateway took a live control socket"
     grep -q "already listens on" second.err || fail "the second gateway gave no reason: $(cat second.err)"
 
@@ -185,7 +185,7 @@ case $case in
     start_gateway "$here/operated.script"
     # A socket file left by a dead gateway is replaced, not refused.
     "$python" -c 'import socket,sys; s=socket.socket(socket.AF_UNIX); s.bind(sys.argv[1])' stale.sock
-    "${emulator[@]}" "$gateway" --listen 127.0.0.1:0 --store none --control "$PWD/stale.sock" "$here/operated.script" \
+    "${emulator[@]}" "$gateway" --listen 127.0.0.1:0 --store none --calls redirect --control "$PWD/stale.sock" "$here/operated.script" \
       >stale.out 2>stale.err &
     stale_pid=$!
     await_line stale.err "control socket" || { kill -KILL $stale_pid; fail "a stale socket file was refused"; }

@@ -65,11 +65,10 @@ def phones_register_and_are_found_over_every_transport(program, work, emulator):
                       ["--tls", "127.0.0.1:0", "--ws", "127.0.0.1:0", "--wss", "127.0.0.1:0",
                        "--certificate", certificate, "--key", key, "--allow-vulnerable-websocket"])
     try:
-        ports = dict(re.findall(r"listening on (tls|ws|wss):127\.0\.0\.1:(\d+)", gateway.errors()))
-        check(sorted(ports) == ["tls", "ws", "wss"], "listening on %r" % ports)
+        ports = {transport: gateway.listening(transport) for transport in ("tls", "ws", "wss")}
         caller = Phone(gateway.port)
         for transport, user in (("tls", "alice"), ("wss", "carol"), ("ws", "dave")):
-            phone = StreamPhone(int(ports[transport]), transport, certificate)
+            phone = StreamPhone(ports[transport], transport, certificate)
             contact = "sip:%s@192.0.2.9;transport=%s" % (user, transport)
             check(register(phone, user, "sip:example.com", contact) == 200, "%s did not register" % transport)
             found = caller.send(caller.build("INVITE", "sip:%s@example.com" % user, "sip:%s@example.com" % user,
@@ -100,7 +99,7 @@ def baresip_registers_over_tls_and_is_found(program, work, emulator):
                       ["--digest", "MD5", "--tls", "127.0.0.1:0", "--certificate", certificate, "--key", key])
     phone = None
     try:
-        port = re.search(r"listening on tls:127\.0\.0\.1:(\d+)", gateway.errors()).group(1)
+        port = gateway.listening("tls")
         with open(os.path.join(directory, "config"), "w") as config:
             config.write("sip_listen 127.0.0.1:0\nsip_cafile %s\nmodule_path /usr/lib/baresip/modules\n"
                          "module g711.so\nmodule_app account.so\n" % certificate)

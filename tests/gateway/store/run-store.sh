@@ -65,7 +65,7 @@ start_gateway() {
   # A restart's log is its own; the earlier one stays beside it.
   [[ -e $name.err ]] && mv "$name.err" "$name.before.err"
   # SIPp 3.6 answers only an MD5 challenge (see run-scenario.sh).
-  "${emulator[@]}" "$gateway" --listen 127.0.0.1:0 --store "$store" --digest MD5 "$subscribers" "$@" \
+  "${emulator[@]}" "$gateway" --listen 127.0.0.1:0 --store "$store" --calls redirect --digest MD5 "$subscribers" "$@" \
     >"$name.out" 2>"$name.err" &
   pids[$name]=$!
   await_line "$name.err" "listening on udp:" || fail "gateway $name did not start"
