@@ -118,7 +118,16 @@ stop_server() {
   wait "$server_pid" || true
   server_pid=""
 }
-trap 'stop_server; postgres_stop' EXIT
+# The SIPp processes running when the run stops.
+sipp_pids=()
+stop_sipp() {
+  local pid
+  for pid in "${sipp_pids[@]}"; do
+    kill -TERM "$pid" 2>/dev/null || true
+  done
+}
+trap 'stop_sipp; stop_server; postgres_stop' EXIT
+trap 'exit 143' TERM INT
 
 # The server's process and its children (Kamailio's workers).
 server_processes() {
@@ -166,6 +175,7 @@ callees_start() {
     timeout "$limit" sipp -sf "$here/answer.xml" -i 127.0.0.1 -p "${callee_ports[$j]}" -nostdin \
       -trace_stat -stf "$label-callee-$j.csv" -fd 3600 >"$label-callee-$j.log" 2>&1 &
     callee_pids+=($!)
+    sipp_pids+=($!)
   done
   for j in "${!callee_ports[@]}"; do
     local tenths=100
@@ -185,6 +195,7 @@ callees_stop() {
     wait "${callee_pids[$j]}" || true
   done
   callee_pids=()
+  sipp_pids=()
   callee_succeeded=0 callee_failed=0 callee_retransmitted=0
   for j in "${!callee_ports[@]}"; do
     callee_succeeded=$((callee_succeeded + $(statistic "$label-callee-$j.csv" 'SuccessfulCall(C)')))
@@ -215,6 +226,7 @@ run_sipp() {
     "${sipp_options[@]}" "${callee_options[@]}" -trace_stat -stf "$label.csv" -fd "$([ $sample_memory = true ] && echo 1 || echo 3600)" \
     >"$label.log" 2>&1 &
   local caller=$!
+  sipp_pids+=("$caller")
   pss_peak=0
   while [ $sample_memory = true ] && kill -0 "$caller" 2>/dev/null; do
     local pss
@@ -223,6 +235,7 @@ run_sipp() {
     sleep 0.5
   done
   wait "$caller" || status=$?
+  sipp_pids=("${callee_pids[@]}")
   end=$(date +%s.%N)
   ticks=$(($(server_ticks) - before))
   local succeeded failed retransmitted
@@ -398,11 +411,16 @@ call_server() {
   callee_ports=()
   for j in "${!ports[@]}"; do
     awk -v n="${#ports[@]}" -v j="$j" 'NR == 1 || (NR - 2) % n == j' users.csv >"callee-$j.csv"
-    local count=$(($(wc -l <"callee-$j.csv") - 1))
+    local count=$(($(wc -l <"callee-$j.csv") - 1)) attempt made=0
     sipp_users=callee-$j.csv
     sipp_options=(-p "${ports[$j]}")
-    run_sipp register.xml "$callee_register_rate" "$count" "$target-register-callee-$j"
-    registered=$((registered + $(statistic "$target-register-callee-$j.csv" 'SuccessfulCall(C)')))
+    # A registration lost in a burst is tried again with all the others.
+    for attempt in 1 2 3; do
+      run_sipp register.xml "$callee_register_rate" "$count" "$target-register-callee-$j-$attempt"
+      made=$(statistic "$target-register-callee-$j-$attempt.csv" 'SuccessfulCall(C)')
+      [ "$made" != "$count" ] || break
+    done
+    registered=$((registered + made))
   done
   sipp_users=users.csv
   sipp_options=()
@@ -427,7 +445,7 @@ measure_calls() { # TARGET
     callee_ports+=("$port")
   done
   figure[$target.calls_sustained]=false
-  call_server "$target" || return 0
+  call_server "$target" || { callee_ports=(); return 0; }
   hold_seconds=$call_seconds
   phase_seconds=$call_run_seconds
   run_phase call.xml "$target-call" "${call_rates[@]}"
