@@ -265,6 +265,27 @@ def authorization(challenge, method, uri, user, password, nc=1, cnonce="0a4f113b
             % (user, realm, nonce, uri, algorithm, count, cnonce, response))
 
 
+def free_port(address="127.0.0.1", kind=socket.SOCK_DGRAM):
+    """A port nobody holds on address now (UDP unless kind says TCP)."""
+    with socket.socket(socket.AF_INET, kind) as probe:
+        probe.bind((address, 0))
+        return probe.getsockname()[1]
+
+
+def await_bound(process, port, limit_s, address="127.0.0.1", kind=socket.SOCK_DGRAM):
+    """Whether process (a phone, a carrier) came to hold port within limit_s
+    and before it ended: a request sent there before would be lost."""
+    deadline = time.monotonic() + limit_s
+    while time.monotonic() < deadline and process.poll() is None:
+        with socket.socket(socket.AF_INET, kind) as probe:
+            try:
+                probe.bind((address, port))
+            except OSError:
+                return True
+        time.sleep(0.05)
+    return False
+
+
 def ask_control(path, line):
     """What the gateway's control socket at path prints for one line."""
     client = socket.socket(socket.AF_UNIX, socket.SOCK_STREAM)

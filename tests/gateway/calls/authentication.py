@@ -15,10 +15,9 @@ import re
 import shutil
 import subprocess
 import sys
-import time
 
 sys.path.insert(0, os.path.join(os.path.dirname(os.path.abspath(__file__)), ".."))
-from sipphone import Failure, Gateway, Phone, Response, authorization, check, run  # noqa: E402
+from sipphone import Failure, Gateway, Phone, Response, await_bound, authorization, check, run  # noqa: E402
 
 HERE = os.path.dirname(os.path.abspath(__file__))
 SCRIPTS = [os.path.join(HERE, "callers.script")]
@@ -136,19 +135,6 @@ def register_callee(gateway):
     return port
 
 
-def await_udp_listener(port, process):
-    """Waits until a socket is bound to 127.0.0.1:port (process's, which must
-    not end first): a call relayed before would find no phone there."""
-    wanted = "0100007F:%04X" % port
-    deadline = time.monotonic() + SIPP_LIMIT_S
-    while time.monotonic() < deadline and process.poll() is None:
-        with open("/proc/net/udp") as table:
-            if any(line.split()[1] == wanted for line in list(table)[1:]):
-                return
-        time.sleep(0.05)
-    raise Failure("SIPp did not listen on port %d" % port)
-
-
 def a_subscriber_authenticates_and_an_outsider_does_not(program, work, emulator):
     sipp = shutil.which("sipp")
     if not sipp:
@@ -162,7 +148,9 @@ def a_subscriber_authenticates_and_an_outsider_does_not(program, work, emulator)
             callee = subprocess.Popen([sipp, "-sn", "uas", "-i", "127.0.0.1", "-p", str(port), "-m", "2",
                                        "-timeout", "%ds" % SIPP_LIMIT_S, "-nostdin"],
                                       cwd=work, stdout=log, stderr=subprocess.STDOUT)
-        await_udp_listener(port, callee)
+        # A call relayed before SIPp holds its port would find no phone there.
+        if not await_bound(callee, port, SIPP_LIMIT_S):
+            raise Failure("SIPp did not listen on port %d" % port)
         phone = Phone(gateway.port)
         # alice is challenged as a proxy challenges (407), with both
         # algorithms; the ACK of the 407 gets no answer of its own, and her

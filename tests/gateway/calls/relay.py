@@ -16,20 +16,12 @@ import urllib.request
 
 HERE = os.path.dirname(os.path.abspath(__file__))
 sys.path.insert(0, os.path.join(HERE, ".."))
-from sipphone import Gateway, ask_control, check, run  # noqa: E402
+from sipphone import Gateway, ask_control, await_bound, check, free_port, run  # noqa: E402
 
 SCRIPT = os.path.join(HERE, "calls.script")
 SIPP = os.environ.get("SIPP", "sipp")
 # Bounds for one SIPp phone; a call here takes a second or two.
 PHONE_LIMIT_S = 60
-
-
-def free_port():
-    probe = socket.socket(socket.AF_INET, socket.SOCK_DGRAM)
-    probe.bind(("127.0.0.1", 0))
-    port = probe.getsockname()[1]
-    probe.close()
-    return port
 
 
 def sipp(work, scenario, port, arguments=(), contact=None):
@@ -57,24 +49,10 @@ def register(work, gateway, user, q="1", contact=None):
     return port
 
 
-def bound(port):
-    """Whether some process holds the UDP port on loopback."""
-    probe = socket.socket(socket.AF_INET, socket.SOCK_DGRAM)
-    try:
-        probe.bind(("127.0.0.1", port))
-        return False
-    except OSError:
-        return True
-    finally:
-        probe.close()
-
-
 def phone(work, user, scenario, port, arguments=(), contact=None):
     process = sipp(work, scenario, port, arguments, contact)
     # A call to the phone before SIPp holds its port would fail at once.
-    deadline = time.monotonic() + PHONE_LIMIT_S / 2
-    while not bound(port) and process.poll() is None and time.monotonic() < deadline:
-        time.sleep(0.05)
+    await_bound(process, port, PHONE_LIMIT_S / 2)
     return process
 
 

@@ -32,7 +32,7 @@ import tempfile
 import time
 
 sys.path.insert(0, os.path.join(os.path.dirname(os.path.abspath(__file__)), ".."))
-from sipphone import Failure, Gateway, check, run  # noqa: E402
+from sipphone import Failure, Gateway, check, free_port, run  # noqa: E402
 
 SCRIPT = os.path.join(os.path.dirname(os.path.abspath(__file__)), "phones.script")
 PASSWORDS = {"u1": "one-secret", "u3": "three-secret"}
@@ -61,16 +61,10 @@ def make_certificate(directory):
     return certificate, key
 
 
-def free_port(kind):
-    with socket.socket(socket.AF_INET, kind) as probe:
-        probe.bind(("127.0.0.1", 0))
-        return probe.getsockname()[1]
-
-
 def free_rtp_port():
     """An even UDP port whose successor (RTCP) is free too."""
     for _ in range(100):
-        port = free_port(socket.SOCK_DGRAM)
+        port = free_port()
         if port % 2 or port >= 65535:
             continue
         try:
@@ -98,7 +92,7 @@ class Softphone:
         # linphonec keeps its databases there and will not start without it.
         os.makedirs(os.path.join(home, ".local", "share", "linphone"))
         ports = {"udp": 0, "tcp": 0, "tls": 0}
-        ports[transport] = free_port(socket.SOCK_DGRAM if transport == "udp" else socket.SOCK_STREAM)
+        ports[transport] = free_port(kind=socket.SOCK_DGRAM if transport == "udp" else socket.SOCK_STREAM)
         proxy = "sip:127.0.0.1:%d;transport=%s" % (gateway_port, transport)
         self.config = os.path.join(directory, "linphonerc")
         with open(self.config, "w") as config:

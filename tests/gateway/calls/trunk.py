@@ -19,10 +19,9 @@ import socket
 import subprocess
 import sys
 import threading
-import time
 
 sys.path.insert(0, os.path.join(os.path.dirname(os.path.abspath(__file__)), ".."))
-from sipphone import START_LIMIT_S, Gateway, Phone, check, hash_hex, run  # noqa: E402
+from sipphone import START_LIMIT_S, Gateway, Phone, await_bound, check, free_port, hash_hex, run  # noqa: E402
 
 HERE = os.path.dirname(os.path.abspath(__file__))
 SIPP = os.environ.get("SIPP", "sipp")
@@ -45,14 +44,6 @@ authentication-service carrier credentials set gateway-7 s3cret
 """
 
 
-def free_port(address="127.0.0.1", kind=socket.SOCK_DGRAM):
-    probe = socket.socket(socket.AF_INET, kind)
-    probe.bind((address, 0))
-    port = probe.getsockname()[1]
-    probe.close()
-    return port
-
-
 class Sipp:
     """One SIPp run in the work directory; options follow the scenario."""
 
@@ -71,19 +62,8 @@ class Sipp:
         # Whatever is sent to its port before SIPp has bound it is lost.
         if "-p" in options:
             kind = socket.SOCK_STREAM if "t1" in options else socket.SOCK_DGRAM
-            self.await_bound(options[options.index("-i") + 1], int(options[options.index("-p") + 1]), kind)
-
-    def await_bound(self, address, port, kind):
-        deadline = time.monotonic() + START_LIMIT_S
-        while time.monotonic() < deadline and self.process.poll() is None:
-            probe = socket.socket(socket.AF_INET, kind)
-            try:
-                probe.bind((address, port))
-            except OSError:
-                return
-            finally:
-                probe.close()
-            time.sleep(0.05)
+            await_bound(self.process, int(options[options.index("-p") + 1]), START_LIMIT_S,
+                        options[options.index("-i") + 1], kind)
 
     def succeeded(self):
         try:
