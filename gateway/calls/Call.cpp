@@ -9,10 +9,6 @@
 
 namespace {
 
-std::string textOf(pl const& value) {
-  return std::string(value.p ? value.p : "", value.l);
-}
-
 // The class of a final answer for RFC 3261 section 16.7: a lower class is
 // better, 6xx ends the search.
 unsigned int classOf(uint16_t code) {

@@ -5,7 +5,6 @@
 #include "LS_ICall.h"
 #include "LS_IOutbound.h"
 #include "LS_IdentityResolution.h"
-#include "LS_ServiceResolution.h"
 #include "calls/OutboundRoute.h"
 #include "registrar/InboundFilter.h"
 #include "sip/Exchange.h"
@@ -15,10 +14,6 @@ namespace {
 
 // Calls by Call-ID in libre's session layer: its table of sessions.
 constexpr int kSessionBuckets = 1024;
-
-std::string textOf(pl const& value) {
-  return std::string(value.p ? value.p : "", value.l);
-}
 
 // " NAME voip=V tone-set=T sip=S" for the profiles a call face of identity
 // names (the empty ones left out); nothing when it names none.
@@ -172,21 +167,15 @@ bool Calls::served(Exchange& exchange, std::string& why) {
   // What does not parse is left to the lookup of the callee, which says so.
   if (!nameAddr.Parse(invite.ruri.p, invite.ruri.l))
     return true;
-  ScriptSession::StackSettings const& settings = exchange.session().stack();
   return exchange.clock().measure([&] {
     String error;
     String user;
     CHostPort host;
     if (LS_splitNameAddr(error, user, host, nameAddr).isFailure())
       return true;
-    RefPtr<LS_ILocationService> service;
-    XCode const found = settings.services.isEmpty()
-                            ? LS_getLocationService(error, service, host, settings.localHostPorts,
-                                                    settings.imperative, nullptr)
-                            : LS_getLocationService(error, service, host, settings.services,
-                                                    settings.localHostPorts, settings.imperative, nullptr);
+    bool const found = exchange.session().serviceFor(error, host) != nullptr;
     why = error.str();
-    return found.isSuccess();
+    return found;
   });
 }
 

@@ -7,7 +7,6 @@
 #include "LS_ILocationService.h"
 #include "LS_IRegistrationInbound.h"
 #include "LS_IdentityResolution.h"
-#include "LS_ServiceResolution.h"
 #include "sip/Exchange.h"
 #include "sip/FieldHash.h"
 #include "sip/MonotonicClock.h"
@@ -185,21 +184,13 @@ Authenticator::Admission Authenticator::admit(Exchange& exchange,
 RefPtr<LS_ILocationService> Authenticator::serviceOf(Exchange& exchange,
                                                      CNameAddr const& named,
                                                      CHostPort& host) {
-  ScriptSession::StackSettings const& stack = exchange.session().stack();
   String error;
   String user;
-  RefPtr<LS_ILocationService> service;
-  m_clock.measure([&] {
+  return m_clock.measure([&]() -> RefPtr<LS_ILocationService> {
     if (LS_splitNameAddr(error, user, host, named).isFailure())
-      return;
-    if (stack.services.isEmpty())
-      LS_getLocationService(error, service, host, stack.localHostPorts, stack.imperative,
-                            exchange.session().locationMaster());
-    else
-      LS_getLocationService(error, service, host, stack.services, stack.localHostPorts, stack.imperative,
-                            exchange.session().locationMaster());
+      return nullptr;
+    return exchange.session().serviceFor(error, host);
   });
-  return service;
 }
 
 void Authenticator::refuseUnknown(Exchange& exchange, CNameAddr const& named, Challenger challenger) {

@@ -4,10 +4,6 @@
 
 namespace {
 
-std::string text(pl const& value) {
-  return std::string(value.p, value.l);
-}
-
 // qvalue = ( "0" [ "." 0*3DIGIT ] ) / ( "1" [ "." 0*3("0") ] ), in
 // thousandths.
 bool parseQ(pl const& value, unsigned int& thousandths) {
@@ -46,11 +42,11 @@ int readParameter(pl const* name, pl const* value, void* argument) {
   if (pl_strcasecmp(name, "q") == 0) {
     reading.malformed = reading.malformed || !parseQ(*value, contact.q);
   } else if (pl_strcasecmp(name, "+sip.instance") == 0) {
-    contact.instance = text(*value);
+    contact.instance = textOf(*value);
     if (contact.instance.size() >= 2 && contact.instance.front() == '"' && contact.instance.back() == '"')
       contact.instance = contact.instance.substr(1, contact.instance.size() - 2);
   } else if (pl_strcasecmp(name, "reg-id") == 0) {
-    contact.regId = text(*value);
+    contact.regId = textOf(*value);
   }
   // The parameter as written runs from its ";" to the end of its value.
   char const* const end = value->l != 0 ? value->p + value->l : name->p + name->l;
@@ -64,7 +60,7 @@ bool ContactHeader::parse(pl const& value, ContactHeader& contact) {
   sip_addr address;
   if (sip_addr_decode(&address, &value) != 0 || !contact.contact.Parse(address.auri.p, address.auri.l))
     return false;
-  contact.uri = text(address.auri);
+  contact.uri = textOf(address.auri);
   Reading reading{&contact, false};
   if (pl_isset(&address.params) && uri_params_apply(&address.params, readParameter, &reading) != 0)
     return false;

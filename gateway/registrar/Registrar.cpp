@@ -24,10 +24,6 @@ namespace {
 // The Call-ID is kept with every binding; a longer one is refused.
 constexpr size_t kMaximumCallId = 256;
 
-std::string text(pl const& value) {
-  return std::string(value.p, value.l);
-}
-
 CHostPort sourceOf(sip_msg const& message) {
   char address[64];
   re_snprintf(address, sizeof address, "%J", &message.src);
@@ -402,7 +398,7 @@ Registrar::Binding* Registrar::add(Bindings& bindings,
   CNameAddr const target = targetOf(request.header, message.src, message.tp, natedTarget);
   bool const nated = !natedTarget.empty();
   bool const fresh = !binding;
-  binding = file(bindings, binding, request.header, target, text(message.callid), message.src, received,
+  binding = file(bindings, binding, request.header, target, textOf(message.callid), message.src, received,
                  request.expires);
   if (!binding)
     return nullptr;

@@ -3,20 +3,15 @@
 #include <string>
 
 #include "CHostPort.h"
-#include "LS_ServiceResolution.h"
 #include "sip/Capabilities.h"
 #include "sip/HeaderValues.h"
 
 namespace {
 
-std::string text(pl const& value) {
-  return std::string(value.p, value.l);
-}
-
 // The request URI's host and port as the library reads a host, brackets
 // around an IPv6 address included.
 CHostPort hostPortOf(uri const& target) {
-  std::string host = text(target.host);
+  std::string host = textOf(target.host);
   if (target.af == AF_INET6)
     host = "[" + host + "]";
   if (target.port != 0)
@@ -48,7 +43,7 @@ bool Admission::unsupportedExtension(Exchange& exchange) const {
   forEachHeaderValue(exchange.request(), SIP_HDR_REQUIRE, [&](sip_hdr const& header) {
     // The stack bounds a message, and so the answer that lists its tags.
     if (!Capabilities::supports(header.val))
-      unsupported += (unsupported.empty() ? "" : ", ") + text(header.val);
+      unsupported += (unsupported.empty() ? "" : ", ") + textOf(header.val);
     return true;
   });
   if (unsupported.empty())
@@ -75,21 +70,11 @@ bool Admission::toGateway(Exchange& exchange) const {
 }
 
 bool Admission::registrarDomainUnknown(Exchange& exchange) const {
-  ScriptSession& session = exchange.session();
-  ScriptSession::StackSettings const& stack = session.stack();
   CHostPort const domain = hostPortOf(exchange.request().uri);
   String error;
   RefPtr<LS_ILocationService> service;
-  exchange.clock().measure([&] {
-    if (domain.GetHost().isEmpty())
-      return;
-    if (stack.services.isEmpty())
-      LS_getLocationService(error, service, domain, stack.localHostPorts, stack.imperative,
-                            session.locationMaster());
-    else
-      LS_getLocationService(error, service, domain, stack.services, stack.localHostPorts, stack.imperative,
-                            session.locationMaster());
-  });
+  if (!domain.GetHost().isEmpty())
+    service = exchange.clock().measure([&] { return exchange.session().serviceFor(error, domain); });
   if (service)
     return false;
   exchange.setResult("\"" + error.str() + "\"");

@@ -2,7 +2,7 @@
 // at a time, each closed by a marker so that "ab" then "c" hashes unlike
 // "a" then "bc". For what the gateway recognises a request by (the To tag
 // it answers with, a REGISTER's fingerprint, a registration). Without a
-// secret seed an outsider can make collisions: seed it where that matters.
+// secret key an outsider can make collisions: key it where that matters.
 #pragma once
 
 #include <cstddef>
@@ -10,7 +10,7 @@
 
 class FieldHash {
  public:
-  explicit FieldHash(uint64_t seed = 0) : m_hash(kOffset ^ seed) {}
+  explicit FieldHash(uint64_t key = 0) : m_hash(kOffset ^ key) {}
 
   FieldHash& add(char const* bytes, size_t length) {
     for (size_t i = 0; i < length; ++i) {

@@ -5,6 +5,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <string>
 
 // Without it, libre's headers define bool, true and false as macros, which
 // in C++ turns true into the int 1 and keeps clang from parsing the
@@ -13,3 +14,9 @@
 #define HAVE_STDBOOL_H
 #endif
 #include <re.h>
+
+// A span of a message libre parsed, as a string; a span never set (a null
+// pointer) is the empty text.
+inline std::string textOf(pl const& value) {
+  return value.p ? std::string(value.p, value.l) : std::string();
+}

@@ -5,6 +5,7 @@
 #include "DebugMonitor.h"
 #include "FaceNames.h"
 #include "LS_IdentityResolution.h"
+#include "LS_ServiceResolution.h"
 #include "ModelWatcher.h"
 #include "SystemRepository.h"
 
@@ -78,7 +79,8 @@ template <class T>
 RefPtr<T> ScriptSession::serviceAs(Arguments const& arguments) const {
   RefPtr<T> found;
   if (LS_getLocationServiceIf(m_locationMaster.get(), arguments.text("service").c_str(), found).isFailure())
-    throw CommandError(arguments.column("service"), "no location service \"" + arguments.text("service") + "\"");
+    throw CommandError(arguments.column("service"),
+                       "no location service \"" + arguments.text("service") + "\"");
   return found;
 }
 
@@ -92,10 +94,11 @@ RefPtr<LS_ILocationService> ScriptSession::service(Arguments const& arguments) c
 
 RefPtr<LS_IIdentityConfig> ScriptSession::identityConfig(Arguments const& arguments) const {
   RefPtr<LS_IIdentityConfig> found;
-  if (LS_getConfigIdentityIf(serviceConfig(arguments).get(), arguments.text("identity").c_str(), found).isFailure())
-    throw CommandError(arguments.column("identity"), "no configured identity \"" + arguments.text("identity") +
-                                                         "\" in location service \"" + arguments.text("service") +
-                                                         "\"");
+  if (LS_getConfigIdentityIf(serviceConfig(arguments).get(), arguments.text("identity").c_str(), found)
+          .isFailure())
+    throw CommandError(arguments.column("identity"),
+                       "no configured identity \"" + arguments.text("identity") +
+                           "\" in location service \"" + arguments.text("service") + "\"");
   return found;
 }
 
@@ -103,8 +106,8 @@ RefPtr<LS_IIdentity> ScriptSession::identity(Arguments const& arguments) const {
   RefPtr<LS_IIdentity> found;
   if (LS_getIdentityIf(service(arguments).get(), arguments.text("identity").c_str(), found).isFailure())
     throw CommandError(arguments.column("identity"), "no identity \"" + arguments.text("identity") +
-                                                         "\" in location service \"" + arguments.text("service") +
-                                                         "\"");
+                                                         "\" in location service \"" +
+                                                         arguments.text("service") + "\"");
   return found;
 }
 
@@ -112,7 +115,8 @@ RefPtr<LS_IAuthenticationService> ScriptSession::authenticationService(Arguments
   RefPtr<LS_IAuthenticationService> found;
   std::string const& name = arguments.text("authentication-service");
   if (LS_getAuthenticationServiceIf(m_authenticationMaster.get(), name.c_str(), found).isFailure())
-    throw CommandError(arguments.column("authentication-service"), "no authentication service \"" + name + "\"");
+    throw CommandError(arguments.column("authentication-service"),
+                       "no authentication service \"" + name + "\"");
   return found;
 }
 
@@ -120,28 +124,40 @@ RefPtr<IUnknown> ScriptSession::ownFace(Arguments const& arguments) const {
   RefPtr<LS_IIdentityConfig> const identity = identityConfig(arguments);
   RefPtr<IUnknown> face;
   LS_IdentityFace::Type const type = arguments.choice<LS_IdentityFace>("face");
-  if (adoptInterface(face, [&](UUID const& iid, void** raw) { return identity->getConfigFaceIf(type, iid, raw); })
-          .isFailure())
-    throw CommandError(arguments.column("face"), "identity \"" + arguments.text("identity") + "\" has no " +
-                                                     arguments.text("face") + " face of its own; create it with: " +
-                                                     "identity " + arguments.text("service") + " " +
-                                                     arguments.text("identity") + " face " +
-                                                     faceNames()[type] + " create");
+  if (adoptInterface(face, [&](UUID const& iid, void** raw) {
+        return identity->getConfigFaceIf(type, iid, raw);
+      }).isFailure())
+    throw CommandError(arguments.column("face"),
+                       "identity \"" + arguments.text("identity") + "\" has no " + arguments.text("face") +
+                           " face of its own; create it with: " + "identity " + arguments.text("service") +
+                           " " + arguments.text("identity") + " face " + faceNames()[type] + " create");
   return face;
 }
 
 RefPtr<LS_IIdentity> ScriptSession::resolve(String& error, CNameAddr const& nameAddr) const {
   RefPtr<LS_IIdentity> found;
   if (m_stack.services.isEmpty())
-    LS_getIdentity(error, found, nameAddr, m_stack.useDefault, m_stack.localHostPorts, m_stack.imperative, nullptr);
+    LS_getIdentity(error, found, nameAddr, m_stack.useDefault, m_stack.localHostPorts, m_stack.imperative,
+                   nullptr);
   else
     LS_getIdentity(error, found, nameAddr, m_stack.services, m_stack.useDefault, m_stack.localHostPorts,
                    m_stack.imperative, nullptr);
   return found;
 }
 
+RefPtr<LS_ILocationService> ScriptSession::serviceFor(String& error, CHostPort const& host) const {
+  RefPtr<LS_ILocationService> found;
+  if (m_stack.services.isEmpty())
+    LS_getLocationService(error, found, host, m_stack.localHostPorts, m_stack.imperative, locationMaster());
+  else
+    LS_getLocationService(error, found, host, m_stack.services, m_stack.localHostPorts, m_stack.imperative,
+                          locationMaster());
+  return found;
+}
+
 std::string ScriptSession::pathOf(LS_IIdentity const* identity) {
   RefPtr<LS_ILocationService> service;
-  adoptInterface(service, [&](UUID const& iid, void** raw) { return identity->getLocationServiceIf(iid, raw); });
+  adoptInterface(service,
+                 [&](UUID const& iid, void** raw) { return identity->getLocationServiceIf(iid, raw); });
   return (service ? service->getName().str() : std::string("?")) + "/" + identity->getName().str();
 }

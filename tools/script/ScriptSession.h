@@ -99,7 +99,8 @@ class ScriptSession {
   RefPtr<T> faceConfig(Arguments const& arguments) const {
     RefPtr<T> face = faceIf<T>(arguments);
     if (!face)
-      throw CommandError(arguments.column("face"), "the " + arguments.text("face") + " face has no such setting");
+      throw CommandError(arguments.column("face"),
+                         "the " + arguments.text("face") + " face has no such setting");
     return face;
   }
   // The same, or null when the face does not implement T.
@@ -116,6 +117,9 @@ class ScriptSession {
   // LS_getIdentity with the stack settings: the identity nameAddr denotes,
   // or null, with the lookup's message in error.
   RefPtr<LS_IIdentity> resolve(String& error, CNameAddr const& nameAddr) const;
+  // LS_getLocationService with the stack settings: the location service
+  // responsible for host, or null, with the lookup's message in error.
+  RefPtr<LS_ILocationService> serviceFor(String& error, CHostPort const& host) const;
 
   // "service/identity", as the host programs name identities in what they print.
   static std::string pathOf(LS_IIdentity const* identity);
