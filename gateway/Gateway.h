@@ -16,7 +16,8 @@
 //   sip/                      the stack, its transports, the table of handlers by method
 //   store/                    the bindings that outlive the process
 //   registrar/                REGISTER, and the store's rows put back into it
-//   redirect/ trunks/         the redirect server, the trunks' registrations
+//   redirect/ trunks/         the redirect server; the trunks' registrations and where
+//                             requests sent on an identity's behalf go (its outbound face)
 //   calls/                    calls relayed, to subscribers and out through trunks
 //   metrics/                  the statistics and their HTTP exposition
 //   control/                  the control socket and what a change there sets off

@@ -63,7 +63,7 @@
 
 #include "LS_IIdentity.h"
 #include "RefPtr.h"
-#include "calls/OutboundRoute.h"
+#include "trunks/OutboundRoute.h"
 #include "registrar/Registrar.h"
 #include "sip/Libre.h"
 

@@ -5,7 +5,7 @@
 #include "LS_ICall.h"
 #include "LS_IOutbound.h"
 #include "LS_IdentityResolution.h"
-#include "calls/OutboundRoute.h"
+#include "trunks/OutboundRoute.h"
 #include "registrar/InboundFilter.h"
 #include "sip/Exchange.h"
 #include "sip/MonotonicClock.h"

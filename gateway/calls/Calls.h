@@ -51,7 +51,7 @@
 #include <vector>
 
 #include "calls/Call.h"
-#include "calls/PenaltyBox.h"
+#include "trunks/PenaltyBox.h"
 #include "registrar/Registrar.h"
 #include "sip/DialogHandler.h"
 #include "sip/Libre.h"

@@ -56,7 +56,7 @@
 #include "CNameAddr.h"
 #include "LS_IIdentity.h"
 #include "RefPtr.h"
-#include "calls/PenaltyBox.h"
+#include "trunks/PenaltyBox.h"
 #include "sip/LibraryClock.h"
 #include "trunks/TrunkRegistrations.h"
 

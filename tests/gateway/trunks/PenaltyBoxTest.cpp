@@ -1,4 +1,4 @@
-#include "calls/PenaltyBox.h"
+#include "trunks/PenaltyBox.h"
 
 #include <gtest/gtest.h>
 

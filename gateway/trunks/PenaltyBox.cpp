@@ -1,4 +1,4 @@
-#include "calls/PenaltyBox.h"
+#include "trunks/PenaltyBox.h"
 
 void PenaltyBox::failed(std::string const& proxy, uint64_t nowMs) {
   m_boxed[proxy] = nowMs + kBoxMs;

@@ -1,4 +1,4 @@
-#include "calls/OutboundRoute.h"
+#include "trunks/OutboundRoute.h"
 
 #include <iostream>
 
