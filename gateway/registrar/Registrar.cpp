@@ -47,8 +47,10 @@ char const* transportName(sip_transp transport) {
 }  // namespace
 
 Registrar::~Registrar() {
-  // The bindings go with the process, not from the store.
+  // The bindings go with the process, not from the store, and the parts
+  // listening may be gone already.
   m_store = nullptr;
+  m_listeners.clear();
   for (auto& entry : m_bindings) {
     size_t const before = entry.second.all.size();
     removeAll(entry.second);
@@ -217,18 +219,21 @@ void Registrar::update(Exchange& exchange,
   for (ContactRequest const& request : requests)
     if (Binding* const binding = request.expires != 0 ? find(bindings, request.header) : nullptr)
       kept.push_back(binding);
+  bool added = false;
   for (ContactRequest const& request : requests) {
     if (request.expires == 0)
       continue;
     Binding* binding = find(bindings, request.header);
     if (!binding && bindings.all.size() >= kMaximumBindings)
       giveWay(exchange, bindings, kept, request);
+    bool const fresh = !binding;
     binding = add(bindings, request, message, received, binding);
     if (binding)
       kept.push_back(binding);
+    added = added || (binding && fresh);
   }
-  reportTransition(bindings, before);
   exchange.answer(200, "OK", bindingHeaders(bindings));
+  reportTransition(bindings, before, added);
 }
 
 void Registrar::dropRemoved(std::vector<LS_IIdentity const*> const& removed, bool checkAll) {
@@ -467,12 +472,20 @@ void Registrar::removeAll(Bindings& bindings) {
   m_clock.measure([&] { bindings.face->removeContacts(); });
 }
 
-void Registrar::reportTransition(Bindings& bindings, size_t before) {
+void Registrar::reportTransition(Bindings& bindings, size_t before, bool added) {
   size_t const after = bindings.all.size();
   if (before == 0 && after != 0)
     m_clock.measure([&] { bindings.identity->isInboundRegistered(); });
   else if (before != 0 && after == 0)
     m_clock.measure([&] { bindings.identity->isInboundUnregistered(); });
+  // A copy: a listener may send, and nothing it sets off may add another.
+  RefPtr<LS_IIdentity> const identity = bindings.identity;
+  for (BindingListener* listener : std::vector<BindingListener*>(m_listeners)) {
+    if (after != 0 && (added || before == 0))
+      listener->onBound(identity.get(), before == 0);
+    else if (before != 0 && after == 0)
+      listener->onUnbound(identity.get());
+  }
 }
 
 std::string Registrar::bindingHeaders(Bindings const& bindings) {

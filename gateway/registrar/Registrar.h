@@ -97,6 +97,7 @@
 #include "LS_IRegistrationInbound.h"
 #include "RefPtr.h"
 #include "registrar/Authenticator.h"
+#include "registrar/BindingListener.h"
 #include "registrar/ContactHeader.h"
 #include "registrar/ExpiryRange.h"
 #include "registrar/NatPinger.h"
@@ -136,6 +137,8 @@ class Registrar final : public RequestHandler {
   // reports nothing to it once it is being destroyed.
   void setStore(BindingStore* store) { m_store = store; }
   BindingStore* store() const { return m_store; }
+  // Borrowed; each must outlive the registrar or be added to no registrar.
+  void addListener(BindingListener* listener) { m_listeners.push_back(listener); }
   // Makes the identity's bindings exactly these (on MonotonicClock),
   // without reporting to the store; dynamic: the identity was created for
   // them. False when the identity has no registration face to hold them.
@@ -293,8 +296,9 @@ class Registrar final : public RequestHandler {
   // Removes one binding from its face and the table; tells the identity when
   // it was its last. Invalidates binding.
   void remove(Binding& binding);
-  // Tells the identity when its first binding came or its last went.
-  void reportTransition(Bindings& bindings, size_t before);
+  // Tells the identity when its first binding came or its last went, and
+  // the listeners that and whether a new one came (added).
+  void reportTransition(Bindings& bindings, size_t before, bool added = false);
   // The 200's own header lines: the bindings, the date, what is supported.
   static std::string bindingHeaders(Bindings const& bindings);
   // (Re)files the binding under its time; sets the timer when it is now
@@ -325,4 +329,5 @@ class Registrar final : public RequestHandler {
   Expiries m_expiries;
   MonotonicTimer m_sweep;
   uint64_t m_bindingsDropped = 0;
+  std::vector<BindingListener*> m_listeners;
 };
