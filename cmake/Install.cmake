@@ -108,11 +108,14 @@ foreach(library ls_platform_shared locationservice_shared)
   target_include_directories(${library} INTERFACE $<INSTALL_INTERFACE:${LS_INSTALL_INCLUDEDIR}>)
 endforeach()
 
+# Two install components, one Debian package each (cmake/Packaging.cmake):
+# "library", the versioned shared objects, and "development", the rest.
 install(TARGETS ls_platform_shared locationservice_shared
         EXPORT LocationServiceTargets
-        LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR}
-        FILE_SET HEADERS DESTINATION ${LS_INSTALL_INCLUDEDIR})
-install(EXPORT LocationServiceTargets NAMESPACE LocationService:: DESTINATION ${LS_INSTALL_CMAKEDIR})
+        LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT library NAMELINK_COMPONENT development
+        FILE_SET HEADERS DESTINATION ${LS_INSTALL_INCLUDEDIR} COMPONENT development)
+install(EXPORT LocationServiceTargets NAMESPACE LocationService:: DESTINATION ${LS_INSTALL_CMAKEDIR}
+        COMPONENT development)
 configure_package_config_file(${PROJECT_SOURCE_DIR}/cmake/LocationServiceConfig.cmake.in
                               ${PROJECT_BINARY_DIR}/LocationServiceConfig.cmake
                               INSTALL_DESTINATION ${LS_INSTALL_CMAKEDIR})
@@ -120,9 +123,10 @@ write_basic_package_version_file(${PROJECT_BINARY_DIR}/LocationServiceConfigVers
                                  COMPATIBILITY SameMajorVersion)
 install(FILES ${PROJECT_BINARY_DIR}/LocationServiceConfig.cmake
               ${PROJECT_BINARY_DIR}/LocationServiceConfigVersion.cmake
-        DESTINATION ${LS_INSTALL_CMAKEDIR})
+        DESTINATION ${LS_INSTALL_CMAKEDIR} COMPONENT development)
 # The pkg-config file finds the prefix from where it lies, so that an
 # install under another --prefix than the configured one still works.
 file(RELATIVE_PATH LS_PC_TO_PREFIX /prefix/${CMAKE_INSTALL_LIBDIR}/pkgconfig /prefix)
 configure_file(${PROJECT_SOURCE_DIR}/cmake/locationservice.pc.in ${PROJECT_BINARY_DIR}/locationservice.pc @ONLY)
-install(FILES ${PROJECT_BINARY_DIR}/locationservice.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
+install(FILES ${PROJECT_BINARY_DIR}/locationservice.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig
+        COMPONENT development)
