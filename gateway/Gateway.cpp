@@ -191,6 +191,8 @@ GatewayStatistics Gateway::statistics() const {
   m_trunks->forEach([&](std::string const& path, bool registered) {
     statistics.trunks.push_back(GatewayStatistics::Trunk{path, registered});
   });
+  statistics.mwiSubscriptions = m_mwi->countByState();
+  statistics.mwiNotifiesRelayed = m_mwi->notifiesRelayed();
   statistics.cpuSeconds = LibraryClock::cpuSeconds();
   statistics.librarySeconds = m_clock.librarySeconds();
   return statistics;

@@ -189,6 +189,7 @@ def explicit_subscription_is_relayed_to_every_phone(program, work, emulator):
         await_control(gateway, control, "mwi",
                       r"^example\.com/alice explicit subscribed notifier 127\.0\.0\.1:%d messages yes voice 2/8 \(0/0\)$"
                       % notifier_port)
+        await_control(gateway, control, "statistics", r"^message waiting: faces 1, subscribed 1, NOTIFYs relayed 5$")
         gateway.stop()
         check(notifier.succeeded(), "the message server did not see the subscription through to its end "
                                     "(Expires: 0 at shut-down): " + notifier.errors() + gateway.errors())
