@@ -60,6 +60,24 @@ std::string transportOf(LS_IOutbound& face) {
   }
 }
 
+// What the face's hops depend on, as one text: its effective proxies and
+// its forced destination.
+std::string hopsOf(LS_IOutbound& face) {
+  std::string hops;
+  for (unsigned int index = 0; index < face.getNumberOfProxies(); ++index) {
+    CHostPort address;
+    CHostPort tlsAddress;
+    bool strictRoute = false;
+    if (face.getProxy(index, address, tlsAddress, strictRoute).isSuccess())
+      hops += hostPortText(address) + " " + hostPortText(tlsAddress) + ",";
+  }
+  LS_ForcedDestination forced;
+  if (face.getForcedDestination(forced).isSuccess())
+    hops += " forced " + std::to_string(static_cast<unsigned int>(forced.type)) + " " +
+            hostPortText(forced.udpTcpAddress) + " " + hostPortText(forced.tlsDestination);
+  return hops;
+}
+
 // The value of one "Name: value" line of a message-summary body (RFC 3842
 // section 5.2), the name matched without regard to case; empty when absent.
 std::string summaryValue(std::string const& body, char const* name) {
@@ -184,6 +202,7 @@ std::unique_ptr<MessageWaiting::Subscriber> MessageWaiting::find(LS_IIdentity* i
   RefPtr<LS_IOutbound> outbound;
   face->queryIf(outbound);
   subscriber->transport = outbound ? transportOf(*outbound) : std::string();
+  subscriber->hops = outbound ? hopsOf(*outbound) : std::string();
   subscriber->tls = subscriber->transport == ";transport=tls";
   subscriber->notifier = subscriber->tls && !tlsNotifier.GetHost().isEmpty() ? tlsNotifier : notifier;
   subscriber->current = subscriber->notifier;
@@ -208,7 +227,7 @@ MessageWaiting::Subscriber* MessageWaiting::subscriberOf(LS_IIdentity const* ide
 
 bool MessageWaiting::same(Subscriber const& a, Subscriber const& b) {
   return a.path == b.path && a.mode == b.mode && a.notifier == b.notifier && a.transport == b.transport &&
-         a.lifetime == b.lifetime;
+         a.hops == b.hops && a.lifetime == b.lifetime;
 }
 
 void MessageWaiting::follow(std::vector<RefPtr<LS_IIdentity>> const& touched,

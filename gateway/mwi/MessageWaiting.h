@@ -143,6 +143,7 @@ class MessageWaiting final : public RequestHandler, public DialogHandler, public
     CHostPort notifier;
     bool tls = false;
     std::string transport;  // ";transport=..." of the preferred transport, or empty
+    std::string hops;       // the face's proxies and forced destination, for same()
     uint32_t lifetime;
     // The notifier subscribed at now: the configured one, or one a 3xx named.
     CHostPort current;
