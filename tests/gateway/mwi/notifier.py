@@ -230,6 +230,32 @@ def redirected_subscription_goes_to_the_contact(program, work, emulator):
         moved.kill()
 
 
+def changed_face_subscribes_anew(program, work, emulator):
+    # A proxy added over the control socket: the subscription ends at the
+    # message server and is made again through the proxy (a second message
+    # server here, which takes whatever reaches it).
+    first_port = free_port()
+    proxy_port = free_port()
+    control = os.path.join(work, "changed.control")
+    script = write_script(work, "changed", BASE_SCRIPT +
+                          "face example.com alice message-subscription mwi-notifier set 127.0.0.1:%d\n" % first_port)
+    first = Sipp(work, "changed-first", "notifier.xml", ["-i", "127.0.0.1", "-p", str(first_port), "-m", "1"])
+    proxy = Sipp(work, "changed-proxy", "notifier.xml", ["-i", "127.0.0.1", "-p", str(proxy_port), "-m", "1"])
+    gateway = Gateway(program, emulator, work, "changed", [script], ["--control", control])
+    try:
+        await_control(gateway, control, "mwi", r"^example\.com/alice explicit subscribed .* messages yes")
+        ask_control(control, "face example.com alice message-subscription proxy insert 0 127.0.0.1:%d loose" % proxy_port)
+        check(first.succeeded(), "the subscription did not end when the face changed: " + first.errors())
+        await_control(gateway, control, "mwi", r"^example\.com/alice explicit subscribed .* messages yes")
+        gateway.stop()
+        check(proxy.succeeded(), "the subscription was not made again through the proxy: " + proxy.errors() +
+              gateway.errors())
+    finally:
+        gateway.kill()
+        first.kill()
+        proxy.kill()
+
+
 def notify(phones, gateway, source, body, expected):
     """An out-of-dialog NOTIFY for bob from a message server at source,
     which must be answered expected."""
@@ -286,6 +312,7 @@ if __name__ == "__main__":
         sys.exit(77)
     sys.exit(run([("explicit_subscription_is_relayed_to_every_phone", explicit_subscription_is_relayed_to_every_phone),
                   ("redirected_subscription_goes_to_the_contact", redirected_subscription_goes_to_the_contact),
+                  ("changed_face_subscribes_anew", changed_face_subscribes_anew),
                   ("implicit_notifies_are_taken_from_the_notifier_only",
                    implicit_notifies_are_taken_from_the_notifier_only)],
                  sys.argv[1], sys.argv[2], sys.argv[3:]))
