@@ -51,12 +51,20 @@
 // of no subscription 481 as the front-end would have. Out-of-dialog NOTIFYs
 // stay with the front-end, which hands them to handle() by the method table.
 //
+// A hop naming the gateway itself is not refused, as Calls refuses it: a
+// SUBSCRIBE that comes back is answered by the redirect server, and what
+// follows from that answer is at worst a failure retried after the face's
+// timeout, never a loop without end.
+//
 // After a change over the control socket, follow() looks at the identities
 // touched: a subscription whose notifier, route, lifetime or mode changed
 // is ended (unsubscribed, Expires: 0) and made anew; one that is gone is
 // ended. stop() ends every subscription: sipevent sends the SUBSCRIBE with
 // Expires: 0 and lives on inside libre until it is answered, within the
-// gateway's bounded shut-down.
+// gateway's bounded shut-down. libre keeps an ended subscription, and with
+// it the stack, until the notifier's final NOTIFY (RFC 6665) or 10 s: a
+// notifier that never sends it keeps the stack busy until the shut-down's
+// bound, after which libre reports the stack's sockets as still in use.
 //
 // Owned by the Gateway, which registers it with the registrar as a
 // BindingListener; it borrows the registrar, the trunks and the clock, which
