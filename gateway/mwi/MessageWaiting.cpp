@@ -388,7 +388,9 @@ void MessageWaiting::onClose(int error, sip_msg const* answer, sipevent_substate
   LibraryClock& clock = owner.m_clock;
   LS_IMwiSubscription& face = *subscriber.face;
   std::string const where = hostPortText(subscriber.current);
-  if (!state && error == 0 && answer && answer->scode >= 300 && answer->scode < 400) {
+  // One move is followed: a 3xx from a notifier a 3xx named is a failure,
+  // so that two servers naming each other cannot keep the gateway busy.
+  if (!state && error == 0 && answer && answer->scode >= 300 && answer->scode < 400 && !subscriber.learnt) {
     sip_hdr const* const contact = sip_msg_hdr(answer, SIP_HDR_CONTACT);
     sip_addr address;
     CHostPort target;

@@ -20,6 +20,8 @@
 //   Contact: it is recorded on the face (setDynamicMwiNotifier), subscribed
 //   at at once, and forgotten (removeDynamicMwiNotifier) when that
 //   subscription ends, after which the configured notifier is asked again.
+//   A 3xx from the notifier a 3xx named is a client error, so that two
+//   servers naming each other cannot keep the gateway busy.
 // - implicit: no SUBSCRIBE; the message server sends its NOTIFYs unasked,
 //   out of any dialog. One whose Request-URI (or else To) names the
 //   identity is accepted when it comes from the notifier's address

@@ -208,26 +208,45 @@ def explicit_subscription_is_relayed_to_every_phone(program, work, emulator):
 
 
 def redirected_subscription_goes_to_the_contact(program, work, emulator):
+    # alice's server moved her mailbox; bob's two servers name each other,
+    # and the second move is his subscription's failure.
     moved_port = free_port()
     notifier_port = free_port()
+    ping_port = free_port()
+    pong_port = free_port()
     control = os.path.join(work, "moved.control")
     script = write_script(work, "moved", BASE_SCRIPT +
-                          "face example.com alice message-subscription mwi-notifier set 127.0.0.1:%d\n" % moved_port)
-    notifier = Sipp(work, "moved-notifier", "notifier.xml", ["-i", "127.0.0.1", "-p", str(notifier_port), "-m", "1"])
-    moved = Sipp(work, "moved-first", "moved.xml", ["-i", "127.0.0.1", "-p", str(moved_port), "-m", "1",
-                                                    "-key", "target", "127.0.0.1:%d" % notifier_port])
+                          "face example.com alice message-subscription mwi-notifier set 127.0.0.1:%d\n"
+                          "identity example.com bob create identity\n"
+                          "identity example.com bob face message-subscription create\n"
+                          "face example.com bob message-subscription mwi-subscription-mode set explicit\n"
+                          "face example.com bob message-subscription retry-timeout-on-client-error set 600\n"
+                          "face example.com bob message-subscription mwi-notifier set 127.0.0.1:%d\n"
+                          % (moved_port, ping_port))
+    servers = [Sipp(work, "moved-notifier", "notifier.xml", ["-i", "127.0.0.1", "-p", str(notifier_port), "-m", "1"])]
+    for name, port, target in [("moved-first", moved_port, notifier_port), ("moved-ping", ping_port, pong_port),
+                               ("moved-pong", pong_port, ping_port)]:
+        servers.append(Sipp(work, name, "moved.xml", ["-i", "127.0.0.1", "-p", str(port), "-m", "1",
+                                                      "-key", "target", "127.0.0.1:%d" % target]))
+    notifier, moved, ping, pong = servers
     gateway = Gateway(program, emulator, work, "moved", [script], ["--control", control])
     try:
         check(moved.succeeded(), "the first message server was not asked: " + moved.errors())
         await_control(gateway, control, "mwi",
                       r"^example\.com/alice explicit subscribed notifier 127\.0\.0\.1:%d learnt messages yes" % notifier_port)
+        check(ping.succeeded() and pong.succeeded(), "bob's servers were not asked once each: " + ping.errors() +
+              pong.errors())
+        await_control(gateway, control, "mwi",
+                      r"^example\.com/bob explicit failed notifier 127\.0\.0\.1:%d messages unknown$" % ping_port)
+        check(re.search(r"subscription of example\.com/bob at 127\.0\.0\.1:%d failed \(302\)" % pong_port,
+                        gateway.errors()), "the second move was not bob's failure: " + gateway.errors())
         gateway.stop()
         check(notifier.succeeded(), "the subscription did not move to the Contact's message server: " +
               notifier.errors() + gateway.errors())
     finally:
         gateway.kill()
-        notifier.kill()
-        moved.kill()
+        for server in servers:
+            server.kill()
 
 
 def changed_face_subscribes_anew(program, work, emulator):
