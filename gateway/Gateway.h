@@ -1,10 +1,10 @@
 // Gateway: location-gateway composed. It owns and builds every part (the SIP
 // front-end, the registrar and the redirector in the front-end's method
-// table, the trunk registrations, the binding store and its replay, the
-// changes followed over the control socket, the control and metrics servers
-// with the autosave), starts them in order, reads their statistics and shuts
-// them down. main.cpp only reads the options into Settings, runs the scripts
-// and drives this class; no part knows it.
+// table, the trunk registrations, message waiting, the binding store and
+// its replay, the changes followed over the control socket, the control and
+// metrics servers with the autosave), starts them in order, reads their
+// statistics and shuts them down. main.cpp only reads the options into
+// Settings, runs the scripts and drives this class; no part knows it.
 //
 // The folders of gateway/, from the bottom up. A file includes from its own
 // folder and from the levels below it only, never from a folder beside it
