@@ -2,7 +2,7 @@
 // would hand them over: libre's message decoder, then the front-end's
 // routing (SipFrontEnd::route) to Admission, then through a method table
 // filled as the gateway fills it to the Registrar with its digest
-// authentication or the Redirector, against the gateway tests' model
+// authentication, message waiting or the Redirector, against the gateway tests' model
 // (GatewayHarness::loadModel) and a stack without transports.
 //
 // The input is a stream of messages framed as on a TCP connection: each
@@ -35,6 +35,7 @@
 
 #include "GatewayHarness.h"
 #include "SipStatistics.h"
+#include "mwi/MessageWaiting.h"
 #include "redirect/Redirector.h"
 #include "registrar/ExpiryRange.h"
 #include "registrar/NonceGenerator.h"
@@ -172,6 +173,12 @@ extern "C" int LLVMFuzzerTestOneInput(uint8_t const* data, size_t size) {
     registrar.start(stack(), ExpiryRange(), kNatPingSeconds);
     MethodTable methods;
     methods.add("REGISTER", registrar);
+    // Out-of-dialog NOTIFYs, as unasked message-waiting ones arrive; the
+    // model has no message-waiting face, so each is refused, after its
+    // Event and its identity were read.
+    MessageWaiting messageWaiting(session, clock, registrar);
+    registrar.addListener(&messageWaiting);
+    methods.add("NOTIFY", messageWaiting);
     for (char const* method : {"INVITE", "MESSAGE", "SUBSCRIBE", "OPTIONS"})
       methods.add(method, redirector);
     mbuf* const input = mbuf_alloc(size + 1);

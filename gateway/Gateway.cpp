@@ -33,6 +33,10 @@ Gateway::Gateway(ScriptSession& session, Settings settings)
     m_frontEnd.methods().add("CANCEL", *m_calls);
     m_frontEnd.keepDialogs(*m_calls);
   }
+  m_mwi = std::make_unique<MessageWaiting>(session, m_clock, m_registrar);
+  m_frontEnd.methods().add("NOTIFY", *m_mwi);
+  m_frontEnd.keepSubscriptions(*m_mwi);
+  m_registrar.addListener(m_mwi.get());
   for (char const* method : {"INVITE", "MESSAGE", "SUBSCRIBE", "OPTIONS"}) {
     pl name;
     pl_set_str(&name, method);
@@ -45,6 +49,7 @@ Gateway::~Gateway() {
   m_changes.reset();
   m_calls.reset();
   m_frontEnd.close();
+  m_mwi.reset();
   m_trunks.reset();
 }
 
@@ -74,6 +79,8 @@ bool Gateway::start(std::string& error) {
   m_trunks->start();
   if (m_calls)
     m_calls->useTrunks(*m_trunks);
+  if (!m_mwi->start(m_frontEnd.stack(), m_frontEnd.dns(), *m_trunks, error))
+    return false;
   std::vector<std::string> secure;
   if (!m_frontEnd.startSecure(m_settings.secure, secure, error))
     return false;
@@ -96,6 +103,7 @@ bool Gateway::startOperations(std::string& error) {
     addScriptCommands(m_commands);
     addGatewayCommands(
         m_commands, m_registrar, [this] { return statistics(); }, m_calls.get());
+    addMessageWaitingCommand(m_commands, *m_mwi);
     m_control = std::make_unique<ControlServer>(m_session, m_commands);
     followChanges();
     m_control->onLine([this] { beginChange(); },
@@ -127,6 +135,7 @@ void Gateway::shutDown() {
   m_control.reset();
   m_autosave.reset();
   m_trunks->stop();
+  m_mwi->stop();
   // The calls end with a BYE or a CANCEL each, sent while the stack finishes.
   if (m_calls)
     m_calls->endAll();
@@ -150,6 +159,11 @@ void Gateway::endChange() {
     m_trunks->followAll();
   else
     m_trunks->follow(m_changes->touched(), m_changes->removed());
+  if (m_changes->anyServiceChanged())
+    return m_mwi->followAll();
+  std::vector<RefPtr<LS_IIdentity>> touched = m_changes->touched();
+  touched.insert(touched.end(), m_changes->mwiTouched().begin(), m_changes->mwiTouched().end());
+  m_mwi->follow(touched, m_changes->removed());
 }
 
 GatewayStatistics Gateway::statistics() const {
@@ -177,6 +191,8 @@ GatewayStatistics Gateway::statistics() const {
   m_trunks->forEach([&](std::string const& path, bool registered) {
     statistics.trunks.push_back(GatewayStatistics::Trunk{path, registered});
   });
+  statistics.mwiSubscriptions = m_mwi->countByState();
+  statistics.mwiNotifiesRelayed = m_mwi->notifiesRelayed();
   statistics.cpuSeconds = LibraryClock::cpuSeconds();
   statistics.librarySeconds = m_clock.librarySeconds();
   return statistics;

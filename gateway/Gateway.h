@@ -1,10 +1,10 @@
 // Gateway: location-gateway composed. It owns and builds every part (the SIP
 // front-end, the registrar and the redirector in the front-end's method
-// table, the trunk registrations, the binding store and its replay, the
-// changes followed over the control socket, the control and metrics servers
-// with the autosave), starts them in order, reads their statistics and shuts
-// them down. main.cpp only reads the options into Settings, runs the scripts
-// and drives this class; no part knows it.
+// table, the trunk registrations, message waiting, the binding store and
+// its replay, the changes followed over the control socket, the control and
+// metrics servers with the autosave), starts them in order, reads their
+// statistics and shuts them down. main.cpp only reads the options into
+// Settings, runs the scripts and drives this class; no part knows it.
 //
 // The folders of gateway/, from the bottom up. A file includes from its own
 // folder and from the levels below it only, never from a folder beside it
@@ -18,7 +18,8 @@
 //   registrar/                REGISTER, and the store's rows put back into it
 //   redirect/ trunks/         the redirect server; the trunks' registrations and where
 //                             requests sent on an identity's behalf go (its outbound face)
-//   calls/                    calls relayed, to subscribers and out through trunks
+//   calls/ mwi/               calls relayed, to subscribers and out through trunks;
+//                             message waiting, learnt from message servers and told to phones
 //   metrics/                  the statistics and their HTTP exposition
 //   control/                  the control socket and what a change there sets off
 //
@@ -35,6 +36,9 @@
 //   transactions were ended (SipFrontEnd::close()), before the stack itself.
 // - The control socket, the autosave and the metrics come last and go
 //   first, before the trunks unregister.
+// - Message waiting starts on the stack after the trunks, whose routes its
+//   subscriptions use, unsubscribes with them and dies before them, after
+//   the stack's transactions were ended.
 //
 // Everything runs on libre's thread; one Gateway per process, made after
 // libre_init() and destroyed before libre_close().
@@ -53,6 +57,7 @@
 #include "control/ModelChanges.h"
 #include "metrics/GatewayStatistics.h"
 #include "metrics/MetricsServer.h"
+#include "mwi/MessageWaiting.h"
 #include "redirect/Redirector.h"
 #include "registrar/BindingReplay.h"
 #include "registrar/DigestAuthentication.h"
@@ -117,9 +122,9 @@ class Gateway {
  private:
   bool startOperations(std::string& error);
   // Around each control line: the registrar drops the bindings of
-  // identities the line removed, the trunks follow what it changed. From
-  // followChanges() on every identity is observed, which a gateway never
-  // changed need not pay for.
+  // identities the line removed, the trunks and message waiting follow
+  // what it changed. From followChanges() on every identity is observed,
+  // which a gateway never changed need not pay for.
   void followChanges();
   void beginChange();
   void endChange();
@@ -135,6 +140,9 @@ class Gateway {
   std::unique_ptr<TrunkRegistrations> m_trunks;
   // --calls relay; on the stack after the front-end, ended before it.
   std::unique_ptr<Calls> m_calls;
+  // In the method table for NOTIFY and the registrar's listeners from the
+  // start; on the stack after the trunks.
+  std::unique_ptr<MessageWaiting> m_mwi;
   std::unique_ptr<ModelChanges> m_changes;
   CommandTable m_commands;
   std::unique_ptr<Autosave> m_autosave;

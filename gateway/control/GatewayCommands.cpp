@@ -68,3 +68,14 @@ void addGatewayCommands(CommandTable& table,
                 session.output() << line << "\n";
             });
 }
+
+void addMessageWaitingCommand(CommandTable& table, MessageWaiting const& messageWaiting) {
+  table.add("mwi", "message waiting: each identity's subscription, notifier and last state",
+            [&messageWaiting](ScriptSession& session, Arguments const&) {
+              std::vector<std::string> const lines = messageWaiting.describe();
+              if (lines.empty())
+                session.output() << "no message-waiting faces\n";
+              for (std::string const& line : lines)
+                session.output() << line << "\n";
+            });
+}

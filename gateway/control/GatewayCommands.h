@@ -10,6 +10,10 @@
 //   calls       the calls relayed now (--calls relay), one line each: the
 //               caller, the Request-URI, the state and, once answered,
 //               the contact that answered
+//   mwi         each identity with a message-waiting face in explicit or
+//               implicit mode: its mode, the subscription's state, the
+//               notifier (learnt, when a 3xx named it) and what the
+//               message server said last (MessageWaiting::describe)
 //
 // The handlers read the registrar and take a fresh reading of the
 // statistics for each question; they borrow the registrar, and the table
@@ -21,9 +25,12 @@
 #include "CommandTable.h"
 #include "calls/Calls.h"
 #include "metrics/GatewayStatistics.h"
+#include "mwi/MessageWaiting.h"
 #include "registrar/Registrar.h"
 
 void addGatewayCommands(CommandTable& table,
                         Registrar const& registrar,
                         std::function<GatewayStatistics()> statistics,
                         Calls const* calls);
+// The mwi question; the table must not run a line after messageWaiting died.
+void addMessageWaitingCommand(CommandTable& table, MessageWaiting const& messageWaiting);

@@ -4,6 +4,7 @@
 
 #include "LS_ILocationServiceSubject.h"
 #include "LS_IMasterLocationServiceSubject.h"
+#include "LS_IMwiSubscriptionSubject.h"
 #include "LS_IRegistrationOutboundSubject.h"
 
 ModelChanges::ModelChanges(LS_IMasterLocationService& master) : m_master(master) {
@@ -32,12 +33,16 @@ ModelChanges::~ModelChanges() {
     RefPtr<LS_IRegistrationOutboundSubject> subject;
     if (identity->queryIf(subject).isSuccess())
       subject->removeRegistrationOutboundObserver(this);
+    RefPtr<LS_IMwiSubscriptionSubject> mwi;
+    if (identity->queryIf(mwi).isSuccess())
+      mwi->removeMwiSubscriptionObserver(this);
   }
 }
 
 void ModelChanges::begin() {
   m_removed.clear();
   m_touched.clear();
+  m_mwiTouched.clear();
   m_anyServiceChanged = false;
   m_recording = true;
 }
@@ -66,6 +71,9 @@ void ModelChanges::observe(LS_IIdentity* identity) {
   if (identity->queryIf(subject).isFailure())
     return;
   subject->addRegistrationOutboundObserver(this, 0);
+  RefPtr<LS_IMwiSubscriptionSubject> mwi;
+  if (identity->queryIf(mwi).isSuccess())
+    mwi->addMwiSubscriptionObserver(this, 0);
   m_identities.push_back(identity);
 }
 
@@ -118,6 +126,9 @@ void ModelChanges::onIdentityRemoved(ObserverEvent<LS_ILocationService>& event) 
   RefPtr<LS_IRegistrationOutboundSubject> subject;
   if (identity->queryIf(subject).isSuccess())
     subject->removeRegistrationOutboundObserver(this);
+  RefPtr<LS_IMwiSubscriptionSubject> mwi;
+  if (identity->queryIf(mwi).isSuccess())
+    mwi->removeMwiSubscriptionObserver(this);
   *found = std::move(m_identities.back());
   m_identities.pop_back();
 }
@@ -126,4 +137,10 @@ void ModelChanges::onRegistrationOutboundChange(ObserverEvent<LS_IRegistrationOu
   auto const* changed = dynamic_cast<LS_IRegistrationOutboundSubject::EvIdentity*>(&event);
   if (m_recording && changed && changed->identity)
     m_touched.push_back(changed->identity);
+}
+
+void ModelChanges::onMwiSubscriptionChange(ObserverEvent<LS_IMwiSubscription>& event) {
+  auto const* changed = dynamic_cast<LS_IMwiSubscriptionSubject::EvIdentity*>(&event);
+  if (m_recording && changed && changed->identity)
+    m_mwiTouched.push_back(changed->identity);
 }

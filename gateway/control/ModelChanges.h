@@ -4,7 +4,8 @@
 // every identity (some 100,000 lookups, a quarter of a second, while SIP
 // requests wait). During a line it records the identities removed, the
 // identities added or whose outbound registration changed (own face or one
-// inherited from a group: the library tells every member), and whether a
+// inherited from a group: the library tells every member), apart from them
+// those whose message-waiting face changed, and whether a
 // location service came or went, whose identities are not announced one by
 // one, so that the holders then look at everything.
 //
@@ -27,12 +28,14 @@
 #include "LS_ILocationServiceObserver.h"
 #include "LS_IMasterLocationService.h"
 #include "LS_IMasterLocationServiceObserver.h"
+#include "LS_IMwiSubscriptionObserver.h"
 #include "LS_IRegistrationOutboundObserver.h"
 #include "RefPtr.h"
 
 class ModelChanges final : private LS_IMasterLocationServiceObserver,
                            private LS_ILocationServiceObserver,
-                           private LS_IRegistrationOutboundObserver {
+                           private LS_IRegistrationOutboundObserver,
+                           private LS_IMwiSubscriptionObserver {
  public:
   explicit ModelChanges(LS_IMasterLocationService& master);
   ~ModelChanges();
@@ -47,6 +50,9 @@ class ModelChanges final : private LS_IMasterLocationServiceObserver,
   // one removed later in the same line.
   std::vector<RefPtr<LS_IIdentity>> const& touched() const { return m_touched; }
   bool anyServiceChanged() const { return m_anyServiceChanged; }
+  // With a changed message-waiting face (own or inherited); may hold one
+  // twice, and one removed later in the same line.
+  std::vector<RefPtr<LS_IIdentity>> const& mwiTouched() const { return m_mwiTouched; }
 
  private:
   void observe(LS_ILocationService* service);
@@ -57,6 +63,7 @@ class ModelChanges final : private LS_IMasterLocationServiceObserver,
   void onIdentityAdded(ObserverEvent<LS_ILocationService>& event) override;
   void onIdentityRemoved(ObserverEvent<LS_ILocationService>& event) override;
   void onRegistrationOutboundChange(ObserverEvent<LS_IRegistrationOutbound>& event) override;
+  void onMwiSubscriptionChange(ObserverEvent<LS_IMwiSubscription>& event) override;
 
   LS_IMasterLocationService& m_master;
   std::vector<RefPtr<LS_ILocationService>> m_services;
@@ -65,5 +72,6 @@ class ModelChanges final : private LS_IMasterLocationServiceObserver,
   bool m_recording = false;
   std::vector<LS_IIdentity const*> m_removed;
   std::vector<RefPtr<LS_IIdentity>> m_touched;
+  std::vector<RefPtr<LS_IIdentity>> m_mwiTouched;
   bool m_anyServiceChanged = false;
 };

@@ -29,6 +29,15 @@ std::string GatewayStatistics::text() const {
     for (auto const& entry : callsFailed)
       text += "  failed " + std::to_string(entry.first) + ": " + std::to_string(entry.second) + "\n";
   }
+  uint64_t subscriptions = 0;
+  std::string states;
+  for (auto const& entry : mwiSubscriptions) {
+    subscriptions += entry.second;
+    if (entry.second != 0)
+      states += ", " + entry.first + " " + std::to_string(entry.second);
+  }
+  text += "message waiting: faces " + std::to_string(subscriptions) + states + ", NOTIFYs relayed " +
+          std::to_string(mwiNotifiesRelayed) + "\n";
   char line[128];
   std::snprintf(line, sizeof line, "CPU %.3f s, in the library %.3f s (%.1f%%)\n", cpuSeconds, librarySeconds,
                 cpuSeconds > 0 ? 100.0 * librarySeconds / cpuSeconds : 0.0);

@@ -45,6 +45,10 @@ struct GatewayStatistics {
   std::vector<double> callSetUpBoundsSeconds;
   std::vector<uint64_t> callSetUpBuckets;
   double callSetUpSeconds = 0;
+  // Message-waiting subscriptions by state (MessageWaiting::countByState),
+  // and the NOTIFYs sent on to phones.
+  std::map<std::string, uint64_t> mwiSubscriptions;
+  uint64_t mwiNotifiesRelayed = 0;
   double cpuSeconds = 0;
   double librarySeconds = 0;
 

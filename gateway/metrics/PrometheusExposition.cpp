@@ -89,6 +89,11 @@ std::string render(GatewayStatistics const& statistics) {
     sample(out, "call_setup_seconds_sum", "", statistics.callSetUpSeconds);
     sample(out, "call_setup_seconds_count", "", static_cast<double>(cumulative));
   }
+  family(out, "mwi_subscriptions", "gauge", "Message-waiting subscriptions, by state.");
+  for (auto const& entry : statistics.mwiSubscriptions)
+    sample(out, "mwi_subscriptions", "{state=\"" + entry.first + "\"}", static_cast<double>(entry.second));
+  family(out, "mwi_notifies_relayed_total", "counter", "Message-waiting NOTIFYs sent on to phones.");
+  sample(out, "mwi_notifies_relayed_total", "", static_cast<double>(statistics.mwiNotifiesRelayed));
   family(out, "cpu_seconds_total", "counter", "CPU time of the gateway's event loop.");
   sample(out, "cpu_seconds_total", "", statistics.cpuSeconds);
   family(out, "library_cpu_seconds_total", "counter", "CPU time spent inside the location library's calls.");

@@ -92,6 +92,11 @@ bool SipFrontEnd::onRequest(sip_msg const* request, void* argument) {
     if (verdict != DialogHandler::Verdict::UNKNOWN)
       return verdict == DialogHandler::Verdict::ANSWERED;
   }
+  if (frontEnd.m_subscriptions && pl_isset(&message.to.tag)) {
+    DialogHandler::Verdict const verdict = frontEnd.m_subscriptions->inDialog(message);
+    if (verdict != DialogHandler::Verdict::UNKNOWN)
+      return verdict == DialogHandler::Verdict::ANSWERED;
+  }
   if (message.tp == SIP_TRANSP_UDP)
     frontEnd.enlarge(message.sock);
   if (frontEnd.m_rateLimit && !frontEnd.m_rateLimit->admit(*frontEnd.m_stack, message))

@@ -60,6 +60,8 @@ class SipFrontEnd {
   // What start() opened: "udp:ADDR:PORT tcp:ADDR:PORT ...".
   std::string listening() const { return m_listeners.describe(); }
   std::vector<std::string> const& dnsServers() const { return m_dns.servers(); }
+  // The stack's DNS client, for parts that resolve a name themselves.
+  dnsc* dns() const { return m_dns.client(); }
   // After start(): TLS, WebSocket and secure WebSocket as options ask, each
   // bound one as "tls:ADDR:PORT" (and so on) in bound, else an error text.
   bool startSecure(SecureTransportOptions const& options,
@@ -82,6 +84,9 @@ class SipFrontEnd {
   // session layer listens on the stack after start(), behind the
   // front-end's listener.
   void keepDialogs(DialogHandler& dialogs) { m_dialogs = &dialogs; }
+  // A second such part, for the dialogs of subscriptions (NOTIFY and
+  // SUBSCRIBE with a To tag), asked after the one above; before start().
+  void keepSubscriptions(DialogHandler& subscriptions) { m_subscriptions = &subscriptions; }
   // Whether a URI names the gateway itself (see Listeners::names).
   Listeners const& listeners() const { return m_listeners; }
   RequestLog& log() { return m_log; }
@@ -125,4 +130,5 @@ class SipFrontEnd {
   std::vector<void*> m_enlarged;  // the UDP sockets enlarge() has seen
   std::unique_ptr<SourceRateLimit> m_rateLimit;
   DialogHandler* m_dialogs = nullptr;
+  DialogHandler* m_subscriptions = nullptr;
 };

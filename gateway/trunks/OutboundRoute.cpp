@@ -65,13 +65,14 @@ OutboundRoute::OutboundRoute(LS_IIdentity* caller,
                              TrunkRegistrations& trunks,
                              PenaltyBox& box,
                              LibraryClock& clock,
-                             std::function<bool(std::string const& hop)> const& refused)
+                             std::function<bool(std::string const& hop)> const& refused,
+                             LS_IdentityFace::Type faceType)
     : m_caller(caller), m_from(from), m_box(box), m_clock(clock) {
   RefPtr<LS_IOutbound> face;
   Transport transport = Transport::ANY;
   std::vector<std::string> hops;
   m_clock.measure([&] {
-    LS_getFaceIf(caller, LS_IdentityFace::CALL_OUTBOUND, face);
+    LS_getFaceIf(caller, faceType, face);
     if (!face)
       return;
     transport = transportOf(*face);

@@ -55,6 +55,7 @@
 
 #include "CNameAddr.h"
 #include "LS_IIdentity.h"
+#include "LS_IdentityFace.h"
 #include "RefPtr.h"
 #include "trunks/PenaltyBox.h"
 #include "sip/LibraryClock.h"
@@ -64,13 +65,17 @@ class OutboundRoute {
  public:
   // from: the caller's From address, which credentials held under
   // "DEFAULT" present as user name. refused: hops not to use (one naming
-  // the gateway itself would bring the call back as a new one).
+  // the gateway itself would bring the call back as a new one). face: the
+  // outbound face whose hops these are; a subscription sent on the
+  // identity's behalf goes by its message-waiting face, whose proxies,
+  // transport, forced destination and penalty box are read the same way.
   OutboundRoute(LS_IIdentity* caller,
                 CNameAddr const& from,
                 TrunkRegistrations& trunks,
                 PenaltyBox& box,
                 LibraryClock& clock,
-                std::function<bool(std::string const& hop)> const& refused);
+                std::function<bool(std::string const& hop)> const& refused,
+                LS_IdentityFace::Type face = LS_IdentityFace::CALL_OUTBOUND);
   OutboundRoute(OutboundRoute const&) = delete;
   OutboundRoute& operator=(OutboundRoute const&) = delete;
 
