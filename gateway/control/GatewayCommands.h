@@ -10,10 +10,14 @@
 //   calls       the calls relayed now (--calls relay), one line each: the
 //               caller, the Request-URI, the state and, once answered,
 //               the contact that answered
+//   trunks      the gateway's own registrations, one line each: the
+//               state, the registrar in use (one a 3xx named marked
+//               "(learnt)", which the face's dump does not show) and the
+//               hop it is reached by
 //
 // The handlers read the registrar and take a fresh reading of the
-// statistics for each question; they borrow the registrar, and the table
-// they are added to must not run a line after it died.
+// statistics for each question; they borrow the registrar and the trunks,
+// and the table they are added to must not run a line after either died.
 #pragma once
 
 #include <functional>
@@ -22,8 +26,10 @@
 #include "calls/Calls.h"
 #include "metrics/GatewayStatistics.h"
 #include "registrar/Registrar.h"
+#include "trunks/TrunkRegistrations.h"
 
 void addGatewayCommands(CommandTable& table,
                         Registrar const& registrar,
+                        TrunkRegistrations const& trunks,
                         std::function<GatewayStatistics()> statistics,
                         Calls const* calls);

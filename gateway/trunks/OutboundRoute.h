@@ -17,10 +17,6 @@
 //   no address for the transport, or a caller that is no trunk, leaves the
 //   proxies in charge rather than fail every call. Without proxies the
 //   INVITE goes where its Request-URI says.
-// - A hop is given up, and the next one tried, when it never answered (the
-//   INVITE transaction timeout ran out, or a transport error) or answered
-//   503. Any other final answer, and a timeout after a provisional one, is
-//   the callee's and ends the call: the proxy is alive.
 // - With the face's penalty box on, a hop given up is boxed (PenaltyBox) and
 //   later calls skip it, unless every hop is boxed: then all are tried.
 // - A proxy configured for strict routing is routed loosely too: libre's
@@ -44,8 +40,8 @@
 //   challenges again and that 401 or 407 ends the attempt.
 //
 // Owned by its Call; it holds a reference to the caller identity and
-// borrows the penalty box, the trunks and the clock, which outlive every
-// call. Everything runs on libre's thread.
+// borrows the penalty box (the trunks', shared with their registrations),
+// the trunks and the clock, which outlive every call. Everything runs on libre's thread.
 #pragma once
 
 #include <cstdint>
