@@ -14,6 +14,18 @@ namespace {
 using OutboundHops::hopOf;
 using OutboundHops::Transport;
 
+// The Service-Route the caller's registration learnt (the dynamic proxy of
+// its outbound-registration face) as a hop; empty when it has none.
+std::string serviceRouteOf(LS_IIdentity* caller, Transport transport) {
+  RefPtr<LS_IOutbound> registration;
+  LS_getFaceIf(caller, LS_IdentityFace::REGISTRATION_OUTBOUND, registration);
+  CHostPort address;
+  bool strictRoute = false;
+  if (!registration || registration->getDynamicProxy(address, strictRoute).isFailure())
+    return std::string();
+  return hopOf(address, address, transport);
+}
+
 // The host of a hop "sip:HOST[:PORT];...", for the TLS certificate check.
 std::string hostOf(std::string const& hop) {
   pl text;
@@ -50,7 +62,16 @@ OutboundRoute::OutboundRoute(LS_IIdentity* caller,
       if (!hop.empty())
         return hops.push_back(hop);
     }
-    for (unsigned int index = 0; index < face->getNumberOfProxies(); ++index) {
+    // The Service-Route takes the place of the first proxy, as the face's
+    // own dynamic proxy would; that one, when set, wins.
+    CHostPort ownDynamic;
+    bool ownStrict = false;
+    std::string const serviceRoute = face->getDynamicProxy(ownDynamic, ownStrict).isFailure()
+                                         ? serviceRouteOf(caller, transport)
+                                         : std::string();
+    if (!serviceRoute.empty())
+      hops.push_back(serviceRoute);
+    for (unsigned int index = serviceRoute.empty() ? 0 : 1; index < face->getNumberOfProxies(); ++index) {
       CHostPort address;
       CHostPort tlsAddress;
       bool strictRoute = false;

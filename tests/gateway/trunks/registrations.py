@@ -281,6 +281,19 @@ def dynamic_registrar_and_service_route_are_learnt_and_forgotten(program, work, 
         face = ask_control(control, "dump face example.com trunk registration-outbound")
         check(re.search(r"Proxy.*%s:%d" % (re.escape(UPSTREAM), service_proxy.port), face),
               "the Service-Route is not the face's dynamic proxy: " + face)
+        # The trunk's call out goes by its Service-Route.
+        text = phone.build("INVITE", "sip:4930@pstn.example", "sip:4930@pstn.example", phone.new_call_id(), 1,
+                           ["Contact: <sip:trunk@127.0.0.1:%d>" % phone.port, "Content-Type: application/sdp"])
+        body = "v=0\r\no=p 1 1 IN IP4 127.0.0.1\r\ns=-\r\nc=IN IP4 127.0.0.1\r\nt=0 0\r\nm=audio 4000 RTP/AVP 0\r\n"
+        text = text.replace("From: <sip:phone@example.com>", "From: <sip:trunk@example.com>")
+        text = text.replace("Content-Length: 0\r\n\r\n", "Content-Length: %d\r\n\r\n%s" % (len(body), body))
+        status = phone.send(text).status
+        while status < 200:
+            data, _ = phone.socket.recvfrom(65535)
+            status = int(data.decode(errors="replace").split()[1])
+        invite = service_proxy.await_request(lambda text: text.startswith("INVITE "), "call out by the Service-Route")
+        check(re.match(r"<sip:%s:%d;lr>" % (re.escape(UPSTREAM), service_proxy.port), header(invite, "Route") or ""),
+              "the call out was not routed by the Service-Route: " + invite)
         # A change ends the registration: what it taught is forgotten, and
         # the next REGISTER goes to the configured registrar again.
         ask_control(control, "face example.com trunk registration-outbound lifetime set 301")
