@@ -77,10 +77,10 @@
 // a trunk that is new registers, one that is gone (or no longer has a
 // registrar) unregisters, one whose registrar, address of record, hops,
 // lifetime, mode or priority changed unregisters and registers anew, and the
-// rest are left alone, registered as they are. follow() looks only at the identities the
-// change touched (see ModelChanges); followAll() at every identity, which
-// with 100,000 subscribers takes a quarter of a second, for the rare change
-// that adds or removes a whole location service.
+// rest are left alone, registered as they are. follow() looks only at the
+// identities the change touched (see ModelChanges); followAll() at every
+// identity, which with 100,000 subscribers takes a quarter of a second, for
+// the rare change that adds or removes a whole location service.
 //
 // stop() unregisters: it drops every sipreg, which sends its REGISTER with
 // expiry 0 and lives on inside libre until answered; the caller then lets the
