@@ -76,6 +76,7 @@ bool Gateway::start(std::string& error) {
     return false;
   m_trunks = std::make_unique<TrunkRegistrations>(m_frontEnd.stack(), m_session, m_clock);
   m_trunks->useCaFile(m_settings.caFile);
+  m_trunks->followBindings(m_registrar);
   m_trunks->start();
   if (m_calls)
     m_calls->useTrunks(*m_trunks);
@@ -102,7 +103,7 @@ bool Gateway::startOperations(std::string& error) {
   if (!m_settings.control.empty()) {
     addScriptCommands(m_commands);
     addGatewayCommands(
-        m_commands, m_registrar, [this] { return statistics(); }, m_calls.get());
+        m_commands, m_registrar, *m_trunks, [this] { return statistics(); }, m_calls.get());
     addMessageWaitingCommand(m_commands, *m_mwi);
     m_control = std::make_unique<ControlServer>(m_session, m_commands);
     followChanges();

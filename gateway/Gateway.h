@@ -34,6 +34,9 @@
 //   Admission reads.
 // - The trunks start on the stack once it is open and die after its
 //   transactions were ended (SipFrontEnd::close()), before the stack itself.
+//   They listen to the registrar's bindings (a back-to-back trunk registers
+//   while a phone of its identity is registered) and leave its listeners
+//   when they die, before it.
 // - The control socket, the autosave and the metrics come last and go
 //   first, before the trunks unregister.
 // - Message waiting starts on the stack after the trunks, whose routes its

@@ -192,8 +192,8 @@ void Calls::callOut(Exchange& exchange, std::string const& why, RefPtr<LS_IIdent
     return exchange.answer(488, "Not Acceptable Here");
   CNameAddr from;
   from.Parse(invite.from.auri.p, invite.from.auri.l);
-  auto route = std::make_unique<OutboundRoute>(caller.get(), from, *m_trunks, m_penaltyBox, exchange.clock(),
-                                               [this](std::string const& hop) {
+  auto route = std::make_unique<OutboundRoute>(caller.get(), from, *m_trunks, m_trunks->penaltyBox(),
+                                               exchange.clock(), [this](std::string const& hop) {
                                                  return isGateway(Registrar::CallTarget{hop, hop, "", 0});
                                                });
   if (!route->available())

@@ -51,7 +51,6 @@
 #include <vector>
 
 #include "calls/Call.h"
-#include "trunks/PenaltyBox.h"
 #include "registrar/Registrar.h"
 #include "sip/DialogHandler.h"
 #include "sip/Libre.h"
@@ -153,5 +152,4 @@ class Calls final : public RequestHandler, public DialogHandler {
   tmr m_reap;
   Statistics m_statistics;
   TrunkRegistrations* m_trunks = nullptr;
-  PenaltyBox m_penaltyBox;
 };

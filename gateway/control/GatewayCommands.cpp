@@ -43,6 +43,7 @@ void printBindings(ScriptSession& session, Registrar const& registrar, Arguments
 
 void addGatewayCommands(CommandTable& table,
                         Registrar const& registrar,
+                        TrunkRegistrations const& trunks,
                         std::function<GatewayStatistics()> statistics,
                         Calls const* calls) {
   table.add("statistics", "what the gateway answered, its bindings and trunks, the library's CPU share",
@@ -56,6 +57,14 @@ void addGatewayCommands(CommandTable& table,
   table.add("bindings <service> <identity>", "the contacts one identity registered here",
             [&registrar](ScriptSession& session, Arguments const& arguments) {
               printBindings(session, registrar, arguments);
+            });
+  table.add("trunks", "the gateway's own registrations: state, registrar in use and hop",
+            [&trunks](ScriptSession& session, Arguments const&) {
+              std::vector<std::string> const lines = trunks.describe();
+              if (lines.empty())
+                session.output() << "no trunks\n";
+              for (std::string const& line : lines)
+                session.output() << line << "\n";
             });
   if (!calls)
     return;

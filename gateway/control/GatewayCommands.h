@@ -14,10 +14,14 @@
 //               implicit mode: its mode, the subscription's state, the
 //               notifier (learnt, when a 3xx named it) and what the
 //               message server said last (MessageWaiting::describe)
+//   trunks      the gateway's own registrations, one line each: the
+//               state, the registrar in use (one a 3xx named marked
+//               "(learnt)", which the face's dump does not show) and the
+//               hop it is reached by
 //
 // The handlers read the registrar and take a fresh reading of the
-// statistics for each question; they borrow the registrar, and the table
-// they are added to must not run a line after it died.
+// statistics for each question; they borrow the registrar and the trunks,
+// and the table they are added to must not run a line after either died.
 #pragma once
 
 #include <functional>
@@ -27,9 +31,11 @@
 #include "metrics/GatewayStatistics.h"
 #include "mwi/MessageWaiting.h"
 #include "registrar/Registrar.h"
+#include "trunks/TrunkRegistrations.h"
 
 void addGatewayCommands(CommandTable& table,
                         Registrar const& registrar,
+                        TrunkRegistrations const& trunks,
                         std::function<GatewayStatistics()> statistics,
                         Calls const* calls);
 // The mwi question; the table must not run a line after messageWaiting died.

@@ -87,6 +87,7 @@
 // comes back to where it started. Everything runs on libre's thread.
 #pragma once
 
+#include <algorithm>
 #include <map>
 #include <memory>
 #include <string>
@@ -139,6 +140,11 @@ class Registrar final : public RequestHandler {
   BindingStore* store() const { return m_store; }
   // Borrowed; each must outlive the registrar or be added to no registrar.
   void addListener(BindingListener* listener) { m_listeners.push_back(listener); }
+  // For a listener that dies first; not from inside a notice, which still
+  // reaches every listener it began with.
+  void removeListener(BindingListener* listener) {
+    m_listeners.erase(std::remove(m_listeners.begin(), m_listeners.end(), listener), m_listeners.end());
+  }
   // Makes the identity's bindings exactly these (on MonotonicClock),
   // without reporting to the store; dynamic: the identity was created for
   // them. False when the identity has no registration face to hold them.

@@ -7,45 +7,23 @@
 #include "LS_IdentityFace.h"
 #include "sip/Libre.h"
 #include "sip/MonotonicClock.h"
+#include "trunks/OutboundHops.h"
 
 namespace {
 
-enum class Transport { ANY, UDP, TCP, TLS };
+using OutboundHops::hopOf;
+using OutboundHops::Transport;
 
-Transport transportOf(LS_IOutbound& face) {
-  LS_ProtocolConfig::Type protocol = LS_ProtocolConfig::PREFERRED_NONE;
-  if (face.getPreferredProtocol(protocol).isFailure())
-    return Transport::ANY;
-  switch (protocol) {
-    case LS_ProtocolConfig::PREFERRED_UDP_TCP_TLS:
-    case LS_ProtocolConfig::PREFERRED_UDP_TLS_TCP:
-    case LS_ProtocolConfig::FORCED_UDP:
-      return Transport::UDP;
-    case LS_ProtocolConfig::PREFERRED_TCP_UDP_TLS:
-    case LS_ProtocolConfig::PREFERRED_TCP_TLS_UDP:
-    case LS_ProtocolConfig::FORCED_TCP:
-      return Transport::TCP;
-    case LS_ProtocolConfig::PREFERRED_TLS_UDP_TCP:
-    case LS_ProtocolConfig::PREFERRED_TLS_TCP_UDP:
-    case LS_ProtocolConfig::FORCED_TLS:
-      return Transport::TLS;
-    default:
-      return Transport::ANY;
-  }
-}
-
-// address, or for TLS tlsAddress when it has a host; empty when neither
-// names one.
-std::string hopOf(CHostPort const& address, CHostPort const& tlsAddress, Transport transport) {
-  CHostPort const& chosen =
-      transport == Transport::TLS && !tlsAddress.GetHost().isEmpty() ? tlsAddress : address;
-  if (chosen.GetHost().isEmpty())
+// The Service-Route the caller's registration learnt (the dynamic proxy of
+// its outbound-registration face) as a hop; empty when it has none.
+std::string serviceRouteOf(LS_IIdentity* caller, Transport transport) {
+  RefPtr<LS_IOutbound> registration;
+  LS_getFaceIf(caller, LS_IdentityFace::REGISTRATION_OUTBOUND, registration);
+  CHostPort address;
+  bool strictRoute = false;
+  if (!registration || registration->getDynamicProxy(address, strictRoute).isFailure())
     return std::string();
-  std::string hop = std::string("sip:") + chosen.GetHost().c_str();
-  if (chosen.GetPort() != 0)
-    hop += ":" + std::to_string(chosen.GetPort());
-  static char const* const kParameters[] = {"", ";transport=udp", ";transport=tcp", ";transport=tls"};
-  return hop + kParameters[static_cast<int>(transport)];
+  return hopOf(address, address, transport);
 }
 
 // The host of a hop "sip:HOST[:PORT];...", for the TLS certificate check.
@@ -75,7 +53,7 @@ OutboundRoute::OutboundRoute(LS_IIdentity* caller,
     LS_getFaceIf(caller, faceType, face);
     if (!face)
       return;
-    transport = transportOf(*face);
+    transport = OutboundHops::transportOf(*face);
     m_penaltyBox = face->getPenaltyBox();
     LS_ForcedDestination forced;
     if (face->getForcedDestination(forced).isSuccess()) {
@@ -85,7 +63,16 @@ OutboundRoute::OutboundRoute(LS_IIdentity* caller,
       if (!hop.empty())
         return hops.push_back(hop);
     }
-    for (unsigned int index = 0; index < face->getNumberOfProxies(); ++index) {
+    // The Service-Route takes the place of the first proxy, as the face's
+    // own dynamic proxy would; that one, when set, wins.
+    CHostPort ownDynamic;
+    bool ownStrict = false;
+    std::string const serviceRoute = face->getDynamicProxy(ownDynamic, ownStrict).isFailure()
+                                         ? serviceRouteOf(caller, transport)
+                                         : std::string();
+    if (!serviceRoute.empty())
+      hops.push_back(serviceRoute);
+    for (unsigned int index = serviceRoute.empty() ? 0 : 1; index < face->getNumberOfProxies(); ++index) {
       CHostPort address;
       CHostPort tlsAddress;
       bool strictRoute = false;

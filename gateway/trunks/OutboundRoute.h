@@ -17,6 +17,12 @@
 //   no address for the transport, or a caller that is no trunk, leaves the
 //   proxies in charge rather than fail every call. Without proxies the
 //   INVITE goes where its Request-URI says.
+// - The Service-Route the caller's own registration learnt (RFC 3608, the
+//   dynamic proxy of its outbound-registration face, see
+//   TrunkRegistrations) takes the place of the call face's first proxy, as
+//   the face's own dynamic proxy would: the carrier that registered the
+//   identity named the way its requests take. The call face's own dynamic
+//   proxy, when it has one, wins; a forced destination wins over both.
 // - A hop is given up, and the next one tried, when it never answered (the
 //   INVITE transaction timeout ran out, or a transport error) or answered
 //   503. Any other final answer, and a timeout after a provisional one, is
@@ -44,8 +50,8 @@
 //   challenges again and that 401 or 407 ends the attempt.
 //
 // Owned by its Call; it holds a reference to the caller identity and
-// borrows the penalty box, the trunks and the clock, which outlive every
-// call. Everything runs on libre's thread.
+// borrows the penalty box (the trunks', shared with their registrations),
+// the trunks and the clock, which outlive every call. Everything runs on libre's thread.
 #pragma once
 
 #include <cstdint>

@@ -1,8 +1,11 @@
-// PenaltyBox: the proxies of outbound calls that failed lately (no answer
-// within the INVITE transaction timeout, a transport error, or 503), so that
-// calls from a face with the penalty box switched on skip them for a while
-// instead of each waiting out the same timeout. What a proxy is, and which
-// failures count, is OutboundRoute's to say; this only keeps the time.
+// PenaltyBox: the proxies that failed lately a request sent on an
+// identity's behalf (no answer within the face's transaction timeout, a
+// transport error, or 503), so that requests from a face with the penalty
+// box switched on skip them for a while instead of each waiting out the
+// same timeout. What a proxy is, and which failures count, is for the
+// calls OutboundRoute's and for the registrations RegistrationRoute's to
+// say; this only keeps the time. One box serves both: a proxy that let a
+// REGISTER down is as dead for the next call.
 //
 // Decision: a proxy stays boxed for kBoxMs, 60 s, from its last failure.
 // Long enough that a burst of calls pays the timeout of a dead proxy once,
@@ -13,7 +16,7 @@
 // Proxies are keyed by the route text a call is sent with, transport
 // included: the same host over UDP and over TLS are different paths. The
 // time is passed in, so that the rules can be checked without waiting.
-// Owned by Calls, shared by every face; one thread, libre's.
+// Owned by TrunkRegistrations, shared by every face; one thread, libre's.
 #pragma once
 
 #include <cstdint>
