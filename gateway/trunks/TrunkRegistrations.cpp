@@ -8,6 +8,7 @@
 #include "LS_CredentialLookup.h"
 #include "LS_ILocationService.h"
 #include "LS_IOutbound.h"
+#include "trunks/InstanceId.h"
 
 namespace {
 
@@ -116,7 +117,8 @@ void TrunkRegistrations::replace(LS_IIdentity const* identity, std::unique_ptr<T
 
 bool TrunkRegistrations::same(Trunk const& a, Trunk const& b) {
   return a.path == b.path && a.registrarUri == b.registrarUri && a.addressOfRecord == b.addressOfRecord &&
-         a.route == b.route && a.lifetime == b.lifetime;
+         a.route == b.route && a.lifetime == b.lifetime && a.detectAddress == b.detectAddress &&
+         a.flows == b.flows && a.checkSource == b.checkSource;
 }
 
 void TrunkRegistrations::followAll() {
@@ -217,22 +219,18 @@ std::unique_ptr<TrunkRegistrations::Trunk> TrunkRegistrations::findTrunk(LS_IIde
   }
   if (secure)
     trunk->tlsHost = trunk->nextHop;
+  readTraversal(*trunk, *face, outbound.get());
   tmr_init(&trunk->timer);
   trunk->keepAlive = std::make_unique<TrunkKeepAlive>(m_stack, onKeepAliveFailed, trunk.get());
   return trunk;
 }
 
 void TrunkRegistrations::registerTrunk(Trunk& trunk) {
-  char const* routes[] = {trunk.route.c_str()};
   std::string tlsError;
-  int const error =
-      !trunk.tlsHost.empty() && !m_tls.verify(m_stack, trunk.tlsHost, m_caFile, tlsError)
-          ? EPROTO
-          : sipreg_register(&trunk.registration, &m_stack, trunk.registrarUri.c_str(),
-                            trunk.addressOfRecord.c_str(), nullptr, trunk.addressOfRecord.c_str(),
-                            trunk.lifetime, trunk.user.c_str(), trunk.route.empty() ? nullptr : routes,
-                            trunk.route.empty() ? 0 : 1, 0, onChallenge, &trunk, false, onResponse, &trunk,
-                            nullptr, nullptr);
+  int const error = !trunk.tlsHost.empty() && !m_tls.verify(m_stack, trunk.tlsHost, m_caFile, tlsError)
+                        ? EPROTO
+                        : RegistrationClient::start(trunk.registration, m_stack, clientSettings(trunk),
+                                                    onChallenge, onResponse, onKeepAliveFailed, &trunk);
   if (error == 0)
     return;
   unsigned int const seconds = m_clock.measure([&] { return trunk.face->getRetryTimeoutOnSystemError(); });
@@ -286,6 +284,10 @@ void TrunkRegistrations::onResponse(int error, sip_msg const* response, void* ar
                    [](char c) { return static_cast<char>(std::tolower(static_cast<unsigned char>(c))); });
     owner.report("trunk " + trunk.path + " registered at " + transport + ":" + address + " for " +
                  std::to_string(trunk.lifetime) + " s");
+    if (trunk.registration && trunk.registration->keepsFlowAlive()) {
+      trunk.keepAlive->stop();
+      return;
+    }
     LS_KeepAliveMethod::Type method = LS_KeepAliveMethod::NONE;
     unsigned int interval = 0;
     clock.measure([&] {
@@ -299,7 +301,10 @@ void TrunkRegistrations::onResponse(int error, sip_msg const* response, void* ar
   trunk.keepAlive->stop();
   unsigned int seconds;
   std::string cause;
-  if (error != 0 || !response) {
+  if (error == EPERM && response) {
+    seconds = clock.measure([&] { return trunk.face->getRetryTimeoutOnSystemError(); });
+    cause = refusedSource(trunk, *response);
+  } else if (error != 0 || !response) {
     seconds = clock.measure([&] { return trunk.face->getRetryTimeoutOnSystemError(); });
     cause = failureCause(error, trunk.nextHop);
   } else if (response->scode >= 500 && response->scode < 600) {
@@ -316,7 +321,7 @@ void TrunkRegistrations::onResponse(int error, sip_msg const* response, void* ar
 
 void TrunkRegistrations::onDropFailed(void* argument) {
   Trunk& trunk = *static_cast<Trunk*>(argument);
-  trunk.registration = static_cast<sipreg*>(mem_deref(trunk.registration));
+  RegistrationClient::release(trunk.registration);
   tmr_start(&trunk.timer, trunk.retryMs, onRetry, &trunk);
 }
 
@@ -343,10 +348,47 @@ void TrunkRegistrations::unregisterTrunk(Trunk& trunk) {
   if (trunk.registered)
     report("trunk " + trunk.path + " unregistering");
   trunk.registered = false;
-  trunk.registration = static_cast<sipreg*>(mem_deref(trunk.registration));
+  RegistrationClient::release(trunk.registration);
 }
 
 void TrunkRegistrations::stop() {
   for (std::unique_ptr<Trunk> const& trunk : m_trunks)
     unregisterTrunk(*trunk);
+}
+
+void TrunkRegistrations::readTraversal(Trunk& trunk, LS_IRegistrationOutbound& face, LS_IOutbound* outbound) {
+  trunk.detectAddress = face.getNatTraversalMethod() == LS_NatTraversalMethod::ADDRESS_DETECTION;
+  trunk.flows = face.getNatTraversalFlows() || (outbound && outbound->getUseFlows());
+  trunk.checkSource = face.getDnsSecurityCheck();
+}
+
+RegistrationClient::Settings TrunkRegistrations::clientSettings(Trunk& trunk) {
+  RegistrationClient::Settings settings;
+  settings.registrarUri = trunk.registrarUri;
+  settings.addressOfRecord = trunk.addressOfRecord;
+  settings.user = trunk.user;
+  settings.route = trunk.route;
+  settings.lifetime = trunk.lifetime;
+  settings.detectAddress = trunk.detectAddress;
+  settings.checkSource = trunk.checkSource;
+  settings.flowInterval = m_clock.measure([&] { return trunk.face->getKeepAliveInterval(); });
+  if (!trunk.flows)
+    return settings;
+  if (!m_instanceTried) {
+    m_instanceTried = true;
+    std::string error;
+    if (!InstanceId::load(m_instanceFile, m_instance, error))
+      report(error + ": trunks register without flows");
+  }
+  if (m_instance.empty())
+    return settings;
+  settings.regId = 1;
+  settings.instance = m_instance;
+  return settings;
+}
+
+std::string TrunkRegistrations::refusedSource(Trunk const& trunk, sip_msg const& answer) {
+  char address[64];
+  re_snprintf(address, sizeof address, "%J", &answer.src);
+  return std::string("answer from ") + address + ", not an address of " + trunk.nextHop;
 }
