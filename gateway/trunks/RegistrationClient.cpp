@@ -156,7 +156,7 @@ void RegistrationClient::fail(int error, sip_msg const* answer) {
   m_onResponse(error, answer, m_argument);
 }
 
-bool RegistrationClient::learntAddress(sip_msg const& answer, sa& address) {
+bool RegistrationClient::addressSeenBy(sip_msg const& answer, sa& address) {
   pl received;
   pl rport;
   bool const hasReceived = msg_param_decode(&answer.via.params, "received", &received) == 0;
@@ -198,7 +198,7 @@ void RegistrationClient::accepted(sip_msg const& answer) {
     return;
   }
   sa learnt;
-  if (m_settings.detectAddress && answer.tp == SIP_TRANSP_UDP && learntAddress(answer, learnt) &&
+  if (m_settings.detectAddress && answer.tp == SIP_TRANSP_UDP && addressSeenBy(answer, learnt) &&
       !sa_cmp(&learnt, &m_contactAddress, SA_ALL)) {
     if (m_settings.regId == 0)
       m_stale = m_contact;

@@ -94,6 +94,12 @@ class RegistrationClient {
   // libre's keep-alive watches the registration's flow.
   bool keepsFlowAlive() const { return m_flow != nullptr; }
 
+  // The address:port the top Via of answer says the registrar saw it come
+  // from: received, else the sent-by address, with rport, else the sent-by
+  // port (RFC 3581). False when the Via has neither, or an rport without a
+  // value (what the request itself asked for).
+  static bool addressSeenBy(sip_msg const& answer, sa& address);
+
   RegistrationClient(RegistrationClient const&) = delete;
   RegistrationClient& operator=(RegistrationClient const&) = delete;
 
@@ -105,9 +111,6 @@ class RegistrationClient {
   // The request ended badly: reported, or the end of a released client.
   void fail(int error, sip_msg const* answer);
   void accepted(sip_msg const& answer);
-  // The address:port the top Via of answer says the registrar saw; false
-  // when it says nothing of it.
-  static bool learntAddress(sip_msg const& answer, sa& address);
   bool sentTo(sa const& source) const;
   static int onSend(enum sip_transp transport,
                     sa const* source,
