@@ -77,7 +77,7 @@ int RegistrationClient::request(bool resetLoop) {
                        "%s"
                        "Content-Length: 0\r\n"
                        "\r\n",
-                       m_settings.regId > 0 ? "Supported: outbound, path\r\n" : "");
+                       m_settings.regId > 0 ? "Supported: outbound\r\n" : "");
 }
 
 int RegistrationClient::onSend(enum sip_transp transport,
