@@ -15,6 +15,14 @@ void onSignal(int) {
   re_cancel();
 }
 
+// The trunks' instance URN (InstanceId) lives beside a store file, else,
+// for a database store or none, in the working directory: a database is
+// shared by gateways that are each a user agent of their own.
+std::string instanceFile(std::string const& store) {
+  bool const file = store != "none" && store.find("://") == std::string::npos && !store.empty();
+  return file ? store + ".instance" : "location-gateway.instance";
+}
+
 }  // namespace
 
 Gateway::Gateway(ScriptSession& session, Settings settings)
@@ -77,6 +85,7 @@ bool Gateway::start(std::string& error) {
   m_trunks = std::make_unique<TrunkRegistrations>(m_frontEnd.stack(), m_session, m_clock);
   m_trunks->useCaFile(m_settings.caFile);
   m_trunks->followBindings(m_registrar);
+  m_trunks->useInstanceFile(instanceFile(m_settings.store));
   m_trunks->start();
   if (m_calls)
     m_calls->useTrunks(*m_trunks);

@@ -9,6 +9,7 @@
 #include "LS_ILocationService.h"
 #include "LS_IOutbound.h"
 #include "sip/MonotonicClock.h"
+#include "trunks/InstanceId.h"
 #include "trunks/TrunkSelection.h"
 
 namespace {
@@ -260,7 +261,8 @@ void TrunkRegistrations::replace(LS_IIdentity const* identity, std::unique_ptr<T
 bool TrunkRegistrations::same(Trunk const& a, Trunk const& b) {
   return a.path == b.path && a.registrarUri == b.registrarUri && a.addressOfRecord == b.addressOfRecord &&
          a.configured == b.configured && a.lifetime == b.lifetime && a.mode == b.mode &&
-         a.priority == b.priority && a.answerTimeoutS == b.answerTimeoutS;
+         a.priority == b.priority && a.answerTimeoutS == b.answerTimeoutS && a.detectAddress == b.detectAddress &&
+         a.flows == b.flows && a.checkSource == b.checkSource;
 }
 
 void TrunkRegistrations::followAll() {
@@ -367,6 +369,7 @@ std::unique_ptr<TrunkRegistrations::Trunk> TrunkRegistrations::findTrunk(LS_IIde
   }
   if (trunk->mode == LS_RegistrationMode::BACK_TO_BACK)
     trunk->bound = hasPhones(identity);
+  readTraversal(*trunk, *face, outbound.get());
   tmr_init(&trunk->timer);
   tmr_init(&trunk->answerTimer);
   trunk->keepAlive = std::make_unique<TrunkKeepAlive>(m_stack, onKeepAliveFailed, trunk.get());
@@ -386,18 +389,11 @@ void TrunkRegistrations::registerTrunk(Trunk& trunk) {
   trunk.nextHop =
       hostOf(trunk.attempt.routes.empty() ? trunk.attempt.requestUri : trunk.attempt.routes.front());
   trunk.tlsHost = trunk.secure ? trunk.nextHop : std::string();
-  std::vector<char const*> routes;
-  for (std::string const& route : trunk.attempt.routes)
-    routes.push_back(route.c_str());
   std::string tlsError;
-  int const error =
-      !trunk.tlsHost.empty() && !m_tls.verify(m_stack, trunk.tlsHost, m_caFile, tlsError)
-          ? EPROTO
-          : sipreg_register(&trunk.registration, &m_stack, trunk.attempt.requestUri.c_str(),
-                            trunk.addressOfRecord.c_str(), nullptr, trunk.addressOfRecord.c_str(),
-                            trunk.lifetime, trunk.user.c_str(), routes.empty() ? nullptr : routes.data(),
-                            static_cast<uint32_t>(routes.size()), 0, onChallenge, &trunk, false, onResponse,
-                            &trunk, nullptr, nullptr);
+  int const error = !trunk.tlsHost.empty() && !m_tls.verify(m_stack, trunk.tlsHost, m_caFile, tlsError)
+                        ? EPROTO
+                        : RegistrationClient::start(trunk.registration, m_stack, clientSettings(trunk),
+                                                    onChallenge, onResponse, onKeepAliveFailed, &trunk);
   if (error == 0) {
     if (trunk.answerTimeoutS != 0)
       tmr_start(&trunk.answerTimer, uint64_t{trunk.answerTimeoutS} * 1000, onAnswerTimeout, &trunk);
@@ -457,13 +453,18 @@ void TrunkRegistrations::onResponse(int error, sip_msg const* response, void* ar
                    [](char c) { return static_cast<char>(std::tolower(static_cast<unsigned char>(c))); });
     owner.report("trunk " + trunk.path + " registered at " + transport + ":" + address + " for " +
                  std::to_string(trunk.lifetime) + " s");
-    LS_KeepAliveMethod::Type method = LS_KeepAliveMethod::NONE;
-    unsigned int interval = 0;
-    clock.measure([&] {
-      method = trunk.face->getKeepAliveMethod();
-      interval = trunk.face->getKeepAliveInterval();
-    });
-    trunk.keepAlive->start(*response, method, interval, trunk.registrarUri, trunk.addressOfRecord);
+    // libre's keep-alive of the flow, or the face's own: never both.
+    if (trunk.registration && trunk.registration->keepsFlowAlive()) {
+      trunk.keepAlive->stop();
+    } else {
+      LS_KeepAliveMethod::Type method = LS_KeepAliveMethod::NONE;
+      unsigned int interval = 0;
+      clock.measure([&] {
+        method = trunk.face->getKeepAliveMethod();
+        interval = trunk.face->getKeepAliveInterval();
+      });
+      trunk.keepAlive->start(*response, method, interval, trunk.registrarUri, trunk.addressOfRecord);
+    }
     // The worse trunks standing in for this one step back.
     if (recovered)
       owner.reselect(trunk.user);
@@ -476,11 +477,10 @@ void TrunkRegistrations::onResponse(int error, sip_msg const* response, void* ar
     tmr_start(&trunk.timer, 0, onDropFailed, &trunk);
     return;
   }
-  owner.fail(
-      trunk, error, response,
-      "failed to register (" +
-          (error != 0 || !response ? failureCause(error, trunk.nextHop) : std::to_string(response->scode)) +
-          ")");
+  std::string const cause = error == EPERM && response ? owner.refusedSource(trunk, *response)
+                            : error != 0 || !response  ? failureCause(error, trunk.nextHop)
+                                                       : std::to_string(response->scode);
+  owner.fail(trunk, error, response, "failed to register (" + cause + ")");
 }
 
 void TrunkRegistrations::fail(Trunk& trunk, int error, sip_msg const* response, std::string const& cause) {
@@ -546,7 +546,7 @@ void TrunkRegistrations::forgetLearnt(Trunk& trunk) {
 
 void TrunkRegistrations::onDropFailed(void* argument) {
   Trunk& trunk = *static_cast<Trunk*>(argument);
-  trunk.registration = static_cast<sipreg*>(mem_deref(trunk.registration));
+  RegistrationClient::release(trunk.registration);
   tmr_start(&trunk.timer, trunk.retryMs, onRetry, &trunk);
   // A worse trunk of the account may now stand in; this one may have to
   // stand by, which cancels its retry.
@@ -581,7 +581,7 @@ void TrunkRegistrations::unregisterTrunk(Trunk& trunk) {
   trunk.active = false;
   trunk.failed = false;
   trunk.lastFailure.clear();
-  trunk.registration = static_cast<sipreg*>(mem_deref(trunk.registration));
+  RegistrationClient::release(trunk.registration);
   forgetLearnt(trunk);
 }
 
@@ -589,4 +589,41 @@ void TrunkRegistrations::stop() {
   m_stopped = true;
   for (std::unique_ptr<Trunk> const& trunk : m_trunks)
     unregisterTrunk(*trunk);
+}
+
+void TrunkRegistrations::readTraversal(Trunk& trunk, LS_IRegistrationOutbound& face, LS_IOutbound* outbound) {
+  trunk.detectAddress = face.getNatTraversalMethod() == LS_NatTraversalMethod::ADDRESS_DETECTION;
+  trunk.flows = face.getNatTraversalFlows() || (outbound && outbound->getUseFlows());
+  trunk.checkSource = face.getDnsSecurityCheck();
+}
+
+RegistrationClient::Settings TrunkRegistrations::clientSettings(Trunk& trunk) {
+  RegistrationClient::Settings settings;
+  settings.registrarUri = trunk.attempt.requestUri;
+  settings.addressOfRecord = trunk.addressOfRecord;
+  settings.user = trunk.user;
+  settings.routes = trunk.attempt.routes;
+  settings.lifetime = trunk.lifetime;
+  settings.detectAddress = trunk.detectAddress;
+  settings.checkSource = trunk.checkSource;
+  settings.flowInterval = m_clock.measure([&] { return trunk.face->getKeepAliveInterval(); });
+  if (!trunk.flows)
+    return settings;
+  if (!m_instanceTried) {
+    m_instanceTried = true;
+    std::string error;
+    if (!InstanceId::load(m_instanceFile, m_instance, error))
+      report(error + ": trunks register without flows");
+  }
+  if (m_instance.empty())
+    return settings;
+  settings.regId = 1;
+  settings.instance = m_instance;
+  return settings;
+}
+
+std::string TrunkRegistrations::refusedSource(Trunk const& trunk, sip_msg const& answer) {
+  char address[64];
+  re_snprintf(address, sizeof address, "%J", &answer.src);
+  return std::string("answer from ") + address + ", not an address of " + trunk.nextHop;
 }

@@ -1,13 +1,13 @@
 // TrunkRegistrations: the gateway's own registrations. Every identity (not a
 // group) whose outbound-registration face has a registrar, configured or
-// else learnt, is a trunk and registers there through libre's sipreg, as its
-// registration mode and priority say (below): the address of record is the
-// face's URI scheme with the identity's name at the registrar's host, the
-// lifetime is the face's, and the face's hops (RegistrationRoute: forced
+// else learnt, is a trunk and registers there through a RegistrationClient,
+// as its registration mode and priority say (below): the address of record
+// is the face's URI scheme with the identity's name at the registrar's host,
+// the lifetime is the face's, and the face's hops (RegistrationRoute: forced
 // destination, proxies, penalty box) are the route (libre routes loosely
 // only, so a proxy configured for strict routing is routed loosely too). A
 // 401 or 407 is answered with the library's outbound credentials for the
-// challenge's realm; sipreg refreshes a registration before it expires.
+// challenge's realm; the client refreshes a registration before it expires.
 //
 // The registration mode, with the decision for "none":
 // - "auto": the trunk registers from the start, and stays registered.
@@ -38,17 +38,17 @@
 //   as its first Proxy, and which routes the identity's calls out
 //   (OutboundRoute). Each 2xx replaces it, one without any removes it. The
 //   REGISTER itself does not take it (see RegistrationRoute), and could
-//   not: sipreg refreshes along the route it was made with, and making a
-//   new one would unregister the very contact first.
+//   not: the client refreshes along the route it was made with, and making
+//   a new one would unregister the very contact first.
 // - The address the 2xx came from is recorded with setRegistrarAddr (the
 //   face has no way to remove it).
 //
 // The face's non-INVITE transaction timeout bounds the first REGISTER of
 // each registration, its answer to a challenge included: no final answer
 // within it is a system error, as libre's own timeout would be. 0 leaves
-// libre's. It cannot bound the refreshes: sipreg sends them on a timer of
-// its own that the gateway does not see, and libre's transactions run on
-// their fixed 64*T1 (32 s).
+// libre's. It does not bound the refreshes, which the client sends on a
+// timer of its own, and libre's transactions run on their fixed 64*T1
+// (32 s).
 //
 // A trunk registers over TLS when its face's URI scheme is sips or the face
 // names a TLS registrar (which then takes the place of the plain one); its
@@ -58,17 +58,17 @@
 // On failure the registration is dropped and made anew after the face's
 // retry timeout for that class of error: system (no answer, transport
 // failure), server (5xx) or client (any other final failure, 4xx and 6xx),
-// instead of sipreg's own back-off, so that the configuration decides. With
-// the face's penalty box on, a hop that gave no answer or 503 is boxed
-// (PenaltyBox, shared with the calls) and the next attempt takes the next
-// hop. Progress goes to standard error, one line per event; a
+// instead of a back-off of the client's own, so that the configuration
+// decides. With the face's penalty box on, a hop that gave no answer or 503
+// is boxed (PenaltyBox, shared with the calls) and the next attempt takes
+// the next hop. Progress goes to standard error, one line per event; a
 // failure like the one before it is not told again, so that a carrier whose
 // name does not resolve, retried every few seconds for days, leaves one line
 // and not thousands.
 //
 // A registrar or proxy named by host name is found by the stack's DNS client
-// (RFC 3263), anew for every REGISTER sipreg sends, refreshes included, so
-// that a carrier moving its servers is followed without a restart. Between
+// (RFC 3263), anew for every REGISTER the client sends, refreshes included,
+// so that a carrier moving its servers is followed without a restart. Between
 // registrations a TrunkKeepAlive keeps the path to the registrar open as
 // the face's keep-alive settings say; when it finds the registrar gone, the
 // trunk registers anew after the retry timeout for system errors.
@@ -76,15 +76,28 @@
 // After a change made while serving, the registrations follow the model:
 // a trunk that is new registers, one that is gone (or no longer has a
 // registrar) unregisters, one whose registrar, address of record, hops,
-// lifetime, mode or priority changed unregisters and registers anew, and the
-// rest are left alone, registered as they are. follow() looks only at the
-// identities the change touched (see ModelChanges); followAll() at every
-// identity, which with 100,000 subscribers takes a quarter of a second, for
-// the rare change that adds or removes a whole location service.
+// lifetime, mode, priority, NAT traversal or DNS check changed unregisters
+// and registers anew, and the rest are left alone, registered as they are.
+// follow() looks only at the identities the change touched (see
+// ModelChanges); followAll() at every identity, which with 100,000
+// subscribers takes a quarter of a second, for the rare change that adds or
+// removes a whole location service.
 //
-// stop() unregisters: it drops every sipreg, which sends its REGISTER with
-// expiry 0 and lives on inside libre until answered; the caller then lets the
-// stack run for a bounded time; nothing registers after it. Owned by the
+// NAT traversal, as the face says (RegistrationClient tells how): with the
+// method "address-detection" the Contact carries the address and port the
+// registrar saw (RFC 3581); with flows ("nat-traversal-flows" on the face,
+// or "use-flows" on its outbound face) the REGISTER asks for an RFC 5626
+// flow, with the gateway's instance URN (InstanceId) and reg-id 1, since a
+// trunk registers over one flow at a time. While libre's keep-alive watches
+// a flow, the trunk's TrunkKeepAlive stays idle, so that one path is never
+// kept twice; a flow that breaks counts as a lost registrar. With the DNS
+// security check on, an answer from an address the next hop did not
+// resolve to is refused: the registration fails as a system error, and the
+// line names the address.
+//
+// stop() unregisters: it releases every RegistrationClient, which sends its
+// REGISTER with expiry 0 and lives on until answered; the caller then lets
+// the stack run for a bounded time; nothing registers after it. Owned by the
 // Gateway; it borrows the registrar it follows the bindings of, which
 // outlives it, and leaves its listeners when it dies. Everything runs on
 // libre's thread.
@@ -96,6 +109,7 @@
 #include <vector>
 
 #include "LS_IIdentity.h"
+#include "LS_IOutbound.h"
 #include "LS_IRegistrationOutbound.h"
 #include "RefPtr.h"
 #include "ScriptSession.h"
@@ -104,6 +118,7 @@
 #include "sip/LibraryClock.h"
 #include "sip/Libre.h"
 #include "trunks/PenaltyBox.h"
+#include "trunks/RegistrationClient.h"
 #include "trunks/RegistrationRoute.h"
 #include "trunks/TrunkKeepAlive.h"
 #include "trunks/TrunkTls.h"
@@ -124,6 +139,9 @@ class TrunkRegistrations final : private BindingListener {
   // The registrar whose bindings back-to-back trunks follow; before
   // start(). Without it a back-to-back trunk never registers.
   void followBindings(Registrar& registrar);
+  // Where the instance URN of trunks registering with flows is kept
+  // (InstanceId); before start().
+  void useInstanceFile(std::string const& file) { m_instanceFile = file; }
   void start();
   void follow(std::vector<RefPtr<LS_IIdentity>> const& touched,
               std::vector<LS_IIdentity const*> const& removed);
@@ -203,9 +221,13 @@ class TrunkRegistrations final : private BindingListener {
     std::string learntRegistrar;
     std::string learntProxy;
     unsigned int redirects = 0;
-    sipreg* registration = nullptr;
+    // NAT traversal and the DNS security check, from the face.
+    bool detectAddress = false;
+    bool flows = false;
+    bool checkSource = false;
+    RegistrationClient* registration = nullptr;
     bool registered = false;
-    // Drops a failed registration outside sipreg's own call, then waits
+    // Drops a failed registration outside the client's own call, then waits
     // retryMs and registers anew.
     tmr timer;
     uint64_t retryMs = 0;
@@ -241,6 +263,12 @@ class TrunkRegistrations final : private BindingListener {
   // when the same, else the old one retired and the new one registered.
   void replace(LS_IIdentity const* identity, std::unique_ptr<Trunk> candidate);
   static bool same(Trunk const& a, Trunk const& b);
+  static void readTraversal(Trunk& trunk, LS_IRegistrationOutbound& face, LS_IOutbound* outbound);
+  // What the trunk's RegistrationClient is to do; flows only when the
+  // instance URN can be had.
+  RegistrationClient::Settings clientSettings(Trunk& trunk);
+  // Why the registrar's answer was refused, when its source was the fault.
+  static std::string refusedSource(Trunk const& trunk, sip_msg const& answer);
   // One progress line on standard error, after the library's debug lines.
   void report(std::string const& line);
   // failure, with the retry time, unless it is the trunk's last one.
@@ -256,7 +284,7 @@ class TrunkRegistrations final : private BindingListener {
   ScriptSession& m_session;
   LibraryClock& m_clock;
   std::vector<std::unique_ptr<Trunk>> m_trunks;
-  // Trunks follow() unregistered: their sipreg lives on inside libre until
+  // Trunks follow() unregistered: their client lives on by itself until
   // the unregistration is answered, and may still ask its challenge
   // handler for credentials with the trunk as argument.
   std::vector<std::unique_ptr<Trunk>> m_retired;
@@ -269,4 +297,9 @@ class TrunkRegistrations final : private BindingListener {
   // choice by priority, which would otherwise walk every trunk.
   std::unordered_map<LS_IIdentity const*, Trunk*> m_byIdentity;
   std::unordered_multimap<std::string, Trunk*> m_byAccount;
+  std::string m_instanceFile;
+  // Read at the first trunk with flows; empty until then, or when it
+  // cannot be had (told once).
+  std::string m_instance;
+  bool m_instanceTried = false;
 };

@@ -28,6 +28,11 @@
 #          calls to SIPp, which, held to one call, logs them unanswered),
 #          and the lost trunk's unresolvable name be told once though
 #          retried every second.
+# trunks/address: SIPp plays the carrier's registrar of address.xml, whose
+#          answers say the gateway's REGISTER came from elsewhere (Via
+#          received and rport); the gateway serves address.script with
+#          SIPp's address added as the registrar, must register the learnt
+#          address in its place, and on SIGTERM unregister that one.
 #
 # The gateway runs through EMULATOR when one is given (qemu-user for a
 # cross build); SIPp always runs natively. Every process is bounded in time,
@@ -176,6 +181,15 @@ case $scenario in
       fail "the trunk did not retry after the server error"
     stop_gateway
     grep -q "trunk example.com/trunk unregistering" "$scenario".gateway.err || fail "the trunk was not unregistered"
+    await_registrar
+    ;;
+  address)
+    start_registrar -m 1
+    echo "face example.com trunk registration-outbound registrar set 127.0.0.1:$port" >"$scenario".registrar.script
+    start_gateway "$here/address.script" "$scenario".registrar.script
+    await_line "$scenario".gateway.err "trunk example.com/trunk registered at udp:127.0.0.1:$port for 300 s" ||
+      fail "the trunk did not register"
+    stop_gateway
     await_registrar
     ;;
   dns)
