@@ -5,10 +5,10 @@
 #include "LS_ICall.h"
 #include "LS_IOutbound.h"
 #include "LS_IdentityResolution.h"
-#include "trunks/OutboundRoute.h"
 #include "registrar/InboundFilter.h"
 #include "sip/Exchange.h"
 #include "sip/MonotonicClock.h"
+#include "trunks/OutboundRoute.h"
 
 namespace {
 

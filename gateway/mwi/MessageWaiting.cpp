@@ -165,7 +165,8 @@ std::vector<std::unique_ptr<MessageWaiting::Subscriber>> MessageWaiting::findAll
         RefPtr<LS_IIdentity> identity;
         if (LS_getIdentityIf(service.get(), name, identity).isFailure())
           continue;
-        if (std::unique_ptr<Subscriber> subscriber = find(identity.get(), serviceName.str() + "/" + name.str()))
+        if (std::unique_ptr<Subscriber> subscriber =
+                find(identity.get(), serviceName.str() + "/" + name.str()))
           found.push_back(std::move(subscriber));
       }
     }
@@ -173,7 +174,8 @@ std::vector<std::unique_ptr<MessageWaiting::Subscriber>> MessageWaiting::findAll
   return found;
 }
 
-std::unique_ptr<MessageWaiting::Subscriber> MessageWaiting::find(LS_IIdentity* identity, std::string const& path) {
+std::unique_ptr<MessageWaiting::Subscriber> MessageWaiting::find(LS_IIdentity* identity,
+                                                                 std::string const& path) {
   if (identity->getIdentityType() != LS_IdentityType::IDENTITY)
     return nullptr;
   RefPtr<LS_IMwiSubscription> face;
@@ -187,7 +189,8 @@ std::unique_ptr<MessageWaiting::Subscriber> MessageWaiting::find(LS_IIdentity* i
   CHostPort tlsNotifier;
   // A learnt notifier stands in for a configured one only when there is
   // none, as the trunks' learnt registrar does.
-  if (face->getMwiNotifier(notifier, tlsNotifier).isFailure() && face->getDynamicMwiNotifier(notifier).isFailure())
+  if (face->getMwiNotifier(notifier, tlsNotifier).isFailure() &&
+      face->getDynamicMwiNotifier(notifier).isFailure())
     return nullptr;
   if (notifier.GetHost().isEmpty())
     return nullptr;
@@ -247,9 +250,10 @@ void MessageWaiting::followAll() {
   std::vector<std::unique_ptr<Subscriber>> found = findAll();
   std::vector<LS_IIdentity const*> gone;
   for (std::unique_ptr<Subscriber> const& subscriber : m_subscribers) {
-    bool const kept = std::any_of(found.begin(), found.end(), [&](std::unique_ptr<Subscriber> const& candidate) {
-      return candidate->identity == subscriber->identity;
-    });
+    bool const kept =
+        std::any_of(found.begin(), found.end(), [&](std::unique_ptr<Subscriber> const& candidate) {
+          return candidate->identity == subscriber->identity;
+        });
     if (!kept)
       gone.push_back(subscriber->identity.get());
   }
@@ -262,9 +266,9 @@ void MessageWaiting::followAll() {
 }
 
 void MessageWaiting::replace(LS_IIdentity const* identity, std::unique_ptr<Subscriber> candidate) {
-  auto const existing =
-      std::find_if(m_subscribers.begin(), m_subscribers.end(),
-                   [&](std::unique_ptr<Subscriber> const& subscriber) { return subscriber->identity.get() == identity; });
+  auto const existing = std::find_if(
+      m_subscribers.begin(), m_subscribers.end(),
+      [&](std::unique_ptr<Subscriber> const& subscriber) { return subscriber->identity.get() == identity; });
   if (existing != m_subscribers.end()) {
     if (candidate && same(**existing, *candidate))
       return;
@@ -295,12 +299,7 @@ void MessageWaiting::resolve(Subscriber& subscriber) {
     report("message server " + host + " of " + subscriber.path + " cannot be looked up");
 }
 
-void MessageWaiting::onResolved(int error,
-                                dnshdr const*,
-                                list* answers,
-                                list*,
-                                list*,
-                                void* argument) {
+void MessageWaiting::onResolved(int error, dnshdr const*, list* answers, list*, list*, void* argument) {
   // libre has let go of the query and cleared the handle already.
   Subscriber& subscriber = *static_cast<Subscriber*>(argument);
   std::string const host = subscriber.notifier.GetHost().c_str();
@@ -342,12 +341,13 @@ void MessageWaiting::subscribe(Subscriber& subscriber) {
           ? EPROTO
           : sipevent_subscribe(&subscriber.subscription, m_events, uri.c_str(), nullptr, from.c_str(), kEvent,
                                nullptr, subscriber.lifetime, subscriber.user.c_str(),
-                               route.empty() ? nullptr : routes, route.empty() ? 0 : 1, OutboundRoute::onChallenge,
-                               subscriber.route.get(), false, nullptr, onNotify, onClose, &subscriber,
-                               "Accept: %s\r\n", kContentType);
+                               route.empty() ? nullptr : routes, route.empty() ? 0 : 1,
+                               OutboundRoute::onChallenge, subscriber.route.get(), false, nullptr, onNotify,
+                               onClose, &subscriber, "Accept: %s\r\n", kContentType);
   if (error == 0)
     return;
-  unsigned int const seconds = m_clock.measure([&] { return subscriber.face->getRetryTimeoutOnSystemError(); });
+  unsigned int const seconds =
+      m_clock.measure([&] { return subscriber.face->getRetryTimeoutOnSystemError(); });
   retryLater(subscriber, seconds,
              "message-waiting subscription of " + subscriber.path + " cannot be sent to " + uri + ": " +
                  (tlsError.empty() ? std::strerror(error) : tlsError));
@@ -382,7 +382,10 @@ void MessageWaiting::onRetry(void* argument) {
   subscriber.owner->subscribe(subscriber);
 }
 
-void MessageWaiting::onClose(int error, sip_msg const* answer, sipevent_substate const* state, void* argument) {
+void MessageWaiting::onClose(int error,
+                             sip_msg const* answer,
+                             sipevent_substate const* state,
+                             void* argument) {
   Subscriber& subscriber = *static_cast<Subscriber*>(argument);
   MessageWaiting& owner = *subscriber.owner;
   LibraryClock& clock = owner.m_clock;
@@ -440,8 +443,9 @@ void MessageWaiting::onClose(int error, sip_msg const* answer, sipevent_substate
     seconds = clock.measure([&] { return face.getRetryTimeoutOnClientError(); });
     cause = std::to_string(answer->scode);
   }
-  owner.retryLater(subscriber, seconds,
-                   "message-waiting subscription of " + subscriber.path + " at " + where + " failed (" + cause + ")");
+  owner.retryLater(
+      subscriber, seconds,
+      "message-waiting subscription of " + subscriber.path + " at " + where + " failed (" + cause + ")");
 }
 
 void MessageWaiting::onNotify(sip* stack, sip_msg const* notify, void* argument) {
@@ -491,8 +495,8 @@ void MessageWaiting::relay(Subscriber& subscriber) {
     pl_set_str(&routeText, target.route.c_str());
     bool const routed = !target.route.empty() && uri_decode(&route, &routeText) == 0;
     int const error = sip_requestf(
-        nullptr, m_stack, true, "NOTIFY", target.uri.c_str(), routed ? &route : nullptr, nullptr, nullptr, nullptr,
-        nullptr,
+        nullptr, m_stack, true, "NOTIFY", target.uri.c_str(), routed ? &route : nullptr, nullptr, nullptr,
+        nullptr, nullptr,
         "From: <%s>;tag=%016llx\r\n"
         "To: <%s>\r\n"
         "Call-ID: %016llx\r\n"
@@ -527,7 +531,8 @@ void MessageWaiting::handle(Exchange& exchange) {
   sip_msg const& notify = exchange.request();
   sip_hdr const* const event = sip_msg_hdr(&notify, SIP_HDR_EVENT);
   sipevent_event decoded;
-  if (!event || sipevent_event_decode(&decoded, &event->val) != 0 || pl_strcasecmp(&decoded.event, kEvent) != 0)
+  if (!event || sipevent_event_decode(&decoded, &event->val) != 0 ||
+      pl_strcasecmp(&decoded.event, kEvent) != 0)
     return exchange.answer(489, "Bad Event");
   CNameAddr nameAddr;
   RefPtr<LS_IIdentity> identity = exchange.resolveOrAnswer(notify.ruri, nameAddr, false);
@@ -536,7 +541,8 @@ void MessageWaiting::handle(Exchange& exchange) {
   if (!identity)
     return;
   Subscriber* const subscriber = subscriberOf(identity.get());
-  if (!subscriber || subscriber->mode != LS_MwiSubscriptionMode::IMPLICIT || !fromNotifier(*subscriber, notify.src)) {
+  if (!subscriber || subscriber->mode != LS_MwiSubscriptionMode::IMPLICIT ||
+      !fromNotifier(*subscriber, notify.src)) {
     char source[64];
     re_snprintf(source, sizeof source, "%J", &notify.src);
     report("NOTIFY for " + exchange.result() + " from " + source + " refused: not its message server");
@@ -574,7 +580,9 @@ std::vector<std::string> MessageWaiting::describe() const {
     std::string line = subscriber->path + " " + LS_MwiSubscriptionMode::NAME(subscriber->mode) + " " +
                        nameOf(subscriber->state) + " notifier " + hostPortText(subscriber->current) +
                        (subscriber->learnt ? " learnt" : "") + " messages " +
-                       (!summary.known ? "unknown" : summary.waiting.empty() ? "-" : summary.waiting);
+                       (!summary.known            ? "unknown"
+                        : summary.waiting.empty() ? "-"
+                                                  : summary.waiting);
     if (!summary.voice.empty())
       line += " voice " + summary.voice;
     lines.push_back(line);

@@ -109,7 +109,8 @@ class MessageWaiting final : public RequestHandler, public DialogHandler, public
   // stack's, for notifiers named by host name. False with an error text
   // when sipevent cannot listen.
   bool start(sip& stack, dnsc* dns, TrunkRegistrations& trunks, std::string& error);
-  void follow(std::vector<RefPtr<LS_IIdentity>> const& touched, std::vector<LS_IIdentity const*> const& removed);
+  void follow(std::vector<RefPtr<LS_IIdentity>> const& touched,
+              std::vector<LS_IIdentity const*> const& removed);
   void followAll();
   void stop();
 
@@ -196,7 +197,11 @@ class MessageWaiting final : public RequestHandler, public DialogHandler, public
   static void onClose(int error, sip_msg const* answer, sipevent_substate const* state, void* subscriber);
   static void onDrop(void* subscriber);
   static void onRetry(void* subscriber);
-  static void onResolved(int error, dnshdr const* header, list* answers, list* authorities, list* additionals,
+  static void onResolved(int error,
+                         dnshdr const* header,
+                         list* answers,
+                         list* authorities,
+                         list* additionals,
                          void* subscriber);
 
   ScriptSession& m_session;

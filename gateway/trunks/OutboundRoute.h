@@ -63,8 +63,8 @@
 #include "LS_IIdentity.h"
 #include "LS_IdentityFace.h"
 #include "RefPtr.h"
-#include "trunks/PenaltyBox.h"
 #include "sip/LibraryClock.h"
+#include "trunks/PenaltyBox.h"
 #include "trunks/TrunkRegistrations.h"
 
 class OutboundRoute {

@@ -37,9 +37,10 @@ int RegistrationClient::start(RegistrationClient*& client,
   std::vector<char const*> routes;
   for (std::string const& route : settings.routes)
     routes.push_back(route.c_str());
-  int error = sip_dialog_alloc(&made->m_dialog, settings.registrarUri.c_str(),
-                               settings.addressOfRecord.c_str(), nullptr, settings.addressOfRecord.c_str(),
-                               routes.empty() ? nullptr : routes.data(), static_cast<uint32_t>(routes.size()));
+  int error =
+      sip_dialog_alloc(&made->m_dialog, settings.registrarUri.c_str(), settings.addressOfRecord.c_str(),
+                       nullptr, settings.addressOfRecord.c_str(), routes.empty() ? nullptr : routes.data(),
+                       static_cast<uint32_t>(routes.size()));
   if (error == 0)
     error = sip_auth_alloc(&made->m_auth, onChallenge, argument, false);
   if (error == 0)

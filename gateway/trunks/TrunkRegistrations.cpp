@@ -261,8 +261,8 @@ void TrunkRegistrations::replace(LS_IIdentity const* identity, std::unique_ptr<T
 bool TrunkRegistrations::same(Trunk const& a, Trunk const& b) {
   return a.path == b.path && a.registrarUri == b.registrarUri && a.addressOfRecord == b.addressOfRecord &&
          a.configured == b.configured && a.lifetime == b.lifetime && a.mode == b.mode &&
-         a.priority == b.priority && a.answerTimeoutS == b.answerTimeoutS && a.detectAddress == b.detectAddress &&
-         a.flows == b.flows && a.checkSource == b.checkSource;
+         a.priority == b.priority && a.answerTimeoutS == b.answerTimeoutS &&
+         a.detectAddress == b.detectAddress && a.flows == b.flows && a.checkSource == b.checkSource;
 }
 
 void TrunkRegistrations::followAll() {

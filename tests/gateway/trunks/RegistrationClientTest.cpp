@@ -42,20 +42,19 @@ TEST_P(AddressSeenByTest, ReadsReceivedAndRportOfTheTopVia) {
   mem_deref(buffer);
 }
 
-INSTANTIATE_TEST_SUITE_P(
-    Via,
-    AddressSeenByTest,
-    testing::Values(Case{";received=192.0.2.7;rport=4444", "192.0.2.7:4444"},
-                    Case{";rport=4444;received=192.0.2.7", "192.0.2.7:4444"},
-                    // A NAT that kept the port, or a registrar without rport.
-                    Case{";rport;received=192.0.2.7", "192.0.2.7:5070"},
-                    Case{";received=192.0.2.7", "192.0.2.7:5070"},
-                    Case{";rport=4444", "10.0.0.2:4444"},
-                    Case{";received=2001:db8::7;rport=4444", "[2001:db8::7]:4444"},
-                    // Nothing learnt: the request's own empty rport, no
-                    // parameter, a received that is no address.
-                    Case{";rport", nullptr},
-                    Case{"", nullptr},
-                    Case{";received=nat.example;rport=4444", nullptr}));
+INSTANTIATE_TEST_SUITE_P(Via,
+                         AddressSeenByTest,
+                         testing::Values(Case{";received=192.0.2.7;rport=4444", "192.0.2.7:4444"},
+                                         Case{";rport=4444;received=192.0.2.7", "192.0.2.7:4444"},
+                                         // A NAT that kept the port, or a registrar without rport.
+                                         Case{";rport;received=192.0.2.7", "192.0.2.7:5070"},
+                                         Case{";received=192.0.2.7", "192.0.2.7:5070"},
+                                         Case{";rport=4444", "10.0.0.2:4444"},
+                                         Case{";received=2001:db8::7;rport=4444", "[2001:db8::7]:4444"},
+                                         // Nothing learnt: the request's own empty rport, no
+                                         // parameter, a received that is no address.
+                                         Case{";rport", nullptr},
+                                         Case{"", nullptr},
+                                         Case{";received=nat.example;rport=4444", nullptr}));
 
 }  // namespace
