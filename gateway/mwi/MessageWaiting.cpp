@@ -152,24 +152,10 @@ bool MessageWaiting::start(sip& stack, dnsc* dns, TrunkRegistrations& trunks, st
 std::vector<std::unique_ptr<MessageWaiting::Subscriber>> MessageWaiting::findAll() {
   std::vector<std::unique_ptr<Subscriber>> found;
   m_clock.measure([&] {
-    LS_IMasterLocationService* const master = m_session.locationMaster();
-    Vector<String> services;
-    master->getLocationServices(services);
-    for (String const& serviceName : services) {
-      RefPtr<LS_ILocationService> service;
-      if (LS_getLocationServiceIf(master, serviceName, service).isFailure())
-        continue;
-      Vector<String> identities;
-      service->getIdentities(identities);
-      for (String const& name : identities) {
-        RefPtr<LS_IIdentity> identity;
-        if (LS_getIdentityIf(service.get(), name, identity).isFailure())
-          continue;
-        if (std::unique_ptr<Subscriber> subscriber =
-                find(identity.get(), serviceName.str() + "/" + name.str()))
-          found.push_back(std::move(subscriber));
-      }
-    }
+    m_session.forEachIdentity([&](LS_IIdentity* identity, std::string const& path) {
+      if (std::unique_ptr<Subscriber> subscriber = find(identity, path))
+        found.push_back(std::move(subscriber));
+    });
   });
   return found;
 }
@@ -323,7 +309,7 @@ void MessageWaiting::subscribe(Subscriber& subscriber) {
     CNameAddr fromAddress;
     fromAddress.Parse(from.data(), from.size());
     subscriber.route = std::make_unique<OutboundRoute>(
-        subscriber.identity.get(), fromAddress, *m_trunks, m_penaltyBox, m_clock,
+        subscriber.identity.get(), fromAddress, *m_trunks, m_trunks->penaltyBox(), m_clock,
         [](std::string const&) { return false; }, LS_IdentityFace::MESSAGE_SUBSCRIPTION);
   }
   // OutboundRoute verifies the TLS hops it names; without one the

@@ -91,7 +91,6 @@
 #include "sip/Libre.h"
 #include "sip/RequestHandler.h"
 #include "trunks/OutboundRoute.h"
-#include "trunks/PenaltyBox.h"
 #include "trunks/TrunkRegistrations.h"
 
 class Exchange;
@@ -211,7 +210,6 @@ class MessageWaiting final : public RequestHandler, public DialogHandler, public
   dnsc* m_dns = nullptr;
   TrunkRegistrations* m_trunks = nullptr;
   sipevent_sock* m_events = nullptr;
-  PenaltyBox m_penaltyBox;
   std::vector<std::unique_ptr<Subscriber>> m_subscribers;
   // Subscribers ended while a callback of theirs may still come (a
   // subscription's challenge during its unsubscription): kept until the

@@ -3,9 +3,10 @@
 // transport error, or 503), so that requests from a face with the penalty
 // box switched on skip them for a while instead of each waiting out the
 // same timeout. What a proxy is, and which failures count, is for the
-// calls OutboundRoute's and for the registrations RegistrationRoute's to
-// say; this only keeps the time. One box serves both: a proxy that let a
-// REGISTER down is as dead for the next call.
+// calls and the message-waiting subscriptions OutboundRoute's and for the
+// registrations RegistrationRoute's to say; this only keeps the time. One
+// box serves them all: a proxy that let a REGISTER down is as dead for the
+// next call or SUBSCRIBE.
 //
 // Decision: a proxy stays boxed for kBoxMs, 60 s, from its last failure.
 // Long enough that a burst of calls pays the timeout of a dead proxy once,

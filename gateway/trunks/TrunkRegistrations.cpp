@@ -294,23 +294,10 @@ void TrunkRegistrations::followAll() {
 std::vector<std::unique_ptr<TrunkRegistrations::Trunk>> TrunkRegistrations::findTrunks() {
   std::vector<std::unique_ptr<Trunk>> trunks;
   m_clock.measure([&] {
-    LS_IMasterLocationService* const master = m_session.locationMaster();
-    Vector<String> services;
-    master->getLocationServices(services);
-    for (String const& serviceName : services) {
-      RefPtr<LS_ILocationService> service;
-      if (LS_getLocationServiceIf(master, serviceName, service).isFailure())
-        continue;
-      Vector<String> identities;
-      service->getIdentities(identities);
-      for (String const& name : identities) {
-        RefPtr<LS_IIdentity> identity;
-        if (LS_getIdentityIf(service.get(), name, identity).isFailure())
-          continue;
-        if (std::unique_ptr<Trunk> trunk = findTrunk(identity.get(), serviceName.str() + "/" + name.str()))
-          trunks.push_back(std::move(trunk));
-      }
-    }
+    m_session.forEachIdentity([&](LS_IIdentity* identity, std::string const& path) {
+      if (std::unique_ptr<Trunk> trunk = findTrunk(identity, path))
+        trunks.push_back(std::move(trunk));
+    });
   });
   return trunks;
 }

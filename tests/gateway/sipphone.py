@@ -24,6 +24,8 @@ import time
 
 START_LIMIT_S = 30
 ANSWER_LIMIT_S = 5
+SIPP = os.environ.get("SIPP", "sipp")
+SIPP_LIMIT_S = 90
 
 
 class Failure(Exception):
@@ -247,6 +249,51 @@ class StreamPhone(Phone):
             # frames (a keep-alive ping) are skipped.
             if first & 0x0f in (1, 2):
                 return Response(payload.decode(errors="replace"))
+
+
+class Sipp:
+    """One SIPp run in the work directory, bounded by limit_s: scenario is
+    "uas" (SIPp's own) or a scenario file's path, and options follow it.
+    With a port (-p, and -i the address) it returns once SIPp has bound it."""
+
+    def __init__(self, work, name, scenario, options, limit_s=SIPP_LIMIT_S):
+        self.name = name
+        self.limit_s = limit_s
+        self.work = work
+        scenario_options = ["-sn", scenario] if scenario == "uas" else ["-sf", scenario]
+        with open(os.path.join(work, name + ".sipp.out"), "wb") as out:
+            self.process = subprocess.Popen(
+                [SIPP] + scenario_options + list(options) +
+                ["-timeout", "%ds" % limit_s, "-timeout_error", "-trace_err", "-trace_logs",
+                 "-error_file", os.path.join(work, name + ".errors"),
+                 "-log_file", os.path.join(work, name + ".logs")],
+                cwd=work, stdout=out, stderr=subprocess.STDOUT, stdin=subprocess.DEVNULL)
+        # Whatever is sent to its port before SIPp has bound it is lost.
+        if "-p" in options:
+            kind = socket.SOCK_STREAM if "t1" in options else socket.SOCK_DGRAM
+            await_bound(self.process, int(options[options.index("-p") + 1]), START_LIMIT_S,
+                        options[options.index("-i") + 1], kind)
+
+    def succeeded(self):
+        try:
+            status = self.process.wait(timeout=self.limit_s + 10)
+        except subprocess.TimeoutExpired:
+            self.kill()
+            return False
+        return status == 0
+
+    def errors(self):
+        path = os.path.join(self.work, self.name + ".errors")
+        return open(path, errors="replace").read()[-2000:] if os.path.exists(path) else ""
+
+    def logged(self):
+        path = os.path.join(self.work, self.name + ".logs")
+        return open(path, errors="replace").read().splitlines() if os.path.exists(path) else []
+
+    def kill(self):
+        if self.process.poll() is None:
+            self.process.kill()
+            self.process.wait()
 
 
 def hash_hex(algorithm, text):

@@ -155,6 +155,25 @@ RefPtr<LS_ILocationService> ScriptSession::serviceFor(String& error, CHostPort c
   return found;
 }
 
+void ScriptSession::forEachIdentity(
+    std::function<void(LS_IIdentity* identity, std::string const& path)> const& visit) const {
+  Vector<String> services;
+  m_locationMaster->getLocationServices(services);
+  for (String const& serviceName : services) {
+    RefPtr<LS_ILocationService> service;
+    if (LS_getLocationServiceIf(m_locationMaster.get(), serviceName, service).isFailure())
+      continue;
+    Vector<String> identities;
+    service->getIdentities(identities);
+    for (String const& name : identities) {
+      RefPtr<LS_IIdentity> identity;
+      if (LS_getIdentityIf(service.get(), name, identity).isFailure())
+        continue;
+      visit(identity.get(), serviceName.str() + "/" + name.str());
+    }
+  }
+}
+
 std::string ScriptSession::pathOf(LS_IIdentity const* identity) {
   RefPtr<LS_ILocationService> service;
   adoptInterface(service,

@@ -12,6 +12,7 @@
 // releases the whole model.
 #pragma once
 
+#include <functional>
 #include <memory>
 #include <sstream>
 
@@ -123,6 +124,10 @@ class ScriptSession {
 
   // "service/identity", as the host programs name identities in what they print.
   static std::string pathOf(LS_IIdentity const* identity);
+  // Every identity of every location service, groups included, with its
+  // pathOf(), service by service in the model's order.
+  void forEachIdentity(
+      std::function<void(LS_IIdentity* identity, std::string const& path)> const& visit) const;
 
  private:
   template <class T>

@@ -16,19 +16,14 @@ bounded in time and stopped by its PID.
 import os
 import re
 import socket
-import subprocess
 import sys
 import threading
 
 sys.path.insert(0, os.path.join(os.path.dirname(os.path.abspath(__file__)), ".."))
-from sipphone import START_LIMIT_S, Gateway, Phone, await_bound, check, free_port, hash_hex, run  # noqa: E402
+from sipphone import Gateway, Phone, Sipp, check, free_port, hash_hex, run  # noqa: E402
 
 HERE = os.path.dirname(os.path.abspath(__file__))
-SIPP = os.environ.get("SIPP", "sipp")
 CALL_LIMIT_S = 30
-# The carriers and the subscriber serve the whole test, the gateway's
-# start under an emulator included.
-SERVER_LIMIT_S = 90
 # How long a proxy may stay silent before the gateway tries the next one:
 # far above a carrier's answer on loopback, the gateway under an emulator
 # included.
@@ -44,53 +39,11 @@ authentication-service carrier credentials set gateway-7 s3cret
 """
 
 
-class Sipp:
-    """One SIPp run in the work directory; options follow the scenario."""
-
-    def __init__(self, work, name, scenario, options, limit_s=SERVER_LIMIT_S):
-        self.name = name
-        self.limit_s = limit_s
-        self.work = work
-        scenario_options = ["-sn", scenario] if scenario == "uas" else ["-sf", os.path.join(HERE, scenario)]
-        with open(os.path.join(work, name + ".sipp.out"), "wb") as out:
-            self.process = subprocess.Popen(
-                [SIPP] + scenario_options + list(options) +
-                ["-timeout", "%ds" % limit_s, "-timeout_error", "-trace_err", "-trace_logs",
-                 "-error_file", os.path.join(work, name + ".errors"),
-                 "-log_file", os.path.join(work, name + ".logs")],
-                cwd=work, stdout=out, stderr=subprocess.STDOUT, stdin=subprocess.DEVNULL)
-        # Whatever is sent to its port before SIPp has bound it is lost.
-        if "-p" in options:
-            kind = socket.SOCK_STREAM if "t1" in options else socket.SOCK_DGRAM
-            await_bound(self.process, int(options[options.index("-p") + 1]), START_LIMIT_S,
-                        options[options.index("-i") + 1], kind)
-
-    def succeeded(self):
-        try:
-            status = self.process.wait(timeout=self.limit_s + 10)
-        except subprocess.TimeoutExpired:
-            self.kill()
-            return False
-        return status == 0
-
-    def errors(self):
-        path = os.path.join(self.work, self.name + ".errors")
-        return open(path, errors="replace").read()[-2000:] if os.path.exists(path) else ""
-
-    def logged(self):
-        path = os.path.join(self.work, self.name + ".logs")
-        return open(path, errors="replace").read().splitlines() if os.path.exists(path) else []
-
-    def kill(self):
-        if self.process.poll() is None:
-            self.process.kill()
-            self.process.wait()
-
 
 def call(work, name, gateway, source, from_uri, number, domain):
     """One call from SIPp at source through the gateway, which must be
     answered and torn down."""
-    caller = Sipp(work, name, "caller.xml",
+    caller = Sipp(work, name, os.path.join(HERE, "caller.xml"),
                   ["-i", source, "-p", str(free_port(source)), "-key", "from", from_uri, "-key", "domain", domain, "-s", number, "-m", "1",
                    "127.0.0.1:%d" % gateway.port], CALL_LIMIT_S)
     answered = caller.succeeded()
@@ -201,10 +154,10 @@ def calls_out_through_the_callers_proxies(program, work, emulator):
                 file.write("identity example.com %s face authentication-outbound create\n" % name)
                 file.write("face example.com %s authentication-outbound authenticate insert 0 carrier gateway-7\n"
                            % name)
-    carrier = Sipp(work, "outbound-carrier", "carrier.xml", ["-i", "127.0.0.1", "-p", str(carrier_port), "-m", "4"])
-    tcp_carrier = Sipp(work, "outbound-tcp-carrier", "carrier.xml",
+    carrier = Sipp(work, "outbound-carrier", os.path.join(HERE, "carrier.xml"), ["-i", "127.0.0.1", "-p", str(carrier_port), "-m", "4"])
+    tcp_carrier = Sipp(work, "outbound-tcp-carrier", os.path.join(HERE, "carrier.xml"),
                        ["-t", "t1", "-i", "127.0.0.1", "-p", str(tcp_carrier_port), "-m", "1"])
-    overloaded = Sipp(work, "outbound-overloaded", "overloaded.xml",
+    overloaded = Sipp(work, "outbound-overloaded", os.path.join(HERE, "overloaded.xml"),
                       ["-i", "127.0.0.1", "-p", str(overloaded_port), "-m", "1"])
     gateway = Gateway(program, emulator, work, "outbound", [script], ["--calls", "relay"])
     try:
@@ -271,14 +224,14 @@ def trunk_calls_come_in_unchallenged_and_go_out_to_its_registrar(program, work, 
                    "face example.com alice call-outbound proxy insert 0 127.0.0.1:%d loose\n"
                    "face example.com alice call-outbound invite-transaction-timeout set %d\n"
                    % (CARRIER, registrar_port, silent.port, INVITE_TIMEOUT_S, silent.port, INVITE_TIMEOUT_S))
-    registrar = Sipp(work, "inbound-registrar", "registrar.xml",
+    registrar = Sipp(work, "inbound-registrar", os.path.join(HERE, "registrar.xml"),
                      ["-i", CARRIER, "-p", str(registrar_port), "-m", "1"])
     gateway = Gateway(program, emulator, work, "inbound", [script], ["--calls", "relay"])
     bob = None
     carrier = None
     try:
         check(registrar.succeeded(), "the trunk did not register: " + registrar.errors() + gateway.errors())
-        subscriber = Sipp(work, "inbound-subscriber", "subscriber.xml",
+        subscriber = Sipp(work, "inbound-subscriber", os.path.join(HERE, "subscriber.xml"),
                           ["-i", "127.0.0.1", "-p", str(bob_port), "-s", "bob", "-m", "1",
                            "127.0.0.1:%d" % gateway.port], CALL_LIMIT_S)
         check(subscriber.succeeded(), "bob did not register: " + subscriber.errors())
@@ -291,7 +244,7 @@ def trunk_calls_come_in_unchallenged_and_go_out_to_its_registrar(program, work, 
         check(invite(CARRIER, gateway, "sip:alice@example.com", "sip:4930999@pstn.example") == 404,
               "a carrier's call to a number outside was not refused as not found")
         check(not silent.calls, "a carrier's call went back out")
-        carrier = Sipp(work, "inbound-registrar-calls", "carrier.xml",
+        carrier = Sipp(work, "inbound-registrar-calls", os.path.join(HERE, "carrier.xml"),
                        ["-i", CARRIER, "-p", str(registrar_port), "-m", "1"])
         call(work, "inbound-trunk-out", gateway, "127.0.0.1", "trunk@example.com", "4930777", "pstn.example")
         check(carrier.succeeded(), "the trunk's call did not reach its registrar: " + carrier.errors())

@@ -20,14 +20,10 @@ import sys
 import time
 
 sys.path.insert(0, os.path.join(os.path.dirname(os.path.abspath(__file__)), ".."))
-from sipphone import (ANSWER_LIMIT_S, START_LIMIT_S, Failure, Gateway, Phone, StreamPhone,  # noqa: E402
-                      ask_control, await_bound, check, free_port, hash_hex, run)
+from sipphone import (ANSWER_LIMIT_S, SIPP, Failure, Gateway, Phone, Sipp, StreamPhone,  # noqa: E402
+                      ask_control, check, free_port, hash_hex, run)
 
 HERE = os.path.dirname(os.path.abspath(__file__))
-SIPP = os.environ.get("SIPP", "sipp")
-# The message servers serve the whole test, the gateway's start under an
-# emulator included.
-SERVER_LIMIT_S = 90
 # How long a NOTIFY may take to reach a phone, a subscription that had to
 # wait for its message server included (UDP retransmissions reach it).
 NOTIFY_LIMIT_S = 30
@@ -48,42 +44,6 @@ face example.com alice message-subscription lifetime set 300
 face example.com alice message-subscription retry-timeout-on-system-error set 1
 """
 
-
-class Sipp:
-    """One SIPp run in the work directory; options follow the scenario."""
-
-    def __init__(self, work, name, scenario, options):
-        self.name = name
-        self.work = work
-        with open(os.path.join(work, name + ".sipp.out"), "wb") as out:
-            self.process = subprocess.Popen(
-                [SIPP, "-sf", os.path.join(HERE, scenario)] + list(options) +
-                ["-timeout", "%ds" % SERVER_LIMIT_S, "-timeout_error", "-trace_err", "-trace_logs",
-                 "-error_file", os.path.join(work, name + ".errors"),
-                 "-log_file", os.path.join(work, name + ".logs")],
-                cwd=work, stdout=out, stderr=subprocess.STDOUT, stdin=subprocess.DEVNULL)
-        await_bound(self.process, int(options[options.index("-p") + 1]), START_LIMIT_S)
-
-    def succeeded(self):
-        try:
-            status = self.process.wait(timeout=SERVER_LIMIT_S + 10)
-        except subprocess.TimeoutExpired:
-            self.kill()
-            return False
-        return status == 0
-
-    def errors(self):
-        path = os.path.join(self.work, self.name + ".errors")
-        return open(path, errors="replace").read()[-2000:] if os.path.exists(path) else ""
-
-    def logged(self):
-        path = os.path.join(self.work, self.name + ".logs")
-        return open(path, errors="replace").read().splitlines() if os.path.exists(path) else []
-
-    def kill(self):
-        if self.process.poll() is None:
-            self.process.kill()
-            self.process.wait()
 
 
 def write_script(work, name, text):
@@ -179,7 +139,7 @@ def explicit_subscription_is_relayed_to_every_phone(program, work, emulator):
         tcp = StreamPhone(gateway.port, "tcp")
         phones.append(tcp)
         register(tcp, "alice", "tcp")
-        notifier = Sipp(work, "explicit-notifier", "notifier.xml", ["-i", "127.0.0.1", "-p", str(notifier_port), "-m", "1"])
+        notifier = Sipp(work, "explicit-notifier", os.path.join(HERE, "notifier.xml"), ["-i", "127.0.0.1", "-p", str(notifier_port), "-m", "1"])
         check_notify(udp, "the phone over UDP", "yes", "2/8 (0/0)")
         check_notify(tcp, "the phone over TCP", "yes", "2/8 (0/0)")
         late = Phone(gateway.port)
@@ -223,10 +183,10 @@ def redirected_subscription_goes_to_the_contact(program, work, emulator):
                           "face example.com bob message-subscription retry-timeout-on-client-error set 600\n"
                           "face example.com bob message-subscription mwi-notifier set 127.0.0.1:%d\n"
                           % (moved_port, ping_port))
-    servers = [Sipp(work, "moved-notifier", "notifier.xml", ["-i", "127.0.0.1", "-p", str(notifier_port), "-m", "1"])]
+    servers = [Sipp(work, "moved-notifier", os.path.join(HERE, "notifier.xml"), ["-i", "127.0.0.1", "-p", str(notifier_port), "-m", "1"])]
     for name, port, target in [("moved-first", moved_port, notifier_port), ("moved-ping", ping_port, pong_port),
                                ("moved-pong", pong_port, ping_port)]:
-        servers.append(Sipp(work, name, "moved.xml", ["-i", "127.0.0.1", "-p", str(port), "-m", "1",
+        servers.append(Sipp(work, name, os.path.join(HERE, "moved.xml"), ["-i", "127.0.0.1", "-p", str(port), "-m", "1",
                                                       "-key", "target", "127.0.0.1:%d" % target]))
     notifier, moved, ping, pong = servers
     gateway = Gateway(program, emulator, work, "moved", [script], ["--control", control])
@@ -258,8 +218,8 @@ def changed_face_subscribes_anew(program, work, emulator):
     control = os.path.join(work, "changed.control")
     script = write_script(work, "changed", BASE_SCRIPT +
                           "face example.com alice message-subscription mwi-notifier set 127.0.0.1:%d\n" % first_port)
-    first = Sipp(work, "changed-first", "notifier.xml", ["-i", "127.0.0.1", "-p", str(first_port), "-m", "1"])
-    proxy = Sipp(work, "changed-proxy", "notifier.xml", ["-i", "127.0.0.1", "-p", str(proxy_port), "-m", "1"])
+    first = Sipp(work, "changed-first", os.path.join(HERE, "notifier.xml"), ["-i", "127.0.0.1", "-p", str(first_port), "-m", "1"])
+    proxy = Sipp(work, "changed-proxy", os.path.join(HERE, "notifier.xml"), ["-i", "127.0.0.1", "-p", str(proxy_port), "-m", "1"])
     gateway = Gateway(program, emulator, work, "changed", [script], ["--control", control])
     try:
         await_control(gateway, control, "mwi", r"^example\.com/alice explicit subscribed .* messages yes")
