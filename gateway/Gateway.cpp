@@ -11,10 +11,6 @@
 
 namespace {
 
-void onSignal(int) {
-  re_cancel();
-}
-
 // The trunks' instance URN (InstanceId) lives beside a store file, else,
 // for a database store or none, in the working directory: a database is
 // shared by gateways that are each a user agent of their own.
@@ -62,6 +58,8 @@ Gateway::~Gateway() {
 }
 
 bool Gateway::start(std::string& error) {
+  if (!m_signals.watch(error))
+    return false;
   if (!BindingStore::open(m_settings.store, m_store, error))
     return false;
   m_registrar.authenticator().offerAlgorithms(m_settings.digest);
@@ -137,7 +135,7 @@ bool Gateway::startOperations(std::string& error) {
 }
 
 void Gateway::run() {
-  re_main(onSignal);
+  re_main(nullptr);
 }
 
 void Gateway::shutDown() {

@@ -69,6 +69,7 @@
 #include "sip/LibraryClock.h"
 #include "sip/SecureTransports.h"
 #include "sip/SipFrontEnd.h"
+#include "sip/StopSignals.h"
 #include "store/BindingStore.h"
 #include "trunks/TrunkRegistrations.h"
 
@@ -111,7 +112,8 @@ class Gateway {
   // False with an error text when any of them cannot start; what had
   // started then stops when the object dies.
   bool start(std::string& error);
-  // Serves until SIGINT or SIGTERM.
+  // Serves until SIGINT or SIGTERM (StopSignals), one sent during start()
+  // included.
   void run();
   // After a successful start(): closes the control socket and the metrics,
   // unregisters the trunks, lets the stack finish (at most
@@ -132,6 +134,9 @@ class Gateway {
   void beginChange();
   void endChange();
 
+  // First, so that SIGINT and SIGTERM are blocked before anything below
+  // could start a thread.
+  StopSignals m_signals;
   ScriptSession& m_session;
   Settings const m_settings;
   LibraryClock m_clock;

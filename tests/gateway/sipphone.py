@@ -39,6 +39,7 @@ def check(condition, message):
 
 class Gateway:
     def __init__(self, program, emulator, work, name, scripts, options=()):
+        self.emulated = bool(emulator)
         self.out_path = os.path.join(work, name + ".gateway.out")
         self.err_path = os.path.join(work, name + ".gateway.err")
         env = dict(os.environ)
@@ -54,10 +55,15 @@ class Gateway:
                 list(emulator) + [program, "--listen", "127.0.0.1:0", "--store", "none"] + list(options) + list(scripts),
                 stdout=out, stderr=err, env=env)
         self.port = None
+        # Up once it listens, and with --control once the socket is there
+        # too: it is made after the trunks and subscriptions have started,
+        # which under an emulator takes a while.
+        controlled = "--control" in options
         deadline = time.monotonic() + START_LIMIT_S
         while time.monotonic() < deadline and self.process.poll() is None:
-            found = re.search(r"listening on udp:127\.0\.0\.1:(\d+)", self.errors())
-            if found:
+            errors = self.errors()
+            found = re.search(r"listening on udp:127\.0\.0\.1:(\d+)", errors)
+            if found and (not controlled or "location-gateway: control socket " in errors):
                 self.port = int(found.group(1))
                 return
             time.sleep(0.1)
@@ -95,6 +101,18 @@ class Gateway:
         raise Failure("no VmRSS")
 
     def stop(self):
+        # Signals the gateway may take while serving must never take their
+        # default action: libre's own handler leaves a window in which a
+        # second one did. Under an emulator the process is the emulator's.
+        if not self.emulated and self.process.poll() is None:
+            with open("/proc/%d/status" % self.process.pid) as status:
+                blocked = int(re.search(r"^SigBlk:\s*([0-9a-f]+)", status.read(), re.M).group(1), 16)
+            for each in (signal.SIGINT, signal.SIGTERM):
+                check(blocked & (1 << (each - 1)), "%s is not blocked while the gateway serves" % each.name)
+        # Two in a row, as supervisors send them (timeout(1) signals the
+        # process, then its group): the second must neither kill the gateway
+        # nor cut its shut-down short.
+        self.process.send_signal(signal.SIGTERM)
         self.process.send_signal(signal.SIGTERM)
         try:
             status = self.process.wait(timeout=START_LIMIT_S)
