@@ -314,6 +314,30 @@ class Sipp:
             self.process.wait()
 
 
+def write_script(work, name, text):
+    """The path of a gateway script NAME.script in work, holding text."""
+    path = os.path.join(work, name + ".script")
+    with open(path, "w") as file:
+        file.write(text)
+    return path
+
+
+def logged_digest_is_right(line, method, account, uri=None):
+    """Whether a digest header as SIPp logs it answers its nonce with the
+    account's (user, realm, password) for method (RFC 2617, MD5, qop=auth),
+    and names uri when one is given."""
+    fields = dict(re.findall(r'(\w+)="?([^",]*)"?', line))
+    user, realm, password = account
+    if fields.get("username") != user or fields.get("realm") != realm:
+        return False
+    if uri is not None and fields.get("uri") != uri:
+        return False
+    ha1 = hash_hex("MD5", "%s:%s:%s" % (user, realm, password))
+    ha2 = hash_hex("MD5", "%s:%s" % (method, fields["uri"]))
+    expected = hash_hex("MD5", ":".join([ha1, fields["nonce"], fields["nc"], fields["cnonce"], "auth", ha2]))
+    return fields.get("response") == expected
+
+
 def hash_hex(algorithm, text):
     name = {"MD5": "md5", "SHA-256": "sha256"}[algorithm]
     return hashlib.new(name, text.encode()).hexdigest()

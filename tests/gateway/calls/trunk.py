@@ -20,7 +20,7 @@ import sys
 import threading
 
 sys.path.insert(0, os.path.join(os.path.dirname(os.path.abspath(__file__)), ".."))
-from sipphone import Gateway, Phone, Sipp, check, free_port, hash_hex, run  # noqa: E402
+from sipphone import Gateway, Phone, Sipp, check, free_port, logged_digest_is_right, run  # noqa: E402
 
 HERE = os.path.dirname(os.path.abspath(__file__))
 CALL_LIMIT_S = 30
@@ -99,18 +99,6 @@ def invite(source, gateway, from_uri, uri):
         phone.close()
 
 
-def verify_credentials(line):
-    """Whether a logged Proxy-Authorization answers the carrier's nonce
-    with the account's password (RFC 2617, qop=auth)."""
-    fields = dict(re.findall(r'(\w+)="?([^",]*)"?', line))
-    user, realm, password = CARRIER_ACCOUNT
-    if fields.get("username") != user or fields.get("realm") != realm:
-        return False
-    ha1 = hash_hex("MD5", "%s:%s:%s" % (user, realm, password))
-    ha2 = hash_hex("MD5", "INVITE:%s" % fields["uri"])
-    expected = hash_hex("MD5", ":".join([ha1, fields["nonce"], fields["nc"], fields["cnonce"], "auth", ha2]))
-    return fields.get("response") == expected
-
 
 def calls_out_through_the_callers_proxies(program, work, emulator):
     silent = SilentProxy()
@@ -154,7 +142,8 @@ def calls_out_through_the_callers_proxies(program, work, emulator):
                 file.write("identity example.com %s face authentication-outbound create\n" % name)
                 file.write("face example.com %s authentication-outbound authenticate insert 0 carrier gateway-7\n"
                            % name)
-    carrier = Sipp(work, "outbound-carrier", os.path.join(HERE, "carrier.xml"), ["-i", "127.0.0.1", "-p", str(carrier_port), "-m", "4"])
+    carrier = Sipp(work, "outbound-carrier", os.path.join(HERE, "carrier.xml"),
+                   ["-i", "127.0.0.1", "-p", str(carrier_port), "-m", "4"])
     tcp_carrier = Sipp(work, "outbound-tcp-carrier", os.path.join(HERE, "carrier.xml"),
                        ["-t", "t1", "-i", "127.0.0.1", "-p", str(tcp_carrier_port), "-m", "1"])
     overloaded = Sipp(work, "outbound-overloaded", os.path.join(HERE, "overloaded.xml"),
@@ -181,7 +170,8 @@ def calls_out_through_the_callers_proxies(program, work, emulator):
         check(len(silent.calls) == 3, "a boxed proxy was skipped when no other was left")
         credentials = carrier.logged()
         credentials += tcp_carrier.logged()
-        check(len(credentials) == 4 and all(verify_credentials(line) for line in credentials),
+        check(len(credentials) == 4 and
+              all(logged_digest_is_right(line, "INVITE", CARRIER_ACCOUNT) for line in credentials),
               "the carrier did not get the account's credentials: %s" % credentials)
         check(re.search(r"^INVITE sip:4930123@pstn\.example example\.com/alice 200$", gateway.output(), re.M),
               "no request line for alice's call: " + gateway.output())
@@ -248,7 +238,8 @@ def trunk_calls_come_in_unchallenged_and_go_out_to_its_registrar(program, work, 
                        ["-i", CARRIER, "-p", str(registrar_port), "-m", "1"])
         call(work, "inbound-trunk-out", gateway, "127.0.0.1", "trunk@example.com", "4930777", "pstn.example")
         check(carrier.succeeded(), "the trunk's call did not reach its registrar: " + carrier.errors())
-        check(all(verify_credentials(line) for line in carrier.logged()), "the trunk's credentials were wrong")
+        check(all(logged_digest_is_right(line, "INVITE", CARRIER_ACCOUNT) for line in carrier.logged()),
+              "the trunk's credentials were wrong")
         check(not silent.calls, "the trunk's call went to its proxy, not its registrar")
         gateway.stop()
     finally:

@@ -21,9 +21,11 @@ import time
 
 sys.path.insert(0, os.path.join(os.path.dirname(os.path.abspath(__file__)), ".."))
 from sipphone import (ANSWER_LIMIT_S, SIPP, Failure, Gateway, Phone, Sipp, StreamPhone,  # noqa: E402
-                      ask_control, check, free_port, hash_hex, run)
+                      ask_control, check, free_port, logged_digest_is_right, run, write_script)
 
 HERE = os.path.dirname(os.path.abspath(__file__))
+# The message server SIPp plays.
+NOTIFIER_XML = os.path.join(HERE, "notifier.xml")
 # How long a NOTIFY may take to reach a phone, a subscription that had to
 # wait for its message server included (UDP retransmissions reach it).
 NOTIFY_LIMIT_S = 30
@@ -45,12 +47,6 @@ face example.com alice message-subscription retry-timeout-on-system-error set 1
 """
 
 
-
-def write_script(work, name, text):
-    path = os.path.join(work, name + ".script")
-    with open(path, "w") as file:
-        file.write(text)
-    return path
 
 
 def register(phone, user, transport="udp"):
@@ -105,18 +101,6 @@ def await_control(gateway, control, line, pattern):
         time.sleep(0.2)
 
 
-def verify_credentials(line, uri):
-    """Whether a logged Authorization answers the message server's nonce
-    with the account's password (RFC 2617, qop=auth)."""
-    fields = dict(re.findall(r'(\w+)="?([^",]*)"?', line))
-    user, realm, password = ACCOUNT
-    if fields.get("username") != user or fields.get("realm") != realm or fields.get("uri") != uri:
-        return False
-    ha1 = hash_hex("MD5", "%s:%s:%s" % (user, realm, password))
-    ha2 = hash_hex("MD5", "SUBSCRIBE:%s" % fields["uri"])
-    expected = hash_hex("MD5", ":".join([ha1, fields["nonce"], fields["nc"], fields["cnonce"], "auth", ha2]))
-    return fields.get("response") == expected
-
 
 def explicit_subscription_is_relayed_to_every_phone(program, work, emulator):
     # The message server starts once the phones are registered: until then
@@ -139,7 +123,7 @@ def explicit_subscription_is_relayed_to_every_phone(program, work, emulator):
         tcp = StreamPhone(gateway.port, "tcp")
         phones.append(tcp)
         register(tcp, "alice", "tcp")
-        notifier = Sipp(work, "explicit-notifier", os.path.join(HERE, "notifier.xml"), ["-i", "127.0.0.1", "-p", str(notifier_port), "-m", "1"])
+        notifier = Sipp(work, "explicit-notifier", NOTIFIER_XML, ["-i", "127.0.0.1", "-p", str(notifier_port), "-m", "1"])
         check_notify(udp, "the phone over UDP", "yes", "2/8 (0/0)")
         check_notify(tcp, "the phone over TCP", "yes", "2/8 (0/0)")
         late = Phone(gateway.port)
@@ -157,7 +141,8 @@ def explicit_subscription_is_relayed_to_every_phone(program, work, emulator):
         # subscription; else it reports the stack's sockets still in use.
         check(" in use" not in gateway.errors(), "the subscription outlived the shut-down: " + gateway.errors())
         credentials = notifier.logged()
-        check(len(credentials) == 1 and verify_credentials(credentials[0], "sip:alice@127.0.0.1:%d" % notifier_port),
+        check(len(credentials) == 1 and
+              logged_digest_is_right(credentials[0], "SUBSCRIBE", ACCOUNT, "sip:alice@127.0.0.1:%d" % notifier_port),
               "the message server did not get alice's outbound credentials: %s" % credentials)
     finally:
         gateway.kill()
@@ -183,7 +168,7 @@ def redirected_subscription_goes_to_the_contact(program, work, emulator):
                           "face example.com bob message-subscription retry-timeout-on-client-error set 600\n"
                           "face example.com bob message-subscription mwi-notifier set 127.0.0.1:%d\n"
                           % (moved_port, ping_port))
-    servers = [Sipp(work, "moved-notifier", os.path.join(HERE, "notifier.xml"), ["-i", "127.0.0.1", "-p", str(notifier_port), "-m", "1"])]
+    servers = [Sipp(work, "moved-notifier", NOTIFIER_XML, ["-i", "127.0.0.1", "-p", str(notifier_port), "-m", "1"])]
     for name, port, target in [("moved-first", moved_port, notifier_port), ("moved-ping", ping_port, pong_port),
                                ("moved-pong", pong_port, ping_port)]:
         servers.append(Sipp(work, name, os.path.join(HERE, "moved.xml"), ["-i", "127.0.0.1", "-p", str(port), "-m", "1",
@@ -218,8 +203,8 @@ def changed_face_subscribes_anew(program, work, emulator):
     control = os.path.join(work, "changed.control")
     script = write_script(work, "changed", BASE_SCRIPT +
                           "face example.com alice message-subscription mwi-notifier set 127.0.0.1:%d\n" % first_port)
-    first = Sipp(work, "changed-first", os.path.join(HERE, "notifier.xml"), ["-i", "127.0.0.1", "-p", str(first_port), "-m", "1"])
-    proxy = Sipp(work, "changed-proxy", os.path.join(HERE, "notifier.xml"), ["-i", "127.0.0.1", "-p", str(proxy_port), "-m", "1"])
+    first = Sipp(work, "changed-first", NOTIFIER_XML, ["-i", "127.0.0.1", "-p", str(first_port), "-m", "1"])
+    proxy = Sipp(work, "changed-proxy", NOTIFIER_XML, ["-i", "127.0.0.1", "-p", str(proxy_port), "-m", "1"])
     gateway = Gateway(program, emulator, work, "changed", [script], ["--control", control])
     try:
         await_control(gateway, control, "mwi", r"^example\.com/alice explicit subscribed .* messages yes")

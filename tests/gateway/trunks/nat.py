@@ -22,7 +22,7 @@ import threading
 import time
 
 sys.path.insert(0, os.path.join(os.path.dirname(os.path.abspath(__file__)), ".."))
-from sipphone import START_LIMIT_S, Gateway, check, free_port, run  # noqa: E402
+from sipphone import Gateway, check, free_port, run, write_script  # noqa: E402
 
 DNSMASQ = os.environ.get("DNSMASQ") or shutil.which("dnsmasq") or "/usr/sbin/dnsmasq"
 # Long enough for the gateway under an emulator; on loopback it takes
@@ -44,12 +44,6 @@ def trunk_script(name, settings):
     lines += ["face example.com %s registration-outbound %s" % (name, setting) for setting in settings]
     return "\n".join(lines) + "\n"
 
-
-def write_script(work, name, text):
-    path = os.path.join(work, name + ".script")
-    with open(path, "w") as file:
-        file.write(BASE_SCRIPT + text)
-    return path
 
 
 class Dns:
@@ -217,7 +211,7 @@ def trunk_registers_over_a_flow_and_forms_a_new_one_when_it_breaks(program, work
     registrar = TcpRegistrar()
     registrar.start()
     dns = Dns(work, "flow", "tcp", registrar.port)
-    script = write_script(work, "flow", trunk_script("trunk", ["nat-traversal-flows set on"]))
+    script = write_script(work, "flow", BASE_SCRIPT + trunk_script("trunk", ["nat-traversal-flows set on"]))
     store = os.path.join(work, "flow.sqlite")
     for leftover in (store, store + ".instance"):
         if os.path.exists(leftover):
@@ -264,7 +258,7 @@ def udp_flow_is_kept_by_stun_alone(program, work, emulator):
     registrar = UdpRegistrar("Require: outbound\r\nFlow-Timer: 1\r\n")
     registrar.start()
     dns = Dns(work, "stun", "udp", registrar.port)
-    script = write_script(work, "stun", trunk_script(
+    script = write_script(work, "stun", BASE_SCRIPT + trunk_script(
         "trunk", ["nat-traversal-flows set on", "keep-alive-method set options", "keep-alive-interval set 1"]))
     options = ["--dns-server", "127.0.0.1:%d" % dns.port, "--store", os.path.join(work, "stun.sqlite")]
     try:
@@ -292,7 +286,7 @@ def answer_from_an_address_the_name_did_not_resolve_to_is_refused_when_checked(p
     registrar = UdpRegistrar(replies=elsewhere)
     registrar.start()
     dns = Dns(work, "dns-check", "udp", registrar.port)
-    script = write_script(work, "dns-check", trunk_script("checked", ["dns-security-check set on"]) +
+    script = write_script(work, "dns-check", BASE_SCRIPT + trunk_script("checked", ["dns-security-check set on"]) +
                           trunk_script("trusting", []))
     try:
         gateway = Gateway(program, emulator, work, "dns-check", [script], ["--dns-server", "127.0.0.1:%d" % dns.port])

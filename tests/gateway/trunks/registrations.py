@@ -22,7 +22,7 @@ import threading
 import time
 
 sys.path.insert(0, os.path.join(os.path.dirname(os.path.abspath(__file__)), ".."))
-from sipphone import Gateway, Phone, ask_control, check, free_port, run  # noqa: E402
+from sipphone import Gateway, Phone, ask_control, check, run, write_script  # noqa: E402
 
 UPSTREAM = "127.0.0.2"
 # Far above anything on loopback, the gateway under an emulator included.
@@ -146,12 +146,9 @@ def answer_all(status, reason="OK", extra=()):
 
 
 def base_script(work, name, lines):
-    path = os.path.join(work, name + ".script")
-    with open(path, "w") as file:
-        file.write("location-service example.com create\n"
-                   "location-service example.com domain insert 0 example.com\n")
-        file.write("".join(line + "\n" for line in lines))
-    return path
+    return write_script(work, name, "location-service example.com create\n"
+                        "location-service example.com domain insert 0 example.com\n" +
+                        "".join(line + "\n" for line in lines))
 
 
 def trunk_lines(identity, registrar, settings=(), service="example.com"):
