@@ -2,18 +2,20 @@
 // would hand them over: libre's message decoder, then the front-end's
 // routing (SipFrontEnd::route) to Admission, then through a method table
 // filled as the gateway fills it to the Registrar with its digest
-// authentication, message waiting or the Redirector, against the gateway tests' model
-// (GatewayHarness::loadModel) and a stack without transports.
+// authentication, message waiting or the Redirector, against the gateway
+// tests' model (GatewayHarness::loadModel) and a stack without transports.
 //
 // The input is a stream of messages framed as on a TCP connection: each
 // one's body is as long as its Content-Length says (the rest of the input
 // when it has none), and line breaks between them are skipped. At most
 // kMaximumMessages an input, so that a REGISTER can be followed by its
-// refresh, its retransmission or a call to the user it bound. Each request arrives over the transport its Via
-// names (UDP when none), from the address its Via names (kDefaultSource when that is not an address): a phone
-// behind NAT is one whose Contact is elsewhere. ACKs and responses never reach the routing, as in the
-// front-end, and are skipped. After the messages, time passes in steps until every binding has run out, so
-// that the expiry sweep and the NAT pings run too.
+// refresh, its retransmission or a call to the user it bound. Each request
+// arrives over the transport its Via names (UDP when none), from the
+// address its Via names (kDefaultSource when that is not an address): a
+// phone behind NAT is one whose Contact is elsewhere. ACKs and responses
+// never reach the routing, as in the front-end, and are skipped. After the
+// messages, time passes in steps until every binding has run out, so that
+// the expiry sweep and the NAT pings run too.
 //
 // Every input starts from the same state: a fresh model, registrar and
 // clock (GatewayHarness), so that a failing input fails alone. Besides
