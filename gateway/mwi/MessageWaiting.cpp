@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cstring>
 #include <iostream>
+#include <unordered_set>
 
 #include "LS_ILocationService.h"
 #include "LS_IOutbound.h"
@@ -144,8 +145,10 @@ bool MessageWaiting::start(sip& stack, dnsc* dns, TrunkRegistrations& trunks, st
     return false;
   }
   m_subscribers = findAll();
-  for (std::unique_ptr<Subscriber> const& subscriber : m_subscribers)
+  for (std::unique_ptr<Subscriber> const& subscriber : m_subscribers) {
+    m_byIdentity[subscriber->identity.get()] = subscriber.get();
     begin(*subscriber);
+  }
   return true;
 }
 
@@ -208,10 +211,8 @@ std::unique_ptr<MessageWaiting::Subscriber> MessageWaiting::find(LS_IIdentity* i
 }
 
 MessageWaiting::Subscriber* MessageWaiting::subscriberOf(LS_IIdentity const* identity) const {
-  for (std::unique_ptr<Subscriber> const& subscriber : m_subscribers)
-    if (subscriber->identity.get() == identity)
-      return subscriber.get();
-  return nullptr;
+  auto const found = m_byIdentity.find(identity);
+  return found == m_byIdentity.end() ? nullptr : found->second;
 }
 
 bool MessageWaiting::same(Subscriber const& a, Subscriber const& b) {
@@ -234,15 +235,13 @@ void MessageWaiting::follow(std::vector<RefPtr<LS_IIdentity>> const& touched,
 
 void MessageWaiting::followAll() {
   std::vector<std::unique_ptr<Subscriber>> found = findAll();
+  std::unordered_set<LS_IIdentity const*> kept;
+  for (std::unique_ptr<Subscriber> const& candidate : found)
+    kept.insert(candidate->identity.get());
   std::vector<LS_IIdentity const*> gone;
-  for (std::unique_ptr<Subscriber> const& subscriber : m_subscribers) {
-    bool const kept =
-        std::any_of(found.begin(), found.end(), [&](std::unique_ptr<Subscriber> const& candidate) {
-          return candidate->identity == subscriber->identity;
-        });
-    if (!kept)
+  for (std::unique_ptr<Subscriber> const& subscriber : m_subscribers)
+    if (kept.count(subscriber->identity.get()) == 0)
       gone.push_back(subscriber->identity.get());
-  }
   for (LS_IIdentity const* identity : gone)
     replace(identity, nullptr);
   for (std::unique_ptr<Subscriber>& candidate : found) {
@@ -252,19 +251,21 @@ void MessageWaiting::followAll() {
 }
 
 void MessageWaiting::replace(LS_IIdentity const* identity, std::unique_ptr<Subscriber> candidate) {
-  auto const existing = std::find_if(
-      m_subscribers.begin(), m_subscribers.end(),
-      [&](std::unique_ptr<Subscriber> const& subscriber) { return subscriber->identity.get() == identity; });
-  if (existing != m_subscribers.end()) {
-    if (candidate && same(**existing, *candidate))
+  if (Subscriber* const current = subscriberOf(identity)) {
+    if (candidate && same(*current, *candidate))
       return;
-    end(**existing);
+    end(*current);
+    m_byIdentity.erase(identity);
+    auto const existing = std::find_if(
+        m_subscribers.begin(), m_subscribers.end(),
+        [&](std::unique_ptr<Subscriber> const& subscriber) { return subscriber.get() == current; });
     m_retired.push_back(std::move(*existing));
     m_subscribers.erase(existing);
   }
   if (!candidate)
     return;
   m_subscribers.push_back(std::move(candidate));
+  m_byIdentity[identity] = m_subscribers.back().get();
   begin(*m_subscribers.back());
 }
 

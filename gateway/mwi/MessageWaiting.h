@@ -77,6 +77,7 @@
 #include <map>
 #include <memory>
 #include <string>
+#include <unordered_map>
 #include <vector>
 
 #include "CNameAddr.h"
@@ -211,6 +212,9 @@ class MessageWaiting final : public RequestHandler, public DialogHandler, public
   TrunkRegistrations* m_trunks = nullptr;
   sipevent_sock* m_events = nullptr;
   std::vector<std::unique_ptr<Subscriber>> m_subscribers;
+  // m_subscribers by identity: a REGISTER that adds a contact and every
+  // NOTIFY ask for one, which would otherwise walk them all.
+  std::unordered_map<LS_IIdentity const*, Subscriber*> m_byIdentity;
   // Subscribers ended while a callback of theirs may still come (a
   // subscription's challenge during its unsubscription): kept until the
   // object dies.

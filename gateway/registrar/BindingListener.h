@@ -9,7 +9,7 @@
 // follows the 200. The identity lives for the call only: one the registrar
 // made for a user that only "DEFAULT" answers goes with its last binding.
 // The registrar borrows its listeners and tells them nothing once it is
-// being destroyed.
+// being destroyed; a listener being told adds or removes none.
 #pragma once
 
 #include "LS_IIdentity.h"

@@ -478,12 +478,16 @@ void Registrar::reportTransition(Bindings& bindings, size_t before, bool added) 
     m_clock.measure([&] { bindings.identity->isInboundRegistered(); });
   else if (before != 0 && after == 0)
     m_clock.measure([&] { bindings.identity->isInboundUnregistered(); });
-  // A copy: a listener may send, and nothing it sets off may add another.
+  bool const bound = after != 0 && (added || before == 0);
+  bool const unbound = before != 0 && after == 0;
+  if (!bound && !unbound)
+    return;
+  // Held: a listener's work may drop the table's reference.
   RefPtr<LS_IIdentity> const identity = bindings.identity;
-  for (BindingListener* listener : std::vector<BindingListener*>(m_listeners)) {
-    if (after != 0 && (added || before == 0))
+  for (BindingListener* listener : m_listeners) {
+    if (bound)
       listener->onBound(identity.get(), before == 0);
-    else if (before != 0 && after == 0)
+    else
       listener->onUnbound(identity.get());
   }
 }
